@@ -1,0 +1,124 @@
+#include "persistence/OrvMatFile.h"
+
+#include <cstdint>
+#include <fstream>
+#include <istream>
+#include <ostream>
+
+#include "persistence/QuickArchive.h"
+#include "platform/File.h"
+
+namespace OrvaneLumoCore {
+
+namespace {
+
+// Versions 1 and 2: the stream is everything behind the header.
+std::string readRest(std::istream& in) {
+    const std::streampos start = in.tellg();
+    in.seekg(0, std::ios::end);
+    const std::streampos end = in.tellg();
+    in.seekg(start);
+    std::string body;
+    if (start < 0 || end <= start) return body;
+    body.resize(static_cast<std::size_t>(end - start));
+    in.read(&body[0], static_cast<std::streamsize>(body.size()));
+    body.resize(static_cast<std::size_t>(in.gcount()));
+    return body;
+}
+
+// Version 1 files went through a text-mode write: each CR LF pair becomes LF,
+// in one pass from left to right (CR CR LF turns into CR LF).
+std::string undoTextMode(const std::string& body) {
+    std::string out;
+    out.reserve(body.size());
+    for (std::size_t i = 0; i < body.size(); ++i) {
+        if (body[i] == '\r' && i + 1 < body.size() && body[i + 1] == '\n') {
+            out.push_back('\n');
+            ++i;
+        } else {
+            out.push_back(body[i]);
+        }
+    }
+    return out;
+}
+
+}  // namespace
+
+bool OrvMatFile::load(std::istream& in) {
+    std::uint32_t header[2] = {0, 0};
+    in.read(reinterpret_cast<char*>(header), 8);
+    if (in.gcount() != 8) return false;
+    const std::uint32_t tag = header[0];
+    const std::uint32_t count = header[1];
+    if (count == 0) return false;
+    if ((tag & 0xFFFF) != 0) return false;
+
+    QuickArchive ar(static_cast<std::size_t>(1));
+    switch (tag >> 16) {
+        case 3:
+            if (!ar.loadBlocks(in)) return false;
+            break;
+        case 2: {
+            const std::string body = readRest(in);
+            ar = QuickArchive(body.data(), body.size());
+            break;
+        }
+        case 1: {
+            const std::string body = undoTextMode(readRest(in));
+            ar = QuickArchive(body.data(), body.size());
+            break;
+        }
+        default:
+            return false;
+    }
+
+    // Every material takes at least its four-byte tag: a larger count can't
+    // be real.
+    if (count > ar.bytesLeft()) return false;
+    std::vector<MaterialPtr> loaded;
+    for (std::uint32_t i = 0; i < count; ++i) {
+        std::uint32_t type = 0xFFFFFFFFu;
+        ar.readUInt(type);
+        MaterialPtr material = createMaterial(type);
+        if (!material) return false;
+        if (!material->load(ar)) return false;
+        loaded.push_back(material);
+    }
+    materials.swap(loaded);
+    return true;
+}
+
+bool OrvMatFile::save(std::ostream& out) {
+    if (materials.empty()) return false;
+    QuickArchive ar(static_cast<std::size_t>(1));
+    for (const MaterialPtr& material : materials) {
+        if (!material) return false;
+        ar.writeInt(static_cast<std::int32_t>(material->getType()));
+        if (!material->save(ar)) return false;
+    }
+    const std::uint32_t header[2] = {0x30000u, static_cast<std::uint32_t>(materials.size())};
+    out.write(reinterpret_cast<const char*>(header), 8);
+    return ar.saveBlocks(out);
+}
+
+bool OrvMatFile::load(const std::u16string& path) {
+    std::ifstream file;
+    platform::openForReading(file, path);
+    if (!file.is_open()) return false;
+    return load(static_cast<std::istream&>(file));
+}
+
+bool OrvMatFile::save(const std::u16string& path) {
+    std::ofstream file;
+    platform::openForWriting(file, path);
+    if (!file.is_open()) return false;
+    return save(static_cast<std::ostream&>(file));
+}
+
+bool OrvMatFile::getMaterial(std::size_t index, MaterialPtr& material) const {
+    if (index >= materials.size()) return false;
+    material = materials[index];
+    return true;
+}
+
+}  // namespace OrvaneLumoCore

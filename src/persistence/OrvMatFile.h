@@ -1,0 +1,35 @@
+#pragma once
+// The material library file: an 8-byte header (version tag, material count)
+// and a material stream of `count` pairs of type tag and record. Three
+// generations differ only in how the stream follows the header.
+#include <cstddef>
+#include <iosfwd>
+#include <string>
+#include <vector>
+
+#include "materials/BaseMaterial.h"
+
+namespace OrvaneLumoCore {
+
+class OrvMatFile {
+public:
+    OrvMatFile() = default;
+    virtual ~OrvMatFile() = default;
+
+    virtual bool save(std::ostream& out);
+    virtual bool load(std::istream& in);
+
+    bool load(const std::u16string& path);
+    bool save(const std::u16string& path);
+
+    std::size_t getMaterialCount() const { return materials.size(); }
+    bool getMaterial(std::size_t index, MaterialPtr& material) const;
+
+    // The file at `path` as an "orvmat" document, or, if it doesn't load,
+    // its text; the empty string if it can't be opened.
+    std::u16string getXml(std::u16string path);
+
+    std::vector<MaterialPtr> materials;
+};
+
+}  // namespace OrvaneLumoCore

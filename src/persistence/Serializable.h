@@ -1,0 +1,30 @@
+#pragma once
+// The two interfaces of every model class: the binary record and the XML Asset.
+#include <string>
+
+class AssetXmlWriter;
+
+class OrvaneXMLSerializable {
+public:
+    virtual ~OrvaneXMLSerializable() = default;
+    // Writes the object's Asset (and its children's) under `url`.
+    virtual void writeXml(AssetXmlWriter& writer, std::u16string url) = 0;
+    virtual std::u16string getPluginName() const = 0;
+    virtual std::u16string getAssetType() const = 0;
+};
+
+namespace OrvaneLumoCore {
+
+class QuickArchive;
+
+class OrvaneSerializable {
+public:
+    virtual ~OrvaneSerializable() = default;
+    // Writes the record at the archive's write position.
+    virtual bool save(QuickArchive& ar) const = 0;
+    // Reads the record from the archive's read position. On false the object
+    // stays as far as it got; the caller gives up on the whole graph.
+    virtual bool load(QuickArchive& ar) = 0;
+};
+
+}  // namespace OrvaneLumoCore
