@@ -18,6 +18,8 @@ class AssetXmlWriter;
 
 namespace OrvaneLumoCore {
 
+class MaterialReference;
+
 class SceneMaterials : public OrvaneSerializable {
 public:
     typedef std::map<std::u16string, MaterialPtr, platform::CaseInsensitiveLess> MaterialMap;
@@ -68,6 +70,21 @@ public:
 
     const MaterialMap& getMaterials() const { return materials; }
     const UuidMap& getUuids() const { return uuids; }
+
+    // ---- references and the default material ----
+    // A new reference whose target UUID is getUuid(name).
+    boost::shared_ptr<MaterialReference> createReference(const std::u16string& name) const;
+    // The entry "Default_Lumo_Material", or empty.
+    MaterialPtr getDefaultMaterial() const;
+    // Adds a copy of the default material (a layered material with one
+    // diffuse layer) as "Default_Lumo_Material", unless the name is taken.
+    void ensureDefaultMaterial();
+    // Every reference to `uuid` inside the table's materials, in key order
+    // and depth first. Embedded copies aren't entered.
+    std::vector<boost::shared_ptr<MaterialReference>> findReferences(const std::u16string& uuid) const;
+    // Of several UUIDs that name one material of the table, the last in key
+    // order stays; references to the others move to it, and the others go.
+    void mergeDuplicateUuids();
 
 private:
     bool loadMaterials(QuickArchive& ar, bool throughAdd);
