@@ -1,0 +1,220 @@
+#include "materials/WrapperAssets.h"
+
+#include "materials/MaterialAssets.h"
+#include "materials/MaterialMembers.h"
+#include "materials/MaterialTree.h"
+#include "materials/ReferenceMaterials.h"
+#include "materials/SceneMaterials.h"
+#include "materials/ToonMaterial.h"
+#include "materials/TwoSidedBump.h"
+#include "materials/WrappingMaterials.h"
+#include "xml/AssetXmlWriter.h"
+
+namespace OrvaneLumoCore {
+
+namespace {
+
+template <class T>
+const T* as(const BaseMaterial& material) {
+    return dynamic_cast<const T*>(&material);
+}
+
+// ---- folded wrappers, one pair of writers per class ------------------------------------
+
+void bumpTextures(AssetXmlWriter& w, const MaterialBump& bump, const std::u16string& url) {
+    writeTextureAssets(w, bump.bump_tex, childUrl(url, u"bump_tex"));
+}
+
+void bumpParameters(AssetXmlWriter& w, const MaterialBump& bump, const std::u16string& url) {
+    w.writeBool("bump_on", true);
+    w.writeFloat("bump_tex_mult", bump.bump_tex_mult);
+    writeTextureRef(w, "bump_tex", bump.bump_tex, childUrl(url, u"bump_tex"));
+}
+
+void displacedTextures(AssetXmlWriter& w, const MaterialDisplaced& d, const std::u16string& url) {
+    writeTextureAssets(w, d.displace_tex, childUrl(url, u"displace_tex"));
+}
+
+void displacedParameters(AssetXmlWriter& w, const MaterialDisplaced& d, const std::u16string& url) {
+    w.writeBool("displace_on", true);
+    w.writeFloat("displace_shift", d.displace_shift);
+    w.writeFloat("displace_edge_length", d.displace_edge_length);
+    w.writeFloat("displace_tex_mult", d.displace_tex_mult);
+    // Integers, also those that hold yes or no.
+    w.writeInteger("displace_max_subdivs", d.displace_max_subdivs);
+    w.writeInteger("displace_continuity", d.displace_continuity);
+    w.writeInteger("displace_view_dependent", d.displace_view_dependent);
+    w.writeInteger("displace_use_globals", d.displace_use_globals);
+    writeTextureRef(w, "displace_tex", d.displace_tex, childUrl(url, u"displace_tex"));
+}
+
+// Textures and colours go out with the GI group first, the multipliers and
+// switches with the background group first.
+void environmentTextures(AssetXmlWriter& w, const MaterialOverrideEnvironment& e, const std::u16string& url) {
+    writeTextureAssets(w, e.gi_tex, childUrl(url, u"gi_tex"));
+    writeTextureAssets(w, e.bg_tex, childUrl(url, u"bg_tex"));
+    writeTextureAssets(w, e.reflect_tex, childUrl(url, u"reflect_tex"));
+    writeTextureAssets(w, e.refract_tex, childUrl(url, u"refract_tex"));
+}
+
+void environmentParameters(AssetXmlWriter& w, const MaterialOverrideEnvironment& e,
+                           const std::u16string& url) {
+    writeTextureRef(w, "gi_tex", e.gi_tex, childUrl(url, u"gi_tex"));
+    writeTextureRef(w, "bg_tex", e.bg_tex, childUrl(url, u"bg_tex"));
+    writeTextureRef(w, "reflect_tex", e.reflect_tex, childUrl(url, u"reflect_tex"));
+    writeTextureRef(w, "refract_tex", e.refract_tex, childUrl(url, u"refract_tex"));
+    w.writeColor("gi_color", e.gi_color);
+    w.writeColor("bg_color", e.bg_color);
+    w.writeColor("reflect_color", e.reflect_color);
+    w.writeColor("refract_color", e.refract_color);
+    w.writeFloat("bg_tex_mult", e.bg_tex_mult);
+    w.writeFloat("gi_tex_mult", e.gi_tex_mult);
+    w.writeFloat("reflect_tex_mult", e.reflect_tex_mult);
+    w.writeFloat("refract_tex_mult", e.refract_tex_mult);
+    w.writeBool("override_bg", e.override_bg);
+    w.writeBool("override_gi", e.override_gi);
+    w.writeBool("override_reflect", e.override_reflect);
+    w.writeBool("override_refract", e.override_refract);
+}
+
+// The list of object names doesn't go out here.
+void exclusionParameters(AssetXmlWriter& w, const MaterialObjectExclusion& x, const std::u16string&) {
+    w.writeBool("ignore_objects", x.mode != 0);
+    w.writeBool("short_circuit", x.short_circuit);
+}
+
+void alphaTextures(AssetXmlWriter& w, const MaterialAlphaContribution& a, const std::u16string& url) {
+    writeTextureAssets(w, a.alpha_tex, childUrl(url, u"alpha_tex"));
+}
+
+void alphaParameters(AssetXmlWriter& w, const MaterialAlphaContribution& a, const std::u16string& url) {
+    w.writeFloat("alpha", a.alpha);
+    w.writeFloat("alpha_tex_mult", a.alpha_tex_mult);
+    writeTextureRef(w, "alpha_tex", a.alpha_tex, childUrl(url, u"alpha_tex"));
+}
+
+// ---- two-child branch ----------------------------------------------------------------
+
+// What the top-level Asset of a two-child class shows beyond its children.
+struct TwoChildForm {
+    MaterialPtr first, second;
+    const char* layout;
+    const char* firstName;
+    const char* secondName;
+};
+
+bool twoChildForm(const BaseMaterial& m, TwoChildForm& form) {
+    if (const MaterialAngleBlend* blend = as<MaterialAngleBlend>(m)) {
+        form = {blend->mtl_one, blend->mtl_two, "AngleBlendMatLayout", "mtl_one", "mtl_two"};
+    } else if (const Material2Sided* twoSided = as<Material2Sided>(m)) {
+        form = {twoSided->front, twoSided->back, "TwoSidedMatLayout", "front", "back"};
+    } else if (const MaterialSkp2Sided* skp = as<MaterialSkp2Sided>(m)) {
+        form = {skp->front, skp->back, "SkpTwoSidedMatLayout", "front", "back"};
+    } else {
+        return false;
+    }
+    return true;
+}
+
+// Of a Material2Sided only translucency and force_1sided go out here.
+void twoChildParameters(AssetXmlWriter& w, const BaseMaterial& m) {
+    if (const MaterialAngleBlend* blend = as<MaterialAngleBlend>(m)) {
+        w.writeFloat("start_angle", blend->start_angle);
+        w.writeFloat("stop_angle", blend->stop_angle);
+    } else if (const Material2Sided* twoSided = as<Material2Sided>(m)) {
+        w.writeColor("translucency", twoSided->translucency);
+        w.writeBool("force_1sided", twoSided->force_1sided);
+    } else if (const MaterialSkp2Sided* skp = as<MaterialSkp2Sided>(m)) {
+        w.writeBool("force_1sided", skp->force_1sided);
+    }
+}
+
+}  // namespace
+
+std::vector<MaterialPtr> wrapperSearchChildren(const BaseMaterial& m) {
+    if (const MaterialReference* ref = as<MaterialReference>(m)) {
+        MaterialPtr target = SceneMaterials::instance()->getMaterialByUuid(ref->target_uuid);
+        if (!target) target = ref->target;
+        return target ? std::vector<MaterialPtr>{target} : std::vector<MaterialPtr>();
+    }
+    switch (m.getType()) {
+    case kMaterialBump:
+    case kMaterialLinked:
+    case kMaterialOverrideEnvironment:
+    case kMaterialDisplaced:
+    case kMaterialObjectExclusion:
+    case kMaterialAlphaContribution:
+    case kMaterialToon:
+    case kMaterial2Sided:
+    case kMaterialSkp2Sided:
+    case kMaterialAngleBlend:
+        return childMaterials(m);
+    default:  // layered, single, multi and instance end the search
+        return std::vector<MaterialPtr>();
+    }
+}
+
+void writeFoldedTextures(AssetXmlWriter& writer, const BaseMaterial& wrapper, const std::u16string& url) {
+    if (const MaterialBump* bump = as<MaterialBump>(wrapper))
+        bumpTextures(writer, *bump, url);
+    else if (const MaterialDisplaced* displaced = as<MaterialDisplaced>(wrapper))
+        displacedTextures(writer, *displaced, url);
+    else if (const MaterialOverrideEnvironment* env = as<MaterialOverrideEnvironment>(wrapper))
+        environmentTextures(writer, *env, url);
+    else if (const MaterialAlphaContribution* alpha = as<MaterialAlphaContribution>(wrapper))
+        alphaTextures(writer, *alpha, url);
+}
+
+void writeFoldedParameters(AssetXmlWriter& writer, const BaseMaterial& wrapper, const std::u16string& url) {
+    if (const MaterialBump* bump = as<MaterialBump>(wrapper))
+        bumpParameters(writer, *bump, url);
+    else if (const MaterialDisplaced* displaced = as<MaterialDisplaced>(wrapper))
+        displacedParameters(writer, *displaced, url);
+    else if (const MaterialOverrideEnvironment* env = as<MaterialOverrideEnvironment>(wrapper))
+        environmentParameters(writer, *env, url);
+    else if (const MaterialObjectExclusion* exclusion = as<MaterialObjectExclusion>(wrapper))
+        exclusionParameters(writer, *exclusion, url);
+    else if (const MaterialAlphaContribution* alpha = as<MaterialAlphaContribution>(wrapper))
+        alphaParameters(writer, *alpha, url);
+}
+
+void writeTwoChildAssets(AssetXmlWriter& writer, const MaterialPtr& material) {
+    TwoChildForm form;
+    if (!material || !twoChildForm(*material, form)) return;
+    const MaterialPtr a = resolveReference(form.first);
+    const MaterialPtr b = resolveReference(form.second);
+    writeLayeredAsset(writer, a);
+    writeLayeredAsset(writer, b);
+
+    openMaterialAsset(writer, *material, childUrl(u"", material->name), form.layout);
+    // A child's reference is the url of its flat Asset: "/" and its name. An
+    // unusable child leaves the parameter out altogether.
+    if (isUsableMaterial(a)) writeMaterialRef(writer, form.firstName, a, u"");
+    if (isUsableMaterial(b)) writeMaterialRef(writer, form.secondName, b, u"");
+    twoChildParameters(writer, *material);
+    closeMaterialAsset(writer);
+}
+
+void writeToonAssets(AssetXmlWriter& writer, const MaterialPtr& material) {
+    const MaterialToon* toon = material ? as<MaterialToon>(*material) : nullptr;
+    if (!toon) return;
+    const MaterialPtr base = resolveReference(toon->base_mtl);
+    if (!base) return;
+    writeLayeredAsset(writer, base);
+
+    const std::u16string url = childUrl(u"", toon->name);
+    toon->writeTextureAssets(writer, url);
+    openMaterialAsset(writer, *toon, url, "ToonMatLayout");
+    if (isUsableMaterial(base)) writeMaterialRef(writer, "base_mtl", base, u"");
+    toon->writeLineParameters(writer, url, MaterialToon::Words::Conversion);
+    closeMaterialAsset(writer);
+}
+
+std::u16string materialToXml(const MaterialPtr& material) {
+    std::u16string text;
+    AssetXmlWriter writer(text);
+    writeMaterialAssets(writer, material);
+    return text;
+}
+
+}  // namespace OrvaneLumoCore
