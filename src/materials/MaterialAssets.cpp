@@ -1,6 +1,9 @@
 #include "materials/MaterialAssets.h"
 
 #include "materials/LayeredMaterials.h"
+#include "materials/ReferenceMaterials.h"
+#include "materials/WrapperAssets.h"
+#include "persistence/Record.h"
 #include "xml/AssetXmlWriter.h"
 
 namespace OrvaneLumoCore {
@@ -10,10 +13,12 @@ namespace {
 // The children that findMaterialsOfType descends into, in search order. The
 // materials that hold layers or a list of sub-materials end the search.
 std::vector<MaterialPtr> searchChildren(const MaterialPtr& material) {
-    switch (material->getType()) {
-    default: return std::vector<MaterialPtr>();
-    }
+    return wrapperSearchChildren(*material);
 }
+
+// A reference leads the search into the scene table, where a material may
+// hold a reference to itself; the search gives up below this depth.
+const int kMaxSearchDepth = 4 * kMaxNestingDepth;
 
 // A wrapping material whose settings the main Asset of its tree takes over.
 // Only the first of each type in the tree counts.
@@ -30,29 +35,40 @@ struct FoldedWrapper {
 
 // In the order in which their textures and parameters go out.
 const std::vector<FoldedWrapper>& foldedWrappers() {
-    static const std::vector<FoldedWrapper> wrappers;
+    static const std::vector<FoldedWrapper> wrappers = {
+        {kMaterialBump, &writeFoldedTextures, &writeFoldedParameters},
+        {kMaterialDisplaced, &writeFoldedTextures, &writeFoldedParameters},
+        {kMaterialOverrideEnvironment, &writeFoldedTextures, &writeFoldedParameters},
+        {kMaterialObjectExclusion, &writeFoldedTextures, &writeFoldedParameters},
+        {kMaterialAlphaContribution, &writeFoldedTextures, &writeFoldedParameters},
+    };
     return wrappers;
 }
 
-void appendAll(std::vector<MaterialPtr>& to, const std::vector<MaterialPtr>& from) {
-    to.insert(to.end(), from.begin(), from.end());
+void findOfType(const MaterialPtr& material, std::uint32_t tag, int depth, std::vector<MaterialPtr>& found) {
+    if (!material || depth > kMaxSearchDepth) return;
+    if (material->getType() == tag) {
+        found.push_back(material);
+        return;
+    }
+    const std::vector<MaterialPtr> children = searchChildren(material);
+    for (std::size_t i = 0; i < children.size(); ++i) findOfType(children[i], tag, depth + 1, found);
 }
 
 }  // namespace
 
-MaterialPtr resolveReference(const MaterialPtr& material) { return material; }
+// A reference stands for its embedded copy, which may be empty.
+MaterialPtr resolveReference(const MaterialPtr& material) {
+    if (material && material->getType() == kMaterialReference) {
+        const MaterialReference* ref = dynamic_cast<const MaterialReference*>(material.get());
+        return ref ? ref->target : MaterialPtr();
+    }
+    return material;
+}
 
 std::vector<MaterialPtr> findMaterialsOfType(const MaterialPtr& material, std::uint32_t tag) {
     std::vector<MaterialPtr> found;
-    if (!material) return found;
-    if (material->getType() == tag) {
-        found.push_back(material);
-        return found;
-    }
-    const std::vector<MaterialPtr> children = searchChildren(material);
-    for (std::size_t i = 0; i < children.size(); ++i) {
-        appendAll(found, findMaterialsOfType(children[i], tag));
-    }
+    findOfType(material, tag, 0, found);
     return found;
 }
 
@@ -95,6 +111,10 @@ void writeMaterialAssets(AssetXmlWriter& writer, const MaterialPtr& material) {
         // A few classes at the top of a file keep a plugin of their own and
         // get a branch here; every other tree becomes the flat main Asset.
         switch (material->getType()) {
+        case kMaterialAngleBlend:
+        case kMaterial2Sided:
+        case kMaterialSkp2Sided: writeTwoChildAssets(writer, material); break;
+        case kMaterialToon: writeToonAssets(writer, material); break;
         default: writeLayeredAsset(writer, material); break;
         }
     }
