@@ -191,8 +191,9 @@ void QuickArchive::writeRect(const Rect& r) {
 
 void QuickArchive::readRect(Rect& r) {
     readInt(r.x0); readInt(r.y0); readInt(r.x1); readInt(r.y1);
-    r.width = r.x1 - r.x0;
-    r.height = r.y1 - r.y0;
+    // Wrapping arithmetic: damaged records may hold any values.
+    r.width = static_cast<std::int32_t>(static_cast<std::uint32_t>(r.x1) - static_cast<std::uint32_t>(r.x0));
+    r.height = static_cast<std::int32_t>(static_cast<std::uint32_t>(r.y1) - static_cast<std::uint32_t>(r.y0));
     r.reserved0 = 0;
     r.reserved1 = 0;
 }
@@ -235,9 +236,9 @@ bool QuickArchive::saveBlocks(std::ostream& out) const {
 
 bool QuickArchive::loadBlocks(std::istream& in) {
     clear();
+    // A stream that ends inside the count keeps the bytes it delivered.
     std::uint32_t count = 0;
     in.read(reinterpret_cast<char*>(&count), 4);
-    if (in.gcount() != 4) count = 0;
     // Blocks are appended as the stream delivers them: a count read from a
     // damaged file does not reserve memory ahead of the data that backs it.
     for (std::uint32_t i = 0; i < count && in; ++i) {
