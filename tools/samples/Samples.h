@@ -11,6 +11,7 @@ struct Sample {
     bool (*write)(const std::string& path);    // writes the file; false on failure
 };
 
+void addWrappedMaterialSamples(std::vector<Sample>& list);
 void addMaterialSamples(std::vector<Sample>& list);
 
 }  // namespace samples
