@@ -12,5 +12,6 @@ struct Sample {
 };
 
 void addMaterialSamples(std::vector<Sample>& list);
+void addTextRoadSamples(std::vector<Sample>& list);
 
 }  // namespace samples
