@@ -13,10 +13,6 @@ TextureFrame::TextureFrame(AssetXmlWriter& writer, const OrvaneXMLSerializable& 
     }
 }
 
-TextureFrame::~TextureFrame() {
-    if (state_ == State::Open) close();
-}
-
 std::u16string TextureFrame::slotUrl(const char16_t* segment) const {
     assert(state_ == State::Slots && "slots are declared before open()");
     std::u16string url = ownUrl_;

@@ -30,13 +30,21 @@
 // and parameters may refer to slots in another order than the slots were
 // declared in; both are expressed by which SlotRef goes to which writeRef.
 //
+// A reference that isn't a child's Asset url (a sky's sun) is written with
+// writer().writePluginRef between open() and close().
+//
 // A node whose own url isn't formed from its plugin name (a BRDF layer's is
 // the material's url and the layer's name) passes UrlIs::Own with that url.
 //
-// The frame checks its own use: slots after open(), a second open() or a
-// close() without open() are programming errors and abort in debug builds;
-// leaving the scope without close() closes the elements all the same, so the
-// document stays balanced.
+// Slots after open(), a second open() and a close() without open() are
+// programming errors, caught by assertions in debug builds. Every open() needs
+// its close(): the frame doesn't close on leaving its scope, since the writer
+// may throw (allocation failure) and a destructor must not write then.
+//
+// The records of children use the member helpers of persistence/Record.h
+// (loadRequiredMember / loadOptionalMember with createTexture, createUVW or
+// createBitmap, and their save twins); clone uses cloneChild, and isEqual
+// starts with sameClass below, then childrenEqual for each slot.
 #include <string>
 #include <type_traits>
 
@@ -71,7 +79,6 @@ class TextureFrame {
 public:
     TextureFrame(AssetXmlWriter& writer, const OrvaneXMLSerializable& self, const std::u16string& url,
                  UrlIs kind = UrlIs::Owner);
-    ~TextureFrame();
     TextureFrame(const TextureFrame&) = delete;
     TextureFrame& operator=(const TextureFrame&) = delete;
 

@@ -207,18 +207,6 @@ TEST(BasicCopies, IsEqualTellsEachDifference) {
     EXPECT_FALSE(base->isEqual(TexturePtr(new BlendTexture())));
 }
 
-TEST(BasicCopies, BlendAndAColorCompareTheirFields) {
-    boost::shared_ptr<BlendTexture> a(new BlendTexture()), b(new BlendTexture());
-    EXPECT_TRUE(a->isEqual(b));
-    b->colorBMult = 2;
-    EXPECT_FALSE(a->isEqual(b));
-    b->colorBMult = 1;
-    b->blend_amount = 0.25f;
-    EXPECT_FALSE(a->isEqual(b));
-    EXPECT_FALSE(acolor(1, 1, 1, 1)->isEqual(acolor(1, 1, 1, 0)));
-    EXPECT_TRUE(acolor(1, 1, 1, 1)->isEqual(TexturePtr(new AColorTexture())));
-}
-
 // ---- XML -------------------------------------------------------------------------------
 
 TEST(BasicXml, FresnelWithDefaults) {

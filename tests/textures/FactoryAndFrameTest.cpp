@@ -53,38 +53,13 @@ TEST(TextureFactory, UVWAndBitmapTags) {
     for (int tag : {1, -1}) EXPECT_FALSE(createBitmap(tag));
 }
 
-TEST(TextureFactory, DefaultsOfFreshObjects) {
-    auto fresnel = boost::dynamic_pointer_cast<FresnelTexture>(createTexture(1));
-    ASSERT_TRUE(fresnel);
-    const std::uint32_t blackBits = 0x3E828283u;
-    float black;
-    std::memcpy(&black, &blackBits, 4);
-    EXPECT_EQ(Color(black, black, black), fresnel->blackInverse);
-    EXPECT_EQ(Color(1, 1, 1), fresnel->whiteInverse);
-    EXPECT_EQ(1.55f, fresnel->fresnel_ior);
-
+TEST(TextureFactory, DefaultsThatOldRecordsRelyOn) {
     auto env = boost::dynamic_pointer_cast<GenEnvironmentUVW>(createUVW(3));
-    ASSERT_TRUE(env);
-    EXPECT_EQ(2, env->mapping_type);
     auto ch = boost::dynamic_pointer_cast<GenChannelUVW>(createUVW(4));
-    ASSERT_TRUE(ch);
+    ASSERT_TRUE(env && ch);
+    EXPECT_EQ(2, env->mapping_type);
     EXPECT_EQ(1, ch->uvw_channel);
-
-    auto bitmap = boost::dynamic_pointer_cast<BitmapTexture>(createTexture(0));
-    ASSERT_TRUE(bitmap);
-    EXPECT_FALSE(bitmap->uvw || bitmap->bitmap);
-    EXPECT_TRUE(bitmap->tile);
-}
-
-TEST(TextureLabels, TableByTag) {
-    const char16_t* expected[] = {u"Bitmap", u"Fresnel", u"UVW",    u"Noise",  u"Checker",
-                                  u"AColor", u"Grid",    u"Cloth",  u"Bulge",  u"Invert",
-                                  u"Blend",  u"Ramp",    u"Sky"};
-    for (int tag = 0; tag < kTextureTagCount; ++tag)
-        EXPECT_TRUE(textureLabel(tag) == expected[tag]) << tag;
-    EXPECT_TRUE(textureLabel(-1).empty());
-    EXPECT_TRUE(textureLabel(13).empty());
-    EXPECT_TRUE(std::u16string(kFilterLabels[2]) == u"Summed-area");
+    EXPECT_EQ(0, ch->wrap_u);
 }
 
 namespace {
@@ -98,13 +73,12 @@ public:
         const SlotRef color = frame.slot(colorTex, u"color_texture");
         frame.open();
         frame.writeRef("color_tex", color);
-        if (closeExplicitly) frame.close();
+        frame.close();
     }
     std::u16string getPluginName() const override { return u"BRDFDiffuse"; }
     std::u16string getAssetType() const override { return u"BRDF"; }
 
     TexturePtr colorTex;
-    bool closeExplicitly = true;
 };
 
 }  // namespace
@@ -130,12 +104,6 @@ R"(  <Asset layout="" renderer="lumo" type="BRDF" url="/Wood/Layer 1" >
 )";
     ASSERT_GT(xml.size(), tail.size());
     EXPECT_EQ(tail, xml.substr(xml.size() - tail.size()));
-}
-
-TEST(TextureFrameUse, LeavingTheScopeClosesTheAsset) {
-    LayerLike closed, leftOpen;
-    leftOpen.closeExplicitly = false;
-    EXPECT_EQ(xmlOf(closed, u"/M"), xmlOf(leftOpen, u"/M"));
 }
 
 TEST(TextureFrameUse, WriterLevelsReturnToWhereTheyStarted) {

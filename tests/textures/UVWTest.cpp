@@ -91,21 +91,6 @@ TEST(UVWCompose, SingleRotationsUseTheF32DegreeFactor) {
     EXPECT_EQ(Matrix(Vector(c, 0, -s), Vector(0, 1, 0), Vector(s, 0, c)), y);
 }
 
-TEST(UVWCompose, ScaleSitsInTheAxisEntryOfEachRotation) {
-    // Rotation about z with x scaled 2 and mirrored, y scaled 3: A B is
-    // diag(fx, fy, 1), so the x row of C is scaled by fx = -2 and its y row
-    // by fy = 3; the z column holds fz alone.
-    const float r = 30.0f * 0.017453292f;
-    const Matrix m = composeMatrix(components({0, 0, 30}, {2, 3, 5}, {0, 0, 0}, 1, 0, 0));
-    EXPECT_FLOAT_EQ(-2 * std::cos(r), m.m[0].x);
-    EXPECT_FLOAT_EQ(3 * std::sin(r), m.m[0].y);
-    EXPECT_FLOAT_EQ(2 * std::sin(r), m.m[1].x);
-    EXPECT_FLOAT_EQ(3 * std::cos(r), m.m[1].y);
-    EXPECT_EQ(0.0f, m.m[0].z);
-    EXPECT_EQ(0.0f, m.m[1].z);
-    EXPECT_EQ(Vector(0, 0, 5), m.m[2]);
-}
-
 TEST(UVWCompose, AllAxesAgainstTheProductByRows) {
     const TransformComponents cases[] = {
         components({30, 45, 60}, {1, 2, 3}, {0, 0, 0}, 0, 0, 0),
@@ -114,11 +99,6 @@ TEST(UVWCompose, AllAxesAgainstTheProductByRows) {
         components({1, -1, 359}, {3, 3, 3}, {0, 0, 0}, 1, 1, 1),
     };
     for (const TransformComponents& c : cases) expectNear(closedForm(c), composeMatrix(c), "case");
-}
-
-TEST(UVWCompose, TransformTakesTheOffsets) {
-    const TransformComponents c = components({0, 0, 0}, {1, 1, 1}, {1, -2, 3.5f}, 0, 0, 0);
-    EXPECT_EQ(Transform(Matrix(), Vector(1, -2, 3.5f)), composeTransform(c));
 }
 
 TEST(UVWCompose, SyncTransformsOverwritesWhatWasStored) {
@@ -267,12 +247,6 @@ TEST(UVWRecord, CopiesAndComparisons) {
         change(*other);
         EXPECT_FALSE(a.isEqual(other));
     }
-    GenEnvironmentUVW env;
-    boost::shared_ptr<GenEnvironmentUVW> env2(new GenEnvironmentUVW());
-    env2->mapping_type = 1;
-    EXPECT_FALSE(env.isEqual(env2));
-    EXPECT_FALSE(env.isEqual(UVWPtr()));
-
     UVWTexture t1, t2;
     t1.uvw = a.clone();
     EXPECT_FALSE(t1.isEqual(t2.clone()));
@@ -345,42 +319,6 @@ TEST(UVWXml, MappingTypeOutsideTheTableGivesAnEmptyValue) {
     EXPECT_EQ(u"angular", mappingTypeLabel(0));
     EXPECT_EQ(u"cubic", mappingTypeLabel(1));
     EXPECT_EQ(u"spherical", mappingTypeLabel(2));
-}
-
-TEST(UVWXml, PlanarAndObjectWriteOneComponentTransform) {
-    GenPlanarWorldUVW planar;
-    GenObjectUVW object;
-    const std::string body =
-R"(        <parameters>
-          <parameter type="componentTransform" name="uvw_transform" handler="default" listType="none" label="uvw_transform">
-            <value>
-              <x_rotation>0</x_rotation>
-              <y_rotation>0</y_rotation>
-              <z_rotation>0</z_rotation>
-              <x_scale>1</x_scale>
-              <y_scale>1</y_scale>
-              <z_scale>1</z_scale>
-              <x_offset>0</x_offset>
-              <y_offset>0</y_offset>
-              <z_offset>0</z_offset>
-              <x_mirror>0</x_mirror>
-              <y_mirror>0</y_mirror>
-              <z_mirror>0</z_mirror>
-            </value>
-          </parameter>
-        </parameters>
-      </lumoplugin>
-    </plugin>
-  </Asset>
-)";
-    EXPECT_EQ("  <Asset layout=\"\" renderer=\"lumo\" type=\"uvw\" url=\"/M/UVWGenPlanarWorld\" >\n"
-              "    <plugin>\n"
-              "      <lumoplugin name=\"UVWGenPlanarWorld\" type=\"uvw\">\n" + body,
-              xmlOf(planar, u"/M"));
-    EXPECT_EQ("  <Asset layout=\"\" renderer=\"lumo\" type=\"uvw\" url=\"/M/UVWGenObject\" >\n"
-              "    <plugin>\n"
-              "      <lumoplugin name=\"UVWGenObject\" type=\"uvw\">\n" + body,
-              xmlOf(object, u"/M"));
 }
 
 TEST(UVWXml, WritingTwiceGivesTheSameText) {
