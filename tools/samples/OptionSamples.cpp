@@ -1,7 +1,6 @@
 // Render options files: one through the library's own save, and one of an
 // old record version laid by hand, as an older writer left it.
 #include <cstdint>
-#include <cstring>
 #include <fstream>
 #include <string>
 #include <vector>
@@ -50,39 +49,6 @@ bool writeRenderSettings(const std::string& path) {
     return OrvOptFile().save(o, utf8ToWide(path));
 }
 
-// Little-endian byte laying for the hand-made record.
-class Bytes {
-public:
-    Bytes& u8(std::uint8_t v) { data.push_back(v); return *this; }
-    Bytes& u32(std::uint32_t v) {
-        for (int k = 0; k < 4; ++k) data.push_back(static_cast<std::uint8_t>(v >> (8 * k)));
-        return *this;
-    }
-    Bytes& i32(std::int32_t v) { return u32(static_cast<std::uint32_t>(v)); }
-    Bytes& f32(float v) {
-        std::uint32_t bits;
-        std::memcpy(&bits, &v, 4);
-        return u32(bits);
-    }
-    Bytes& color(float r, float g, float b) { return f32(r).f32(g).f32(b); }
-    Bytes& wstr(const std::string& utf8) {
-        u32(static_cast<std::uint32_t>(utf8.size()));
-        data.insert(data.end(), utf8.begin(), utf8.end());
-        return *this;
-    }
-    // The record that a member's save writes.
-    template <class T>
-    Bytes& record(const T& member) {
-        QuickArchive ar(static_cast<std::size_t>(1));
-        member.save(ar);
-        std::vector<std::uint8_t> bytes(static_cast<std::size_t>(ar.getWritePosition()));
-        ar.getRaw(bytes.data(), bytes.size());
-        data.insert(data.end(), bytes.begin(), bytes.end());
-        return *this;
-    }
-    std::vector<std::uint8_t> data;
-};
-
 // An AllOptions record of version 4, as a writer of that time left it: no
 // physical camera, no reflect or refract environment, no animation fields.
 // Its stamp record is of version 1, and the channel list follows the
@@ -100,30 +66,45 @@ bool writeVersion4(const std::string& path) {
     params.caustics_search_distance = 20;
     params.imageSampler_fixed_subdivs = 2;
 
-    Bytes b;
-    b.u32(0x00040001u);
-    b.record(params).record(OrvaneFrameData());
-    b.u32(0x00010000u).i32(0).i32(0).i32(0).wstr("Frame %frame | %time");
-    for (int k = 0; k < 60; ++k) b.u8(0);           // font description, version 1: no length
-    b.u8(0).u8(0);                                  // no bg, gi textures
-    b.color(0.1f, 0.1f, 0.2f).color(0.8f, 0.9f, 1.0f);
-    b.i32(1).i32(1);                                // use_gi, use_bg
-    b.i32(2);                                       // filter kernel (shown as 1)
-    b.i32(480).i32(640);                            // image height, width
-    b.i32(0).i32(0).i32(1).i32(0).i32(0).i32(1);    // fov, viewport, aspect locks, raw, save
-    b.i32(1);                                       // focal distance from camera
-    b.i32(0);                                       // progress window
-    b.f32(60);                                      // fov
-    b.f32(1.2f).f32(0.8f).f32(1).f32(1);            // gi, bg colour; gi, bg texture multipliers
-    b.f32(1.5f).f32(1).f32(1.3333f);                // filter size, pixel and image aspect
-    b.f32(10).f32(5000).i32(1);                     // z-depth black, white, clamp
-    b.u32(2).u32(117).u32(131);                     // channels behind the defaults
-    b.wstr("C:\\out\\old.png");
-    for (int k = 0; k < 9; ++k) b.wstr("");         // the other nine paths
-    b.color(0.5f, 0.5f, 0.5f).i32(1);               // override colour, batch render
+    // The archive's primitives are the byte forms of the record; the member
+    // records of params and frame data are those that their save writes.
+    QuickArchive ar(static_cast<std::size_t>(1));
+    ar.writeUInt(0x00040001u);
+    params.save(ar);
+    OrvaneFrameData().save(ar);
+    ar.writeUInt(0x00010000u);                      // stamp, version 1
+    ar.writeInt(0);
+    ar.writeInt(0);
+    ar.writeInt(0);
+    ar.writeWString(u"Frame %frame | %time");
+    const std::uint8_t font[60] = {0};
+    ar.putRaw(font, sizeof font);                   // font description without a length
+    ar.writeByte(false);                            // no bg texture
+    ar.writeByte(false);                            // no gi texture
+    ar.writeColor(Color(0.1f, 0.1f, 0.2f));
+    ar.writeColor(Color(0.8f, 0.9f, 1.0f));
+    for (std::int32_t v : {1, 1, 2, 480, 640})      // use_gi, use_bg, filter kernel (shown
+        ar.writeInt(v);                             // as 1), image height and width
+    for (std::int32_t v : {0, 0, 1, 0, 0, 1})       // fov, viewport, aspect locks, raw, save
+        ar.writeInt(v);
+    ar.writeInt(1);                                 // focal distance from camera
+    ar.writeInt(0);                                 // progress window
+    for (float v : {60.0f, 1.2f, 0.8f, 1.0f, 1.0f}) // fov; gi, bg colour; gi, bg texture
+        ar.writeFloat(v);                           // multipliers
+    for (float v : {1.5f, 1.0f, 1.3333f, 10.0f, 5000.0f})  // filter size, pixel and image
+        ar.writeFloat(v);                                  // aspect, z-depth black, white
+    ar.writeInt(1);                                 // z-depth clamp
+    for (std::uint32_t v : {2u, 117u, 131u})        // channels behind the defaults
+        ar.writeLength(v);
+    ar.writeWString(u"C:\\out\\old.png");
+    for (int k = 0; k < 9; ++k) ar.writeWString(u"");  // the other nine paths
+    ar.writeColor(Color(0.5f, 0.5f, 0.5f));         // override colour
+    ar.writeInt(1);                                 // batch render
 
+    std::vector<char> bytes(static_cast<std::size_t>(ar.getWritePosition()));
+    ar.getRaw(bytes.data(), bytes.size());
     std::ofstream out(path, std::ios::binary);
-    out.write(reinterpret_cast<const char*>(b.data.data()), static_cast<std::streamsize>(b.data.size()));
+    out.write(bytes.data(), static_cast<std::streamsize>(bytes.size()));
     return static_cast<bool>(out);
 }
 
