@@ -85,8 +85,8 @@ bool writeVersion4(const std::string& path) {
     ar.writeColor(Color(0.8f, 0.9f, 1.0f));
     for (std::int32_t v : {1, 1, 2, 480, 640})      // use_gi, use_bg, filter kernel (shown
         ar.writeInt(v);                             // as 1), image height and width
-    for (std::int32_t v : {0, 0, 1, 0, 0, 1})       // fov, viewport, aspect locks, raw, save
-        ar.writeInt(v);
+    for (std::int32_t v : {0, 0, 1, 0, 0, 1})       // override fov, viewport; aspect locks;
+        ar.writeInt(v);                             // raw file; save render
     ar.writeInt(1);                                 // focal distance from camera
     ar.writeInt(0);                                 // progress window
     for (float v : {60.0f, 1.2f, 0.8f, 1.0f, 1.0f}) // fov; gi, bg colour; gi, bg texture
