@@ -286,11 +286,6 @@ TEST(OptionsDocument, FlagsAndTheirTranslations) {
         {"focal distance not from the camera: overridden",
          [](AllOptions& o) { o.focalDistFromCamera = 0; }, u"/SettingsCameraDof",
          u"override_focal_dist", u"1"},
-        {"any non-zero flag is 1", [](AllOptions& o) { o.params.gi_on = 5; }, u"/SettingsGI",
-         u"on", u"1"},
-        {"the toggle follows auto_search_distance",
-         [](AllOptions& o) { o.params.photonMap_auto_search_distance = 0; },
-         u"/SettingsPhotonMap", u"search_distance_toggle", u"0"},
         {"file names are escaped",
          [](AllOptions& o) { o.output_img_file = u"C:\\a&b<c>.png"; }, u"/SettingsOutput",
          u"img_file", u"C:\\a&amp;b&lt;c&gt;.png"},
@@ -311,9 +306,6 @@ TEST(OptionsDocument, FlagsAndTheirTranslations) {
              o.physicalCamera.focal_length.load(ar);
          },
          u"/CameraPhysical", u"focal_length", u"0"},
-        {"path_sampler_type", [](AllOptions&) {}, u"/SettingsDMCSampler", u"path_sampler_type",
-         u"2"},
-        {"clamp_level", [](AllOptions&) {}, u"/SettingsColorMapping", u"clamp_level", u"1"},
     };
     for (const Case& c : kCases) {
         AllOptions o;
