@@ -96,21 +96,36 @@ TEST(AllOptionsRecord, ChannelListRules) {
     }
 }
 
-TEST(AllOptionsRecord, HugeChannelCountFailsFast) {
-    // The stored count 0 becomes four billion. Records with and without an
-    // entry differ first at the count.
+TEST(AllOptionsRecord, HugeCountsFailFast) {
+    // A count of four billion read from damaged data fails the load at once
+    // instead of filling memory or spinning.
+    std::vector<std::vector<std::uint8_t>> damaged;
+
+    // The channel count: records with and without an entry differ first there.
     const RecordBytes full = documentRecord(23, {});
     const RecordBytes withOne = documentRecord(23, {100});
     std::size_t at = 0;
     while (full.bytes()[at] == withOne.bytes()[at]) ++at;
-    std::vector<std::uint8_t> bytes = full.bytes();
-    bytes[at] = bytes[at + 1] = bytes[at + 2] = bytes[at + 3] = 0xFF;
-    RecordBytes damaged;
-    damaged.append(bytes);
-    AllOptions o;
-    const auto start = std::chrono::steady_clock::now();
-    EXPECT_FALSE(loadWhole(o, damaged));
-    EXPECT_LT(std::chrono::steady_clock::now() - start, std::chrono::seconds(1));
+    damaged.push_back(full.bytes());
+    std::fill_n(damaged.back().begin() + at, 4, 0xFF);
+
+    // The key count of the camera's focal length: its record's tag, the count
+    // of one key and the time width 8.
+    damaged.push_back(savedBytes(AllOptions()));
+    const std::uint8_t keys[] = {0, 0, 1, 0, 1, 0, 0, 0, 8, 0, 0, 0};
+    auto found = std::search(damaged.back().begin(), damaged.back().end(), std::begin(keys),
+                             std::end(keys));
+    ASSERT_NE(damaged.back().end(), found);
+    std::fill_n(found + 4, 4, 0xFF);
+
+    for (const std::vector<std::uint8_t>& bytes : damaged) {
+        RecordBytes b;
+        b.append(bytes);
+        AllOptions o;
+        const auto start = std::chrono::steady_clock::now();
+        EXPECT_FALSE(loadWhole(o, b));
+        EXPECT_LT(std::chrono::steady_clock::now() - start, std::chrono::seconds(1));
+    }
 }
 
 TEST(AllOptionsRecord, PathsAreCutTo2047Characters) {
