@@ -21,8 +21,8 @@ struct KeyTimeLess {
     bool operator()(double a, double b) const { return std::fabs(a - b) >= kSameKey && b > a; }
 };
 
-// The key set shared by the three animated classes: storage, lookup, and the
-// key part of the record (count, time width, keys).
+// The key set shared by the three animated classes: storage, index access and
+// the value at a time.
 template <class V>
 class KeyTrack {
 public:

@@ -1,11 +1,16 @@
 #include "animation/BaseCamera.h"
 
+#include <boost/make_shared.hpp>
+
+#include "animation/Camera.h"
+
 namespace OrvaneLumoCore {
 
-// No class of this family exists yet: every tag gives a null pointer.
 CameraPtr createCamera(std::int32_t tag) {
-    (void)tag;
-    return CameraPtr();
+    switch (tag) {
+        case PhysicalCamera::kType: return boost::make_shared<PhysicalCamera>();
+        default: return CameraPtr();
+    }
 }
 
 }  // namespace OrvaneLumoCore

@@ -26,6 +26,8 @@ std::string readRest(std::istream& in) {
     return body;
 }
 
+}  // namespace
+
 // Version 1 files went through a text-mode write: each CR LF pair becomes LF,
 // in one pass from left to right (CR CR LF turns into CR LF).
 std::string undoTextMode(const std::string& body) {
@@ -41,8 +43,6 @@ std::string undoTextMode(const std::string& body) {
     }
     return out;
 }
-
-}  // namespace
 
 bool OrvMatFile::load(std::istream& in) {
     std::uint32_t header[2] = {0, 0};

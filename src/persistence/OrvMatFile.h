@@ -11,6 +11,9 @@
 
 namespace OrvaneLumoCore {
 
+// The body of a version 1 file with each CR LF pair turned back into LF.
+std::string undoTextMode(const std::string& body);
+
 class OrvMatFile {
 public:
     OrvMatFile() = default;

@@ -24,4 +24,10 @@ typedef boost::shared_ptr<BaseTexture> TexturePtr;
 // New default texture for tags 0 to 12, null otherwise (-1 included).
 TexturePtr createTexture(std::int32_t tag);
 
+// Display names of the texture classes, by type tag; no record or XML uses
+// them. textureLabel gives an empty string for a tag outside the table.
+const int kTextureTagCount = 13;
+extern const char16_t* const kTextureLabels[kTextureTagCount];
+std::u16string textureLabel(std::int32_t tag);
+
 }  // namespace OrvaneLumoCore

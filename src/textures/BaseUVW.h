@@ -26,4 +26,7 @@ typedef boost::shared_ptr<BaseUVW> UVWPtr;
 // New default generator for tags 0, 1, 3 and 4, null otherwise.
 UVWPtr createUVW(std::int32_t tag);
 
+// A new GenPlanarWorldUVW, the same as createUVW(0).
+UVWPtr defaultPlanarUVW();
+
 }  // namespace OrvaneLumoCore

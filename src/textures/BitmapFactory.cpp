@@ -1,11 +1,13 @@
 #include "textures/BaseBitmap.h"
+#include "textures/Bitmaps.h"
 
 namespace OrvaneLumoCore {
 
-// No class of this family exists yet: every tag gives a null pointer.
 BitmapPtr createBitmap(std::int32_t tag) {
-    (void)tag;
-    return BitmapPtr();
+    switch (tag) {
+        case 0: return BitmapPtr(new BitmapBuffer());
+        default: return BitmapPtr();
+    }
 }
 
 }  // namespace OrvaneLumoCore

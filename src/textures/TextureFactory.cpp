@@ -1,11 +1,31 @@
 #include "textures/BaseTexture.h"
+#include "textures/BasicTextures.h"
+#include "textures/Bitmaps.h"
+#include "textures/UVWGenerators.h"
 
 namespace OrvaneLumoCore {
 
-// No class of this family exists yet: every tag gives a null pointer.
+const char16_t* const kTextureLabels[kTextureTagCount] = {
+    u"Bitmap", u"Fresnel", u"UVW",    u"Noise",  u"Checker", u"AColor", u"Grid",
+    u"Cloth",  u"Bulge",   u"Invert", u"Blend",  u"Ramp",    u"Sky"};
+
+std::u16string textureLabel(std::int32_t tag) {
+    if (tag < 0 || tag >= kTextureTagCount) return std::u16string();
+    return kTextureLabels[tag];
+}
+
+// Tags without a class yet, -1 among them, give a null pointer.
 TexturePtr createTexture(std::int32_t tag) {
-    (void)tag;
-    return TexturePtr();
+    switch (tag) {
+        case 0: return TexturePtr(new BitmapTexture());
+        case 1: return TexturePtr(new FresnelTexture());
+        case 2: return TexturePtr(new UVWTexture());
+        case 5: return TexturePtr(new AColorTexture());
+        case 9: return TexturePtr(new InvertTexture());
+        case 10: return TexturePtr(new BlendTexture());
+        case -1:
+        default: return TexturePtr();
+    }
 }
 
 }  // namespace OrvaneLumoCore

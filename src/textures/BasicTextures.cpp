@@ -1,0 +1,257 @@
+#include "textures/BasicTextures.h"
+
+#include <algorithm>
+#include <cstring>
+
+#include "persistence/QuickArchive.h"
+#include "persistence/Record.h"
+#include "textures/TextureFrame.h"
+#include "xml/AssetXmlWriter.h"
+
+namespace OrvaneLumoCore {
+
+namespace {
+
+float floatFromBits(std::uint32_t bits) {
+    float f;
+    std::memcpy(&f, &bits, sizeof f);
+    return f;
+}
+
+// The colour that XML shows for a stored complement: max(0, 1 - c) per channel.
+Color complement(const Color& c) {
+    return Color(std::max(0.0f, 1.0f - c.r), std::max(0.0f, 1.0f - c.g),
+                 std::max(0.0f, 1.0f - c.b));
+}
+
+}  // namespace
+
+// ---- FresnelTexture ------------------------------------------------------------
+
+void FresnelTexture::reset() {
+    reflection_tex.reset();
+    refraction_tex.reset();
+    fresnel_ior_tex.reset();
+    refract_ior_tex.reset();
+    whiteInverse = Color(1, 1, 1);
+    const float black = floatFromBits(0x3E828283u);  // 0.25490198
+    blackInverse = Color(black, black, black);
+    fresnel_ior = 1.55f;
+    refract_ior = 1.55f;
+    black_color_tex_mult = 1.0f;
+    white_color_tex_mult = 1.0f;
+    fresnel_ior_tex_mult = 1.0f;
+    refract_ior_tex_mult = 1.0f;
+}
+
+bool FresnelTexture::save(QuickArchive& ar) const {
+    writeVersion(ar, 2);
+    ar.writeColor(whiteInverse);
+    ar.writeColor(blackInverse);
+    ar.writeFloat(fresnel_ior);
+    ar.writeFloat(refract_ior);
+    ar.writeFloat(black_color_tex_mult);
+    ar.writeFloat(white_color_tex_mult);
+    ar.writeFloat(fresnel_ior_tex_mult);
+    ar.writeFloat(refract_ior_tex_mult);
+    return saveOptionalMember(ar, reflection_tex) && saveOptionalMember(ar, refraction_tex) &&
+           saveOptionalMember(ar, fresnel_ior_tex) && saveOptionalMember(ar, refract_ior_tex);
+}
+
+bool FresnelTexture::load(QuickArchive& ar) {
+    reset();
+    const int v = readVersion(ar, 1, 2);
+    if (v < 0) return false;
+    ar.readColor(whiteInverse);
+    ar.readColor(blackInverse);
+    ar.readFloat(fresnel_ior);
+    ar.readFloat(refract_ior);
+    if (v < 2) return true;
+    ar.readFloat(black_color_tex_mult);
+    ar.readFloat(white_color_tex_mult);
+    ar.readFloat(fresnel_ior_tex_mult);
+    ar.readFloat(refract_ior_tex_mult);
+    return loadOptionalMember(ar, reflection_tex, createTexture) &&
+           loadOptionalMember(ar, refraction_tex, createTexture) &&
+           loadOptionalMember(ar, fresnel_ior_tex, createTexture) &&
+           loadOptionalMember(ar, refract_ior_tex, createTexture);
+}
+
+TexturePtr FresnelTexture::clone() const {
+    boost::shared_ptr<FresnelTexture> copy(new FresnelTexture(*this));
+    copy->reflection_tex = cloneChild(reflection_tex);
+    copy->refraction_tex = cloneChild(refraction_tex);
+    copy->fresnel_ior_tex = cloneChild(fresnel_ior_tex);
+    copy->refract_ior_tex = cloneChild(refract_ior_tex);
+    return copy;
+}
+
+bool FresnelTexture::isEqual(const TexturePtr& other) const {
+    const FresnelTexture* o = sameClass(*this, other);
+    return o && childrenEqual(reflection_tex, o->reflection_tex) &&
+           childrenEqual(refraction_tex, o->refraction_tex) &&
+           childrenEqual(fresnel_ior_tex, o->fresnel_ior_tex) &&
+           childrenEqual(refract_ior_tex, o->refract_ior_tex) && whiteInverse == o->whiteInverse &&
+           blackInverse == o->blackInverse && fresnel_ior == o->fresnel_ior &&
+           refract_ior == o->refract_ior && black_color_tex_mult == o->black_color_tex_mult &&
+           white_color_tex_mult == o->white_color_tex_mult &&
+           fresnel_ior_tex_mult == o->fresnel_ior_tex_mult &&
+           refract_ior_tex_mult == o->refract_ior_tex_mult;
+}
+
+void FresnelTexture::writeXml(AssetXmlWriter& w, std::u16string url) {
+    TextureFrame frame(w, *this, url);
+    const SlotRef reflection = frame.slot(reflection_tex, u"reflection_tex");
+    const SlotRef refraction = frame.slot(refraction_tex, u"refraction_tex");
+    const SlotRef fresnelIor = frame.slot(fresnel_ior_tex, u"fresnel_ior_tex");
+    const SlotRef refractIor = frame.slot(refract_ior_tex, u"refract_ior_tex");
+    frame.open();
+    w.writeColor("white_color", complement(whiteInverse));
+    w.writeColor("black_color", complement(blackInverse));
+    w.writeFloat("fresnel_ior", fresnel_ior);
+    w.writeFloat("refract_ior", refract_ior);
+    w.writeFloat("black_color_tex_mult", black_color_tex_mult);
+    w.writeFloat("white_color_tex_mult", white_color_tex_mult);
+    w.writeFloat("fresnel_ior_tex_mult", fresnel_ior_tex_mult);
+    w.writeFloat("refract_ior_tex_mult", refract_ior_tex_mult);
+    // The first slot feeds the black colour and the second the white one,
+    // crosswise to the colours above.
+    frame.writeRef("black_color_tex", reflection);
+    frame.writeRef("white_color_tex", refraction);
+    frame.writeRef("fresnel_ior_tex", fresnelIor);
+    frame.writeRef("refract_ior_tex", refractIor);
+    frame.close();
+}
+
+// ---- BlendTexture --------------------------------------------------------------
+
+void BlendTexture::reset() {
+    color_a.reset();
+    color_b.reset();
+    colorAMult = 1.0f;
+    colorBMult = 1.0f;
+    blend_amount = 0.5f;
+}
+
+bool BlendTexture::save(QuickArchive& ar) const {
+    writeVersion(ar, 2);
+    if (!saveOptionalMember(ar, color_a)) return false;
+    if (color_a) ar.writeFloat(colorAMult);
+    if (!saveOptionalMember(ar, color_b)) return false;
+    if (color_b) ar.writeFloat(colorBMult);
+    ar.writeFloat(blend_amount);
+    return true;
+}
+
+bool BlendTexture::load(QuickArchive& ar) {
+    reset();
+    const int v = readVersion(ar, 1, 2);
+    if (v < 0) return false;
+    if (!loadOptionalMember(ar, color_a, createTexture)) return false;
+    if (v >= 2 && color_a) ar.readFloat(colorAMult);
+    if (!loadOptionalMember(ar, color_b, createTexture)) return false;
+    if (v >= 2 && color_b) ar.readFloat(colorBMult);
+    ar.readFloat(blend_amount);
+    return true;
+}
+
+TexturePtr BlendTexture::clone() const {
+    boost::shared_ptr<BlendTexture> copy(new BlendTexture(*this));
+    copy->color_a = cloneChild(color_a);
+    copy->color_b = cloneChild(color_b);
+    return copy;
+}
+
+bool BlendTexture::isEqual(const TexturePtr& other) const {
+    const BlendTexture* o = sameClass(*this, other);
+    return o && childrenEqual(color_a, o->color_a) && childrenEqual(color_b, o->color_b) &&
+           colorAMult == o->colorAMult && colorBMult == o->colorBMult &&
+           blend_amount == o->blend_amount;
+}
+
+void BlendTexture::writeXml(AssetXmlWriter& w, std::u16string url) {
+    TextureFrame frame(w, *this, url);
+    const SlotRef a = frame.slot(color_a, u"color_a");
+    const SlotRef b = frame.slot(color_b, u"color_b");
+    frame.open();
+    frame.writeRef("color_a", a);
+    frame.writeRef("color_b", b);
+    w.writeFloat("blend_amount", blend_amount);
+    frame.close();
+}
+
+// ---- InvertTexture -------------------------------------------------------------
+
+void InvertTexture::reset() {
+    texture.reset();
+    invert_alpha = false;
+}
+
+bool InvertTexture::save(QuickArchive& ar) const {
+    if (!texture) return false;
+    writeVersion(ar, 1);
+    if (!saveRequiredMember(ar, texture)) return false;
+    ar.writeByte(invert_alpha);
+    return true;
+}
+
+bool InvertTexture::load(QuickArchive& ar) {
+    reset();
+    if (readVersion(ar, 1, 1) < 0) return false;
+    if (!loadRequiredMember(ar, texture, createTexture)) return false;
+    ar.readByte(invert_alpha);
+    return true;
+}
+
+TexturePtr InvertTexture::clone() const {
+    boost::shared_ptr<InvertTexture> copy(new InvertTexture(*this));
+    copy->texture = cloneChild(texture);
+    return copy;
+}
+
+bool InvertTexture::isEqual(const TexturePtr& other) const {
+    const InvertTexture* o = sameClass(*this, other);
+    return o && childrenEqual(texture, o->texture) && invert_alpha == o->invert_alpha;
+}
+
+void InvertTexture::writeXml(AssetXmlWriter& w, std::u16string url) {
+    TextureFrame frame(w, *this, url);
+    const SlotRef base = frame.slot(texture, u"base_texture");
+    frame.open();
+    frame.writeRef("texture", base);
+    w.writeBool("invert_alpha", invert_alpha);
+    frame.close();
+}
+
+// ---- AColorTexture -------------------------------------------------------------
+
+void AColorTexture::reset() { color = AColor(1, 1, 1, 1); }
+
+bool AColorTexture::save(QuickArchive& ar) const {
+    writeVersion(ar, 1);
+    ar.writeAColor(color);
+    return true;
+}
+
+bool AColorTexture::load(QuickArchive& ar) {
+    reset();
+    if (readVersion(ar, 1, 1) < 0) return false;
+    ar.readAColor(color);
+    return true;
+}
+
+TexturePtr AColorTexture::clone() const { return TexturePtr(new AColorTexture(*this)); }
+
+bool AColorTexture::isEqual(const TexturePtr& other) const {
+    const AColorTexture* o = sameClass(*this, other);
+    return o && color == o->color;
+}
+
+void AColorTexture::writeXml(AssetXmlWriter& w, std::u16string url) {
+    TextureFrame frame(w, *this, url);
+    frame.open();
+    w.writeAColor("texture", color);
+    frame.close();
+}
+
+}  // namespace OrvaneLumoCore

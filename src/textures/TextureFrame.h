@@ -1,0 +1,134 @@
+#pragma once
+// The XML frame that every texture (and every other node written the same
+// way: UVW generators, bitmaps, BRDF layers) shares:
+//
+//   1. the node's own url: the owner's url, "/" and the plugin name;
+//   2. for each child slot, in slot order, the slot url (own url, "/", the
+//      slot's segment word) and, if the child is present, the child's Assets;
+//   3. the node's Asset: openAsset(own url, asset type, ""), openPlugin,
+//      openParameters;
+//   4. the parameters; a child is referred to by a `plugin` parameter whose
+//      value is the slot url, "/" and the child's plugin name, or which has no
+//      value at all when the slot is empty;
+//   5. closeParameters, closePlugin, closeAsset.
+//
+// A class describes only its slots and its parameters:
+//
+//   void BlendTexture::writeXml(AssetXmlWriter& w, std::u16string url) {
+//       TextureFrame frame(w, *this, url);
+//       const SlotRef a = frame.slot(color_a, u"color_a");   // slots first,
+//       const SlotRef b = frame.slot(color_b, u"color_b");   // in slot order
+//       frame.open();
+//       frame.writeRef("color_a", a);                        // then parameters
+//       frame.writeRef("color_b", b);
+//       w.writeFloat("blend_amount", blend_amount);
+//       frame.close();
+//   }
+//
+// A slot's segment and the parameter that refers to it need not share a word
+// (an InvertTexture's slot "base_texture" goes to the parameter "texture"),
+// and parameters may refer to slots in another order than the slots were
+// declared in; both are expressed by which SlotRef goes to which writeRef.
+//
+// A reference that isn't a child's Asset url (a sky's sun) is written with
+// writer().writePluginRef between open() and close().
+//
+// A node whose own url isn't formed from its plugin name (a BRDF layer's is
+// the material's url and the layer's name) passes UrlIs::Own with that url.
+//
+// Slots after open(), a second open() and a close() without open() are
+// programming errors, caught by assertions in debug builds. Every open() needs
+// its close(): the frame doesn't close on leaving its scope, since the writer
+// may throw (allocation failure) and a destructor must not write then.
+//
+// The records of children use the member helpers of persistence/Record.h
+// (loadRequiredMember / loadOptionalMember with createTexture, createUVW or
+// createBitmap, and their save twins); clone uses cloneChild, and isEqual
+// starts with sameClass below, then childrenEqual for each slot.
+#include <string>
+#include <type_traits>
+
+#include <boost/any.hpp>
+#include <boost/shared_ptr.hpp>
+
+#include "persistence/Serializable.h"
+#include "xml/AssetXmlWriter.h"
+
+namespace OrvaneLumoCore {
+
+class BaseTexture;
+class BaseMaterial;
+class BaseUVW;
+class BaseCamera;
+class BaseBitmap;
+class BaseLight;
+
+// A declared child slot as the parameters refer to it.
+struct SlotRef {
+    boost::any child;     // shared_ptr of the slot's root type; may hold null
+    std::u16string url;   // the slot's url, without the child's plugin name
+};
+
+// What the url given to TextureFrame is.
+enum class UrlIs {
+    Owner,  // the owner's url: the own url appends "/" and the plugin name
+    Own     // the node's own url, used as it is
+};
+
+class TextureFrame {
+public:
+    TextureFrame(AssetXmlWriter& writer, const OrvaneXMLSerializable& self, const std::u16string& url,
+                 UrlIs kind = UrlIs::Owner);
+    TextureFrame(const TextureFrame&) = delete;
+    TextureFrame& operator=(const TextureFrame&) = delete;
+
+    // Declares the next child slot: forms its url and writes the child's
+    // Assets now if the child is present. `T` is the slot's root type (the
+    // field's declared type), which is what the writer recognises.
+    template <class T>
+    SlotRef slot(const boost::shared_ptr<T>& child, const char16_t* segment) {
+        static_assert(std::is_same<T, BaseTexture>::value || std::is_same<T, BaseMaterial>::value ||
+                          std::is_same<T, BaseUVW>::value || std::is_same<T, BaseCamera>::value ||
+                          std::is_same<T, BaseBitmap>::value || std::is_same<T, BaseLight>::value,
+                      "a slot holds a pointer of one of the six root types");
+        SlotRef ref;
+        ref.child = child;
+        ref.url = slotUrl(segment);
+        if (child) child->writeXml(writer_, ref.url);
+        return ref;
+    }
+
+    // openAsset, openPlugin, openParameters.
+    void open();
+    // The `plugin` parameter `name` that refers to the slot's child.
+    void writeRef(const WriterText& name, const SlotRef& slot);
+    // closeParameters, closePlugin, closeAsset.
+    void close();
+
+    const std::u16string& ownUrl() const { return ownUrl_; }
+    AssetXmlWriter& writer() { return writer_; }
+
+private:
+    std::u16string slotUrl(const char16_t* segment) const;
+
+    enum class State { Slots, Open, Closed };
+
+    AssetXmlWriter& writer_;
+    const OrvaneXMLSerializable& self_;
+    std::u16string ownUrl_;
+    State state_ = State::Slots;
+};
+
+}  // namespace OrvaneLumoCore
+
+namespace OrvaneLumoCore {
+
+// `other` as an object of the class of `self` for isEqual: null when `other`
+// is null or has another type tag.
+template <class T, class Root>
+const T* sameClass(const T& self, const boost::shared_ptr<Root>& other) {
+    if (!other || other->getType() != self.getType()) return nullptr;
+    return dynamic_cast<const T*>(other.get());
+}
+
+}  // namespace OrvaneLumoCore

@@ -1,0 +1,134 @@
+#pragma once
+// The UVW generators and the texture that shows one. A generator keeps each
+// placement twice: as a stored transform and as its components. The
+// components are the source; syncTransforms recomputes the transforms from
+// them before XML is written, so a transform read from a file never reaches
+// the XML on its own.
+#include <cstdint>
+#include <string>
+
+#include "animation/TransformComponents.h"
+#include "persistence/Types.h"
+#include "textures/BaseTexture.h"
+#include "textures/BaseUVW.h"
+
+namespace OrvaneLumoCore {
+
+// The 3x3 part composed from components, in f32: A B C with
+//   A = (fx,0,0), (0,cos x,sin x), (0,-sin x,cos x)
+//   B = (cos y,0,-sin y), (0,fy,0), (sin y,0,cos y)
+//   C = (cos z,sin z,0), (-sin z,cos z,0), (0,0,fz)
+// given by columns (the order of Matrix::m), angles in degrees turned into
+// radians by the f32 factor 0.017453292, and f = scale, negated where the
+// axis is mirrored.
+Matrix composeMatrix(const TransformComponents& c);
+// The composed 3x3 part and the components' offsets.
+Transform composeTransform(const TransformComponents& c);
+
+// Channel mapping: a transform of the uvw channel and one of the texture.
+class GenChannelUVW : public BaseUVW {
+public:
+    static const std::uint32_t kType = 4;
+    GenChannelUVW() { reset(); }
+
+    bool save(QuickArchive& ar) const override;
+    bool load(QuickArchive& ar) override;
+    void reset() override;
+    std::uint32_t getType() const override { return kType; }
+    void syncTransforms() override;
+    UVWPtr clone() const override;
+    bool isEqual(const UVWPtr& other) const override;
+    void writeXml(AssetXmlWriter& writer, std::u16string url) override;
+    std::u16string getPluginName() const override { return u"UVWGenChannel"; }
+
+    Transform uvwTransform;
+    Transform texTransform;
+    TransformComponents uvwComponents;
+    TransformComponents texComponents;
+    std::int32_t wrap_u;
+    std::int32_t wrap_v;
+    std::int32_t uvw_channel;
+};
+
+// Environment mapping; `mapping_type` indexes kMappingTypeLabels.
+class GenEnvironmentUVW : public BaseUVW {
+public:
+    static const std::uint32_t kType = 3;
+    GenEnvironmentUVW() { reset(); }
+
+    bool save(QuickArchive& ar) const override;
+    bool load(QuickArchive& ar) override;
+    void reset() override;
+    std::uint32_t getType() const override { return kType; }
+    void syncTransforms() override;
+    UVWPtr clone() const override;
+    bool isEqual(const UVWPtr& other) const override;
+    void writeXml(AssetXmlWriter& writer, std::u16string url) override;
+    std::u16string getPluginName() const override { return u"UVWGenEnvironment"; }
+
+    std::int32_t mapping_type;
+    Matrix uvw_matrix;
+    TransformComponents uvwComponents;
+};
+
+extern const char16_t* const kMappingTypeLabels[4];
+
+// The label of a mapping type; empty for a value outside the table, which a
+// record may hold since it isn't checked on reading.
+std::u16string mappingTypeLabel(std::int32_t mappingType);
+
+// A generator with one placement; planar world and object mapping differ only
+// in tag and plugin name.
+class GenPlacementUVW : public BaseUVW {
+public:
+    bool save(QuickArchive& ar) const override;
+    bool load(QuickArchive& ar) override;
+    void reset() override;
+    void syncTransforms() override;
+    bool isEqual(const UVWPtr& other) const override;
+    void writeXml(AssetXmlWriter& writer, std::u16string url) override;
+
+    Transform uvwTransform;
+    TransformComponents uvwComponents;
+
+protected:
+    GenPlacementUVW() = default;
+};
+
+class GenPlanarWorldUVW : public GenPlacementUVW {
+public:
+    static const std::uint32_t kType = 0;
+    GenPlanarWorldUVW() { reset(); }
+    std::uint32_t getType() const override { return kType; }
+    UVWPtr clone() const override { return UVWPtr(new GenPlanarWorldUVW(*this)); }
+    std::u16string getPluginName() const override { return u"UVWGenPlanarWorld"; }
+};
+
+class GenObjectUVW : public GenPlacementUVW {
+public:
+    static const std::uint32_t kType = 1;
+    GenObjectUVW() { reset(); }
+    std::uint32_t getType() const override { return kType; }
+    UVWPtr clone() const override { return UVWPtr(new GenObjectUVW(*this)); }
+    std::u16string getPluginName() const override { return u"UVWGenObject"; }
+};
+
+// A texture that only shows its generator.
+class UVWTexture : public BaseTexture {
+public:
+    static const std::uint32_t kType = 2;
+    UVWTexture() { reset(); }
+
+    bool save(QuickArchive& ar) const override;  // false, writing nothing, without `uvw`
+    bool load(QuickArchive& ar) override;
+    void reset() override;
+    std::uint32_t getType() const override { return kType; }
+    TexturePtr clone() const override;
+    bool isEqual(const TexturePtr& other) const override;
+    void writeXml(AssetXmlWriter& writer, std::u16string url) override;
+    std::u16string getPluginName() const override { return u"TexUVW"; }
+
+    UVWPtr uvw;
+};
+
+}  // namespace OrvaneLumoCore

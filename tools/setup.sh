@@ -1,0 +1,30 @@
+#!/usr/bin/env bash
+# Installs what the build needs and is missing on a Debian 12 machine.
+set -euo pipefail
+
+need=()
+command -v cmake >/dev/null || need+=(cmake)
+command -v g++ >/dev/null || need+=(g++)
+command -v make >/dev/null || need+=(make)
+[ -f /usr/include/boost/any.hpp ] || need+=(libboost-dev)
+[ -f /usr/include/gtest/gtest.h ] || need+=(libgtest-dev)
+[ -f /usr/include/benchmark/benchmark.h ] || need+=(libbenchmark-dev)
+if [ ${#need[@]} -gt 0 ]; then
+  echo "Installing: ${need[*]}"
+  SUDO=""
+  [ "$(id -u)" -eq 0 ] || SUDO="sudo"
+  $SUDO apt-get update -qq
+  DEBIAN_FRONTEND=noninteractive $SUDO apt-get install -y -qq "${need[@]}"
+fi
+
+# CPython 2.7 with headers: pyenv's 2.7.18, else python2.7-config on the PATH.
+if command -v pyenv >/dev/null && pyenv prefix 2.7.18 >/dev/null 2>&1; then
+  :
+elif [ -x "$HOME/.pyenv/bin/pyenv" ] && "$HOME/.pyenv/bin/pyenv" prefix 2.7.18 >/dev/null 2>&1; then
+  :
+elif command -v python2.7-config >/dev/null; then
+  :
+else
+  echo "CPython 2.7 with headers is needed (pyenv install 2.7.18)" >&2
+  exit 1
+fi
