@@ -132,23 +132,39 @@ struct RecordRow {
     bool inVersion(int version) const { return version >= since && version <= until; }
 };
 
-// Reads the fields that `version` holds, in table order.
-template <class C, std::size_t N>
-void readFields(QuickArchive& ar, C& obj, const RecordRow<C> (&rows)[N], int version) {
+// A table held elsewhere, for descriptions that gather several tables.
+template <class Row>
+struct RowSpan {
+    const Row* first = nullptr;
+    const Row* last = nullptr;
+    const Row* begin() const { return first; }
+    const Row* end() const { return last; }
+    std::size_t size() const { return static_cast<std::size_t>(last - first); }
+};
+
+template <class Row, std::size_t N>
+constexpr RowSpan<Row> rowSpan(const Row (&rows)[N]) {
+    return RowSpan<Row>{rows, rows + N};
+}
+
+// Reads the fields that `version` holds, in table order. `rows` is an array
+// or a RowSpan of RecordRow<C>.
+template <class C, class Rows>
+void readFields(QuickArchive& ar, C& obj, const Rows& rows, int version) {
     for (const RecordRow<C>& row : rows)
         if (row.inVersion(version)) row.field.read(ar, obj);
 }
 
 // Writes the fields that `version` holds, in table order.
-template <class C, std::size_t N>
-void writeFields(QuickArchive& ar, const C& obj, const RecordRow<C> (&rows)[N], int version) {
+template <class C, class Rows>
+void writeFields(QuickArchive& ar, const C& obj, const Rows& rows, int version) {
     for (const RecordRow<C>& row : rows)
         if (row.inVersion(version)) row.field.write(ar, obj);
 }
 
 // True if every field of the table is equal in both objects.
-template <class C, std::size_t N>
-bool fieldsEqual(const C& x, const C& y, const RecordRow<C> (&rows)[N]) {
+template <class C, class Rows>
+bool fieldsEqual(const C& x, const C& y, const Rows& rows) {
     for (const RecordRow<C>& row : rows)
         if (!row.field.equal(x, y)) return false;
     return true;
@@ -163,8 +179,8 @@ struct ParamRow {
     bool isUserData = false;
 };
 
-template <class C, std::size_t N>
-void writeParams(AssetXmlWriter& w, const C& obj, const ParamRow<C> (&rows)[N]) {
+template <class C, class Rows>
+void writeParams(AssetXmlWriter& w, const C& obj, const Rows& rows) {
     for (const ParamRow<C>& row : rows) row.field.writeParam(w, row.name, row.label, row.isUserData, obj);
 }
 
