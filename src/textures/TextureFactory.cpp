@@ -1,6 +1,7 @@
 #include "textures/BaseTexture.h"
 #include "textures/BasicTextures.h"
 #include "textures/Bitmaps.h"
+#include "textures/ProceduralTextures.h"
 #include "textures/UVWGenerators.h"
 
 namespace OrvaneLumoCore {
@@ -20,9 +21,15 @@ TexturePtr createTexture(std::int32_t tag) {
         case 0: return TexturePtr(new BitmapTexture());
         case 1: return TexturePtr(new FresnelTexture());
         case 2: return TexturePtr(new UVWTexture());
+        case 3: return TexturePtr(new NoiseTexture());
+        case 4: return TexturePtr(new CheckerTexture());
         case 5: return TexturePtr(new AColorTexture());
+        case 6: return TexturePtr(new GridTexture());
+        case 7: return TexturePtr(new ClothTexture());
+        case 8: return TexturePtr(new BulgeTexture());
         case 9: return TexturePtr(new InvertTexture());
         case 10: return TexturePtr(new BlendTexture());
+        case 11: return TexturePtr(new RampTexture());
         case -1:
         default: return TexturePtr();
     }
