@@ -2,6 +2,7 @@
 #include "textures/BasicTextures.h"
 #include "textures/Bitmaps.h"
 #include "textures/ProceduralTextures.h"
+#include "textures/SkyTexture.h"
 #include "textures/UVWGenerators.h"
 
 namespace OrvaneLumoCore {
@@ -15,7 +16,7 @@ std::u16string textureLabel(std::int32_t tag) {
     return kTextureLabels[tag];
 }
 
-// Tags without a class yet, -1 among them, give a null pointer.
+// Tags without a class, -1 among them, give a null pointer.
 TexturePtr createTexture(std::int32_t tag) {
     switch (tag) {
         case 0: return TexturePtr(new BitmapTexture());
@@ -30,6 +31,7 @@ TexturePtr createTexture(std::int32_t tag) {
         case 9: return TexturePtr(new InvertTexture());
         case 10: return TexturePtr(new BlendTexture());
         case 11: return TexturePtr(new RampTexture());
+        case 12: return TexturePtr(new SkyTexture());
         case -1:
         default: return TexturePtr();
     }
