@@ -479,3 +479,23 @@ TEST(DocumentSun, IsTheDefaultNamedSun) {
     EXPECT_FALSE(isDocumentSunId(u"D3BE9766-E4AA-418b-81A9-23414A2BA98D"));
     EXPECT_TRUE(sunSettingsEqual(*sun, SunSettings()));
 }
+
+TEST(LightRecords, DamagedRecordsFailQuietly) {
+    // Every prefix of every record loads without a crash.
+    for (const NewestRecord& r : kNewest) {
+        const RecordBytes whole = r.bytes();
+        for (std::size_t len = 0; len < whole.size(); ++len) {
+            QuickArchive ar(whole.bytes().data(), len);
+            createLight(r.tag)->load(ar);
+        }
+    }
+    // MayaDirectLight version 4 whose transform record announces more keys
+    // than the archive holds.
+    RecordBytes v4;
+    v4.u32(0x40000);
+    color(v4, 1, 1, 1);
+    color(v4, 0, 0, 0);
+    v4.f32(0).f32(1).f32(1).i32(1000).i32(500).i32(3).u8(1).u8(1).i32(8).f32(0);
+    v4.u32(0x10000).u32(0x7FFFFFFF).u32(8);
+    loaded<MayaDirectLight>(v4, false);
+}

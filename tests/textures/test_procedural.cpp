@@ -350,3 +350,28 @@ TEST(ProceduralTextures, CloneIsDeep) {
     EXPECT_FALSE(grid->isEqual(copy2));
     EXPECT_EQ(xmlOf(*grid, u"/M"), xmlOf(*copy2, u"/M"));
 }
+
+TEST(ProceduralTextures, DamagedRecordsFailQuietly) {
+    // Every prefix of every record loads without a crash; the archive runs
+    // dry somewhere, and the result is whatever the stale reads give.
+    for (const Newest& n : kNewest) {
+        const Bytes whole = n.bytes();
+        for (std::size_t len = 0; len < whole.data.size(); ++len) {
+            Bytes cut;
+            cut.data.assign(whole.data.begin(), whole.data.begin() + len);
+            QuickArchive ar = cut.archive();
+            createTexture(n.tag)->load(ar);
+        }
+    }
+    // Grids nested in grids, deeper than any real file: refused, no stack
+    // overflow. Each level: version 2, the generator, then the next grid as
+    // line_color.
+    Bytes deep;
+    for (int level = 0; level < 400; ++level) {
+        deep.version(2);
+        planar(deep);
+        deep.i32(6);
+    }
+    QuickArchive ar = deep.archive();
+    EXPECT_FALSE(createTexture(6)->load(ar));
+}
