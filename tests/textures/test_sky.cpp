@@ -301,3 +301,15 @@ TEST(SkyTexture, CloneAndCompare) {
     EXPECT_FALSE(sky->isEqual(copy));
     EXPECT_FALSE(sky->isEqual(TexturePtr()));
 }
+
+TEST(SkyTexture, DamagedRecordsFailQuietly) {
+    DocumentSunGuard guard;
+    for (const RecordBytes& whole : {skyV1("own"), skyV3("own", "doc", true)}) {
+        for (std::size_t len = 0; len < whole.size(); ++len) {
+            QuickArchive ar(whole.bytes().data(), len);
+            SkyTexture sky;
+            sky.load(ar);
+            EXPECT_TRUE(sky.sun);  // never null, whatever the record did
+        }
+    }
+}
