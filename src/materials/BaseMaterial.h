@@ -9,6 +9,33 @@
 
 namespace OrvaneLumoCore {
 
+// Type tags of the material classes: the value of getType(), the tag in front
+// of a material's record and the key of createMaterial.
+enum MaterialTag : std::uint32_t {
+    kMaterialSingleBRDF = 0,
+    kMaterialLayeredBRDF = 1,
+    kMaterialMulti = 2,
+    kMaterialBump = 3,
+    kMaterialInstance = 4,
+    kMaterial2Sided = 5,
+    kMaterialLinked = 6,
+    kMaterialSkp2Sided = 7,
+    kMaterialOverrideEnvironment = 8,
+    kMaterialDisplaced = 9,
+    kMaterialObjectExclusion = 10,
+    kMaterialAlphaContribution = 11,
+    kMaterialAngleBlend = 12,
+    kMaterialReference = 13,
+    kMaterialToon = 14,
+    kMaterialTagCount = 15
+};
+
+// The name every new material starts from.
+extern const char16_t kDefaultMaterialName[];
+
+// getUniqueName of the scene table.
+std::u16string uniqueMaterialName(const std::u16string& candidate);
+
 class BaseMaterial : public OrvaneSerializable, public OrvaneXMLSerializable {
 public:
     BaseMaterial();
@@ -34,6 +61,34 @@ public:
 
     std::u16string name;
     std::u16string uuid;
+
+protected:
+    BaseMaterial(const BaseMaterial&) = default;
+    BaseMaterial& operator=(const BaseMaterial&) = default;
+
+    // The name as old records hold it, a bare wstring in place of the base
+    // record. With `defaultWhenEmpty` an empty name becomes a unique
+    // "DefaultMaterial" name. Control characters stay: only the base record
+    // removes them.
+    void loadInlineName(QuickArchive& ar, bool defaultWhenEmpty = true);
+
+    // A plain copy of `source` for duplicate() and clone(): the uuid stays
+    // behind, and with `newName` the copy takes getUniqueName of the name.
+    // The caller then replaces the children that are not to be shared.
+    template <class T>
+    static boost::shared_ptr<T> copyOf(const T& source, bool newName) {
+        boost::shared_ptr<T> copy(new T(source));
+        copy->uuid.clear();
+        if (newName) copy->name = uniqueMaterialName(source.name);
+        return copy;
+    }
+
+    // The other material, if it is of this class; null otherwise.
+    template <class T>
+    static const T* sameClass(const T& self, const boost::shared_ptr<BaseMaterial>& other) {
+        if (!other || other->getType() != self.getType()) return nullptr;
+        return dynamic_cast<const T*>(other.get());
+    }
 };
 
 typedef boost::shared_ptr<BaseMaterial> MaterialPtr;

@@ -1,11 +1,18 @@
 #include "materials/Base_BRDF.h"
+#include "materials/Brdf.h"
 
 namespace OrvaneLumoCore {
 
-// No class of this family exists yet: every tag gives a null pointer.
 BrdfPtr createBrdf(std::uint32_t tag) {
-    (void)tag;
-    return BrdfPtr();
+    switch (tag) {
+    case kGlassBrdf: return BrdfPtr(new Glass_BRDF);
+    case kDiffuseBrdf: return BrdfPtr(new Diffuse_BRDF);
+    case kBlinnBrdf: return BrdfPtr(new Blinn_BRDF);
+    case kPhongBrdf: return BrdfPtr(new Phong_BRDF);
+    case kMirrorBrdf: return BrdfPtr(new Mirror_BRDF);
+    case kLightBrdf: return BrdfPtr(new Light_BRDF);
+    default: return BrdfPtr();
+    }
 }
 
 }  // namespace OrvaneLumoCore

@@ -1,11 +1,15 @@
 #include "materials/BaseMaterial.h"
+#include "materials/LayeredMaterials.h"
 
 namespace OrvaneLumoCore {
 
-// No class of this family exists yet: every tag gives a null pointer.
 MaterialPtr createMaterial(std::uint32_t tag) {
-    (void)tag;
-    return MaterialPtr();
+    switch (tag) {
+    case kMaterialSingleBRDF: return MaterialPtr(new MaterialSingleBRDF);
+    case kMaterialLayeredBRDF: return MaterialPtr(new MaterialLayeredBRDF);
+    case kMaterialMulti: return MaterialPtr(new MaterialMulti);
+    default: return MaterialPtr();
+    }
 }
 
 }  // namespace OrvaneLumoCore

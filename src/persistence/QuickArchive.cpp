@@ -191,8 +191,9 @@ void QuickArchive::writeRect(const Rect& r) {
 
 void QuickArchive::readRect(Rect& r) {
     readInt(r.x0); readInt(r.y0); readInt(r.x1); readInt(r.y1);
-    r.width = r.x1 - r.x0;
-    r.height = r.y1 - r.y0;
+    // Wrapping arithmetic: damaged records may hold any values.
+    r.width = static_cast<std::int32_t>(static_cast<std::uint32_t>(r.x1) - static_cast<std::uint32_t>(r.x0));
+    r.height = static_cast<std::int32_t>(static_cast<std::uint32_t>(r.y1) - static_cast<std::uint32_t>(r.y0));
     r.reserved0 = 0;
     r.reserved1 = 0;
 }

@@ -1,0 +1,798 @@
+// The six layers are described once as data: per class the rows of each
+// record version, the texture slots with their url words, and the XML
+// parameters. save, load, isEqual, clone and writeXml walk these tables.
+#include "materials/Brdf.h"
+
+#include <algorithm>
+#include <initializer_list>
+#include <vector>
+
+#include <boost/any.hpp>
+
+#include "persistence/QuickArchive.h"
+#include "persistence/Record.h"
+#include "platform/WideChar.h"
+#include "textures/Bitmaps.h"
+#include "textures/BasicTextures.h"
+#include "xml/AssetXmlWriter.h"
+
+namespace OrvaneLumoCore {
+
+namespace {
+
+// ---- record rows -----------------------------------------------------------------
+
+enum class RowKind : std::uint8_t {
+    Color,          // `color`
+    Float,          // `f32`
+    Int,            // `i32`
+    Bool,           // `bool8`
+    Texture,        // optional texture member
+    Path,           // `wstring` path of old records, made into a bitmap texture
+    FresnelIor,     // `f32` index of refraction of the old Fresnel pair
+    FresnelSwitch,  // `i32` switch of the old Fresnel pair
+    FresnelRule,    // no bytes: applies the Fresnel pair to `transparency_tex`
+    BaseRecord      // the base record of Base_BRDF
+};
+
+// One field of a record. A row is made from a pointer to the field; the
+// kinds without a field of their own are made from the kind (and, for a
+// path, the texture it fills).
+template <class L>
+struct Row {
+    RowKind kind;
+    Color L::*color = nullptr;
+    float L::*number = nullptr;
+    std::int32_t L::*integer = nullptr;
+    bool L::*flag = nullptr;
+    TexturePtr L::*texture = nullptr;
+
+    Row(Color L::*p) : kind(RowKind::Color), color(p) {}
+    Row(float L::*p) : kind(RowKind::Float), number(p) {}
+    Row(std::int32_t L::*p) : kind(RowKind::Int), integer(p) {}
+    Row(bool L::*p) : kind(RowKind::Bool), flag(p) {}
+    Row(TexturePtr L::*p) : kind(RowKind::Texture), texture(p) {}
+    Row(RowKind k, TexturePtr L::*p = nullptr) : kind(k), texture(p) {}
+};
+
+template <class L>
+using Rows = std::vector<Row<L>>;
+
+// Rows of several groups, one after the other: a version of a record reads
+// like its table ("rows 1 to 3; rows 5 to 7").
+template <class L>
+Rows<L> join(std::initializer_list<Rows<L>> groups) {
+    Rows<L> all;
+    for (const Rows<L>& g : groups) all.insert(all.end(), g.begin(), g.end());
+    return all;
+}
+
+template <class L>
+Row<L> path(TexturePtr L::*texture) { return Row<L>(RowKind::Path, texture); }
+
+// ---- XML parameters --------------------------------------------------------------
+
+enum class Form : std::uint8_t {
+    Color,
+    ColorFromReflection,  // 1 - reflection per component, 0 where negative
+    Float,
+    Integer,
+    Bool,
+    BoolFromInt,  // an integer field tested against 0
+    Plugin        // a texture, referred to by its slot url
+};
+
+template <class L>
+struct Param {
+    const char* name;
+    Form form;
+    Row<L> field;
+};
+
+// A texture slot: the field and the word of its url.
+template <class L>
+struct Slot {
+    TexturePtr L::*texture;
+    const char16_t* word;
+};
+
+template <class L>
+struct LayerSpec {
+    int currentVersion;
+    std::vector<Rows<L>> records;  // by version; entry 0 unused
+    std::vector<Slot<L>> slots;    // in the order their Assets are written
+    std::vector<Param<L>> params;  // in XML order
+    TexturePtr L::*fresnelTarget;  // what the Fresnel rule fills
+};
+
+// ---- the walks -----------------------------------------------------------------------
+
+// The old Fresnel pair; neither value is a field of the layer.
+struct FresnelPair {
+    float ior = 0;
+    std::int32_t enabled = 0;
+};
+
+TexturePtr makeFresnelTexture(float ior) {
+    boost::shared_ptr<FresnelTexture> fresnel(new FresnelTexture);
+    fresnel->fresnel_ior = ior;
+    return fresnel;
+}
+
+template <class L>
+bool saveRows(const L& layer, QuickArchive& ar, const LayerSpec<L>& spec) {
+    writeVersion(ar, spec.currentVersion);
+    for (const Row<L>& row : spec.records[spec.currentVersion]) {
+        switch (row.kind) {
+        case RowKind::Color: ar.writeColor(layer.*row.color); break;
+        case RowKind::Float: ar.writeFloat(layer.*row.number); break;
+        case RowKind::Int: ar.writeInt(layer.*row.integer); break;
+        case RowKind::Bool: ar.writeByte(layer.*row.flag); break;
+        case RowKind::Texture:
+            if (!saveOptionalMember(ar, layer.*row.texture)) return false;
+            break;
+        case RowKind::BaseRecord:
+            if (!layer.Base_BRDF::save(ar)) return false;
+            break;
+        default:  // old forms are never written
+            return false;
+        }
+    }
+    return true;
+}
+
+// Reads the rows of the version that the tag names. The caller has reset
+// the layer as its class requires.
+template <class L>
+bool loadRows(L& layer, QuickArchive& ar, const LayerSpec<L>& spec, bool emptyFresnelTarget) {
+    const int version = readVersion(ar, 1, spec.currentVersion);
+    if (version < 0) return false;
+    // The default Fresnel texture of a new layer survives in no loaded one.
+    if (emptyFresnelTarget) (layer.*spec.fresnelTarget).reset();
+    FresnelPair fresnel;
+    for (const Row<L>& row : spec.records[version]) {
+        switch (row.kind) {
+        case RowKind::Color: ar.readColor(layer.*row.color); break;
+        case RowKind::Float: ar.readFloat(layer.*row.number); break;
+        case RowKind::Int: ar.readInt(layer.*row.integer); break;
+        case RowKind::Bool: ar.readByte(layer.*row.flag); break;
+        case RowKind::Texture:
+            if (!loadOptionalMember(ar, layer.*row.texture, &createTexture)) return false;
+            break;
+        case RowKind::Path: {
+            std::u16string file;
+            ar.readWString(file);
+            layer.*row.texture = makeBitmapTextureFromPath(file);
+            break;
+        }
+        case RowKind::FresnelIor: ar.readFloat(fresnel.ior); break;
+        case RowKind::FresnelSwitch: ar.readInt(fresnel.enabled); break;
+        case RowKind::FresnelRule:
+            if (fresnel.enabled != 0) layer.*spec.fresnelTarget = makeFresnelTexture(fresnel.ior);
+            break;
+        case RowKind::BaseRecord:
+            if (!layer.Base_BRDF::load(ar)) return false;
+            break;
+        }
+    }
+    return true;
+}
+
+// Every field of the current record but the base record: textures through
+// their own isEqual, colours per component, numbers exactly.
+template <class L>
+bool fieldsEqual(const L& a, const BrdfPtr& other, const LayerSpec<L>& spec) {
+    if (!other || other->getType() != a.getType()) return false;
+    const L* b = dynamic_cast<const L*>(other.get());
+    if (!b) return false;
+    for (const Row<L>& row : spec.records[spec.currentVersion]) {
+        bool same = true;
+        switch (row.kind) {
+        case RowKind::Color: same = a.*row.color == b->*row.color; break;
+        case RowKind::Float: same = a.*row.number == b->*row.number; break;
+        case RowKind::Int: same = a.*row.integer == b->*row.integer; break;
+        case RowKind::Bool: same = a.*row.flag == b->*row.flag; break;
+        case RowKind::Texture: same = childrenEqual(a.*row.texture, b->*row.texture); break;
+        default: break;
+        }
+        if (!same) return false;
+    }
+    return true;
+}
+
+template <class L>
+void cloneSlots(L& copy, const LayerSpec<L>& spec) {
+    for (const Slot<L>& slot : spec.slots) copy.*slot.texture = cloneChild(copy.*slot.texture);
+}
+
+template <class L>
+const char16_t* slotWord(TexturePtr L::*texture, const LayerSpec<L>& spec) {
+    for (const Slot<L>& slot : spec.slots) {
+        if (slot.texture == texture) return slot.word;
+    }
+    return u"";
+}
+
+Color colorFromReflection(const Color& reflection) {
+    return Color(std::max(0.0f, 1.0f - reflection.r), std::max(0.0f, 1.0f - reflection.g),
+                 std::max(0.0f, 1.0f - reflection.b));
+}
+
+template <class L>
+void writeLayer(const L& layer, AssetXmlWriter& writer, std::u16string url,
+                const LayerSpec<L>& spec) {
+    url += u'/';
+    url += layer.name;
+    const std::u16string slotPrefix = url + u'/';
+    for (const Slot<L>& slot : spec.slots) {
+        const TexturePtr& texture = layer.*slot.texture;
+        if (texture) texture->writeXml(writer, slotPrefix + slot.word);
+    }
+    writer.openAsset(url, layer.getAssetType(), "");
+    writer.openPlugin(layer.getPluginName(), layer.getAssetType());
+    writer.openParameters();
+    for (const Param<L>& p : spec.params) {
+        const Row<L>& f = p.field;
+        switch (p.form) {
+        case Form::Color: writer.writeColor(p.name, layer.*f.color); break;
+        case Form::ColorFromReflection:
+            writer.writeColor(p.name, colorFromReflection(layer.*f.color));
+            break;
+        case Form::Float: writer.writeFloat(p.name, layer.*f.number); break;
+        case Form::Integer: writer.writeInteger(p.name, layer.*f.integer); break;
+        case Form::Bool: writer.writeBool(p.name, layer.*f.flag); break;
+        case Form::BoolFromInt: writer.writeBool(p.name, layer.*f.integer != 0); break;
+        case Form::Plugin:
+            writer.writePluginRef(p.name, boost::any(layer.*f.texture),
+                                  slotPrefix + slotWord(f.texture, spec));
+            break;
+        }
+    }
+    writer.closeParameters();
+    writer.closePlugin();
+    writer.closeAsset();
+}
+
+const RowKind kBase = RowKind::BaseRecord;
+const RowKind kFresnelIor = RowKind::FresnelIor;
+const RowKind kFresnelSwitch = RowKind::FresnelSwitch;
+const RowKind kFresnelRule = RowKind::FresnelRule;
+
+// ---- Glass_BRDF ------------------------------------------------------------------------
+
+const LayerSpec<Glass_BRDF>& glassSpec() {
+    typedef Glass_BRDF G;
+    static const LayerSpec<G> spec = [] {
+        // The rows of the current record, numbered as old versions name them.
+        const Rows<G> r1 = {&G::color, &G::fog_color};
+        const Rows<G> r2 = {&G::ior, &G::ior_second, &G::cutoff, &G::fog_color_mult, &G::glossiness};
+        const Rows<G> r3 = {&G::depth_value, &G::subdivs, &G::affect_shadows, &G::affect_alpha};
+        const Rows<G> r4 = {&G::color_tex_mult, &G::glossiness_tex_mult, &G::ior_tex_mult};
+        const Rows<G> r5 = {&G::translucency_on};
+        const Rows<G> r6 = {&G::thickness, &G::scatter_coeff, &G::scatter_direction,
+                            &G::translucency_tex_mult};
+        const Rows<G> r7 = {&G::translucency};
+        const Rows<G> r8 = {&G::color_tex, &G::glossiness_tex, &G::ior_tex, &G::translucency_tex};
+        const Rows<G> r9 = {&G::transparency};
+        const Rows<G> r10 = {&G::transparency_tex_mult};
+        const Rows<G> r11 = {&G::transparency_tex};
+        const Rows<G> r12 = {kBase};
+        // The three multipliers that old records hold in this order.
+        const Rows<G> oldMults = {&G::transparency_tex_mult, &G::glossiness_tex_mult,
+                                  &G::ior_tex_mult};
+        const Rows<G> v2Paths = {path(&G::transparency_tex), path(&G::glossiness_tex),
+                                 path(&G::ior_tex)};
+
+        LayerSpec<G> s;
+        s.currentVersion = 6;
+        s.records = {
+            {},
+            join<G>({r1, r2, r3}),
+            join<G>({r1, r2, r3, oldMults, v2Paths}),
+            join<G>({r1, r2, r3, oldMults, v2Paths, r5, r6, r7, {path(&G::translucency_tex)}}),
+            join<G>({r1, r2, r3, oldMults, r5, r6, r7,
+                     {&G::transparency_tex, &G::glossiness_tex, &G::ior_tex, &G::translucency_tex}}),
+            join<G>({r1, r2, r3, r4, r5, r6, r7, r8, r9, r10, r11}),
+            join<G>({r1, r2, r3, r4, r5, r6, r7, r8, r9, r10, r11, r12}),
+        };
+        s.slots = {
+            {&G::transparency_tex, u"transparency_texture"},
+            {&G::color_tex, u"color_texture"},
+            {&G::glossiness_tex, u"glossy_texture"},
+            {&G::ior_tex, u"ior_texture"},
+            {&G::translucency_tex, u"translucency_texture"},
+        };
+        s.params = {
+            {"color", Form::Color, &G::color},
+            {"transparency", Form::Color, &G::transparency},
+            {"fog_color", Form::Color, &G::fog_color},
+            {"translucency", Form::Color, &G::translucency},
+            {"affect_shadows", Form::BoolFromInt, &G::affect_shadows},
+            {"affect_alpha", Form::BoolFromInt, &G::affect_alpha},
+            {"translucency_on", Form::BoolFromInt, &G::translucency_on},
+            {"ior", Form::Float, &G::ior},
+            {"fog_color_mult", Form::Float, &G::fog_color_mult},
+            {"glossiness", Form::Float, &G::glossiness},
+            {"glossiness_tex_mult", Form::Float, &G::glossiness_tex_mult},
+            {"ior_tex_mult", Form::Float, &G::ior_tex_mult},
+            {"translucency_tex_mult", Form::Float, &G::translucency_tex_mult},
+            {"scatter_coeff", Form::Float, &G::scatter_coeff},
+            {"scatter_direction", Form::Float, &G::scatter_direction},
+            {"thickness", Form::Float, &G::thickness},
+            {"transparency_tex_mult", Form::Float, &G::transparency_tex_mult},
+            {"cutoff", Form::Float, &G::cutoff},
+            {"color_tex_mult", Form::Float, &G::color_tex_mult},
+            {"subdivs", Form::Integer, &G::subdivs},
+            {"transparency_tex", Form::Plugin, &G::transparency_tex},
+            {"color_tex", Form::Plugin, &G::color_tex},
+            {"glossiness_tex", Form::Plugin, &G::glossiness_tex},
+            {"ior_texture", Form::Plugin, &G::ior_tex},
+            {"translucency_tex", Form::Plugin, &G::translucency_tex},
+        };
+        s.fresnelTarget = &G::transparency_tex;
+        return s;
+    }();
+    return spec;
+}
+
+// ---- Phong_BRDF, Blinn_BRDF ------------------------------------------------------------
+
+const LayerSpec<BaseGlossy_BRDF>& glossySpec() {
+    typedef BaseGlossy_BRDF P;
+    static const LayerSpec<P> spec = [] {
+        // The head that all old records share, with the Fresnel pair inside.
+        const Rows<P> head = {&P::color, &P::reflection, &P::hilightGlossiness,
+                              &P::reflectionGlossiness, kFresnelIor, &P::cutoff, &P::subdivs,
+                              kFresnelSwitch, &P::back_side, &P::depth_value};
+        const Rows<P> oldMults = {&P::color_tex_mult, &P::hilightGlossiness_tex_mult,
+                                  &P::reflectionGlossiness_tex_mult};
+        const Rows<P> paths = {path(&P::color_tex), path(&P::hilightGlossiness_tex),
+                               path(&P::reflectionGlossiness_tex)};
+        const Rows<P> members = {&P::color_tex, &P::hilightGlossiness_tex,
+                                 &P::reflectionGlossiness_tex};
+        const Rows<P> anisotropy = {&P::anisotropy, &P::anisotropy_rotation};
+
+        LayerSpec<P> s;
+        s.currentVersion = 6;
+        s.records = {
+            {},
+            join<P>({head, {kFresnelRule}}),
+            join<P>({head, oldMults, paths, {kFresnelRule}}),
+            join<P>({head, oldMults, paths, anisotropy, {kFresnelRule}}),
+            join<P>({head, oldMults, members, anisotropy, {kFresnelRule}}),
+            join<P>({head, oldMults, members, anisotropy, {kBase}, {kFresnelRule}}),
+            {&P::color, &P::reflection,
+             &P::hilightGlossiness, &P::reflectionGlossiness, &P::cutoff,
+             &P::subdivs, &P::back_side, &P::depth_value,
+             &P::color_tex_mult, &P::hilightGlossiness_tex_mult,
+             &P::reflectionGlossiness_tex_mult, &P::transparency_tex_mult,
+             &P::color_tex, &P::hilightGlossiness_tex, &P::reflectionGlossiness_tex,
+             &P::transparency_tex,
+             &P::anisotropy, &P::anisotropy_rotation,
+             kBase},
+        };
+        s.slots = {
+            {&P::color_tex, u"color_texture"},
+            {&P::hilightGlossiness_tex, u"hilight_glossiness_texture"},
+            {&P::reflectionGlossiness_tex, u"reflection_glossiness_texture"},
+            {&P::transparency_tex, u"transparency_texture"},
+        };
+        s.params = {
+            {"color", Form::Color, &P::color},
+            {"transparency", Form::ColorFromReflection, &P::reflection},
+            {"hilightGlossiness", Form::Float, &P::hilightGlossiness},
+            {"reflectionGlossiness", Form::Float, &P::reflectionGlossiness},
+            {"cutoff", Form::Float, &P::cutoff},
+            {"subdivs", Form::Integer, &P::subdivs},
+            {"back_side", Form::Integer, &P::back_side},
+            {"color_tex_mult", Form::Float, &P::color_tex_mult},
+            {"hilightGlossiness_tex_mult", Form::Float, &P::hilightGlossiness_tex_mult},
+            {"reflectionGlossiness_tex_mult", Form::Float, &P::reflectionGlossiness_tex_mult},
+            {"transparency_tex_mult", Form::Float, &P::transparency_tex_mult},
+            {"anisotropy", Form::Float, &P::anisotropy},
+            {"anisotropy_rotation", Form::Float, &P::anisotropy_rotation},
+            {"color_tex", Form::Plugin, &P::color_tex},
+            {"hilightGlossiness_tex", Form::Plugin, &P::hilightGlossiness_tex},
+            {"reflectionGlossiness_tex", Form::Plugin, &P::reflectionGlossiness_tex},
+            {"transparency_tex", Form::Plugin, &P::transparency_tex},
+        };
+        s.fresnelTarget = &P::transparency_tex;
+        return s;
+    }();
+    return spec;
+}
+
+// ---- Mirror_BRDF -----------------------------------------------------------------------
+
+const LayerSpec<Mirror_BRDF>& mirrorSpec() {
+    typedef Mirror_BRDF M;
+    static const LayerSpec<M> spec = [] {
+        // Version 1 up to `mirror_value`, with the Fresnel pair inside.
+        const Rows<M> head = {&M::color, &M::reflection, &M::transparency_tex_mult, kFresnelIor,
+                              &M::cutoff, kFresnelSwitch, &M::mirror_value};
+        const Rows<M> members = {&M::color_tex_mult, &M::transparency_tex, &M::color_tex};
+
+        LayerSpec<M> s;
+        s.currentVersion = 5;
+        s.records = {
+            {},
+            join<M>({head, {path(&M::transparency_tex)}, {kFresnelRule}}),
+            join<M>({head, {path(&M::transparency_tex), &M::color_tex_mult, path(&M::color_tex)},
+                     {kFresnelRule}}),
+            join<M>({head, members, {kFresnelRule}}),
+            join<M>({head, members, {kFresnelRule}, {kBase}}),
+            {&M::color, &M::reflection, &M::transparency_tex_mult, &M::cutoff, &M::mirror_value,
+             &M::color_tex_mult, &M::transparency_tex, &M::color_tex, kBase},
+        };
+        s.slots = {
+            {&M::transparency_tex, u"transparency_texture"},
+            {&M::color_tex, u"color_texture"},
+        };
+        s.params = {
+            {"color", Form::Color, &M::color},
+            {"transparency", Form::ColorFromReflection, &M::reflection},
+            {"color_tex_mult", Form::Float, &M::color_tex_mult},
+            {"transparency_tex_mult", Form::Float, &M::transparency_tex_mult},
+            {"cutoff", Form::Float, &M::cutoff},
+            {"transparency_tex", Form::Plugin, &M::transparency_tex},
+            {"color_tex", Form::Plugin, &M::color_tex},
+        };
+        s.fresnelTarget = &M::transparency_tex;
+        return s;
+    }();
+    return spec;
+}
+
+// ---- Diffuse_BRDF ----------------------------------------------------------------------
+
+const LayerSpec<Diffuse_BRDF>& diffuseSpec() {
+    typedef Diffuse_BRDF D;
+    static const LayerSpec<D> spec = [] {
+        const Rows<D> head = {&D::color, &D::transparency, &D::color_tex_mult,
+                              &D::transparency_tex_mult};
+        const Rows<D> members = {&D::color_tex, &D::transparency_tex};
+
+        LayerSpec<D> s;
+        s.currentVersion = 4;
+        s.records = {
+            {},
+            join<D>({head, {path(&D::color_tex), path(&D::transparency_tex)}}),
+            join<D>({head, members}),
+            join<D>({head, members, {kBase}}),
+            join<D>({head, members, {kBase}, {&D::use_color_tex_alpha_as_transparency}}),
+        };
+        s.slots = {
+            {&D::color_tex, u"color_texture"},
+            {&D::transparency_tex, u"transparency_texture"},
+        };
+        s.params = {
+            {"color", Form::Color, &D::color},
+            {"transparency", Form::Color, &D::transparency},
+            {"color_tex_mult", Form::Float, &D::color_tex_mult},
+            {"transparency_tex_mult", Form::Float, &D::transparency_tex_mult},
+            {"color_tex", Form::Plugin, &D::color_tex},
+            {"transparency_tex", Form::Plugin, &D::transparency_tex},
+            {"use_color_tex_alpha_as_transparency", Form::Bool,
+             &D::use_color_tex_alpha_as_transparency},
+        };
+        s.fresnelTarget = &D::transparency_tex;
+        return s;
+    }();
+    return spec;
+}
+
+// ---- Light_BRDF ------------------------------------------------------------------------
+
+const LayerSpec<Light_BRDF>& lightSpec() {
+    typedef Light_BRDF E;
+    static const LayerSpec<E> spec = [] {
+        const Rows<E> head = {&E::color, &E::transparency, &E::intensity, &E::light_value,
+                              &E::color_tex_mult, &E::transparency_tex_mult};
+        const Rows<E> members = {&E::color_tex, &E::transparency_tex};
+
+        LayerSpec<E> s;
+        s.currentVersion = 5;
+        s.records = {
+            {},
+            {&E::color, &E::intensity, &E::transparency_tex_mult, path(&E::transparency_tex)},
+            join<E>({head, {path(&E::color_tex), path(&E::transparency_tex)}}),
+            join<E>({head, members}),
+            join<E>({head, members, {kBase}}),
+            join<E>({head, members, {kBase}, {&E::doubleSided}}),
+        };
+        s.slots = {
+            {&E::color_tex, u"color_texture"},
+            {&E::transparency_tex, u"transp_texture"},
+        };
+        s.params = {
+            {"color", Form::Color, &E::color},
+            {"transparency", Form::Color, &E::transparency},
+            {"intensity", Form::Float, &E::intensity},
+            {"transparency_tex_mult", Form::Float, &E::transparency_tex_mult},
+            {"color_tex_mult", Form::Float, &E::color_tex_mult},
+            {"doubleSided", Form::BoolFromInt, &E::doubleSided},
+            {"color_tex", Form::Plugin, &E::color_tex},
+            {"transparency_tex", Form::Plugin, &E::transparency_tex},
+        };
+        s.fresnelTarget = &E::transparency_tex;
+        return s;
+    }();
+    return spec;
+}
+
+void removeControlCharacters(std::u16string& text) {
+    text.erase(std::remove_if(text.begin(), text.end(), &platform::isControl), text.end());
+}
+
+const int kBaseRecordVersion = 4;
+
+}  // namespace
+
+// ---- Base_BRDF -------------------------------------------------------------------------
+
+void Base_BRDF::reset() {
+    name = getPluginName();
+    layer_flag_a = true;
+    layer_flag_b = false;
+    layer_flag_c = false;
+}
+
+bool Base_BRDF::save(QuickArchive& ar) const {
+    writeVersion(ar, kBaseRecordVersion);
+    ar.writeWString(name);
+    ar.writeByte(layer_flag_a);
+    ar.writeByte(layer_flag_b);
+    ar.writeByte(layer_flag_c);
+    return true;
+}
+
+bool Base_BRDF::load(QuickArchive& ar) {
+    const int version = readVersion(ar, 1, kBaseRecordVersion);
+    if (version < 0) return false;
+    ar.readWString(name);
+    removeControlCharacters(name);
+    if (version >= 2) ar.readByte(layer_flag_a);
+    if (version >= 3) ar.readByte(layer_flag_b);
+    if (version >= 4) ar.readByte(layer_flag_c);
+    return true;
+}
+
+void Base_BRDF::writeXml(AssetXmlWriter& writer, std::u16string url) {}
+
+std::u16string Base_BRDF::getPluginName() const { return std::u16string(); }
+
+std::u16string getBrdfGroupName(std::int32_t group) {
+    switch (group) {
+    case 0: return u"Emissive";
+    case 1: return u"Reflection";
+    case 2: return u"Diffuse";
+    case 3: return u"Refraction";
+    default: return std::u16string();
+    }
+}
+
+// ---- Glass_BRDF ------------------------------------------------------------------------
+
+Glass_BRDF::Glass_BRDF() { reset(); }
+
+void Glass_BRDF::reset() {
+    Base_BRDF::reset();
+    color = Color(1, 1, 1);
+    transparency = Color(0, 0, 0);
+    fog_color = Color(1, 1, 1);
+    translucency = Color(1, 1, 1);
+    ior = 1.55f;
+    ior_second = 1.55f;
+    cutoff = 0.001f;
+    fog_color_mult = 1;
+    glossiness = 1;
+    color_tex_mult = 1;
+    transparency_tex_mult = 1;
+    glossiness_tex_mult = 1;
+    ior_tex_mult = 1;
+    translucency_tex_mult = 1;
+    thickness = 1000;
+    scatter_coeff = 0;
+    scatter_direction = 1;
+    subdivs = 8;
+    depth_value = 5;
+    affect_shadows = 0;
+    affect_alpha = 0;
+    translucency_on = 0;
+    color_tex.reset();
+    transparency_tex.reset();
+    glossiness_tex.reset();
+    ior_tex.reset();
+    translucency_tex.reset();
+}
+
+bool Glass_BRDF::save(QuickArchive& ar) const { return saveRows(*this, ar, glassSpec()); }
+
+bool Glass_BRDF::load(QuickArchive& ar) {
+    Base_BRDF::reset();
+    return loadRows(*this, ar, glassSpec(), false);
+}
+
+BrdfPtr Glass_BRDF::clone() const {
+    boost::shared_ptr<Glass_BRDF> copy(new Glass_BRDF(*this));
+    cloneSlots(*copy, glassSpec());
+    return copy;
+}
+
+bool Glass_BRDF::isEqual(const BrdfPtr& other) const {
+    return fieldsEqual(*this, other, glassSpec());
+}
+
+void Glass_BRDF::writeXml(AssetXmlWriter& writer, std::u16string url) {
+    writeLayer(*this, writer, url, glassSpec());
+}
+
+// ---- Phong_BRDF, Blinn_BRDF ------------------------------------------------------------
+
+void BaseGlossy_BRDF::reset() {
+    Base_BRDF::reset();
+    color = Color(1, 1, 1);
+    reflection = Color(1, 1, 1);
+    hilightGlossiness = 1;
+    reflectionGlossiness = 1;
+    cutoff = 0.01f;
+    hilightGlossiness_tex_mult = 1;
+    reflectionGlossiness_tex_mult = 1;
+    color_tex_mult = 1;
+    transparency_tex_mult = 1;
+    anisotropy = 0;
+    anisotropy_rotation = 0;
+    subdivs = 8;
+    depth_value = 5;
+    back_side = 0;
+    hilightGlossiness_tex.reset();
+    reflectionGlossiness_tex.reset();
+    color_tex.reset();
+    transparency_tex = createTexture(1);
+}
+
+bool BaseGlossy_BRDF::save(QuickArchive& ar) const { return saveRows(*this, ar, glossySpec()); }
+
+bool BaseGlossy_BRDF::load(QuickArchive& ar) {
+    reset();
+    return loadRows(*this, ar, glossySpec(), true);
+}
+
+void BaseGlossy_BRDF::cloneTextures() { cloneSlots(*this, glossySpec()); }
+
+bool BaseGlossy_BRDF::isEqual(const BrdfPtr& other) const {
+    return fieldsEqual(*this, other, glossySpec());
+}
+
+void BaseGlossy_BRDF::writeXml(AssetXmlWriter& writer, std::u16string url) {
+    writeLayer(*this, writer, url, glossySpec());
+}
+
+Phong_BRDF::Phong_BRDF() { reset(); }
+
+BrdfPtr Phong_BRDF::clone() const {
+    boost::shared_ptr<Phong_BRDF> copy(new Phong_BRDF(*this));
+    copy->cloneTextures();
+    return copy;
+}
+
+Blinn_BRDF::Blinn_BRDF() { reset(); }
+
+BrdfPtr Blinn_BRDF::clone() const {
+    boost::shared_ptr<Blinn_BRDF> copy(new Blinn_BRDF(*this));
+    copy->cloneTextures();
+    return copy;
+}
+
+// ---- Mirror_BRDF -----------------------------------------------------------------------
+
+Mirror_BRDF::Mirror_BRDF() { reset(); }
+
+void Mirror_BRDF::reset() {
+    Base_BRDF::reset();
+    color = Color(1, 1, 1);
+    reflection = Color(1, 1, 1);
+    transparency_tex_mult = 1;
+    color_tex_mult = 1;
+    cutoff = 0.01f;
+    mirror_value = 1;
+    transparency_tex = createTexture(1);
+    color_tex.reset();
+}
+
+bool Mirror_BRDF::save(QuickArchive& ar) const { return saveRows(*this, ar, mirrorSpec()); }
+
+bool Mirror_BRDF::load(QuickArchive& ar) {
+    reset();
+    return loadRows(*this, ar, mirrorSpec(), true);
+}
+
+BrdfPtr Mirror_BRDF::clone() const {
+    boost::shared_ptr<Mirror_BRDF> copy(new Mirror_BRDF(*this));
+    cloneSlots(*copy, mirrorSpec());
+    return copy;
+}
+
+bool Mirror_BRDF::isEqual(const BrdfPtr& other) const {
+    return fieldsEqual(*this, other, mirrorSpec());
+}
+
+void Mirror_BRDF::writeXml(AssetXmlWriter& writer, std::u16string url) {
+    writeLayer(*this, writer, url, mirrorSpec());
+}
+
+// ---- Diffuse_BRDF ----------------------------------------------------------------------
+
+Diffuse_BRDF::Diffuse_BRDF() { reset(); }
+
+void Diffuse_BRDF::reset() {
+    Base_BRDF::reset();
+    color = Color(0.5f, 0.5f, 0.5f);
+    transparency = Color(0, 0, 0);
+    color_tex_mult = 1;
+    transparency_tex_mult = 1;
+    color_tex.reset();
+    transparency_tex.reset();
+    use_color_tex_alpha_as_transparency = false;
+}
+
+bool Diffuse_BRDF::save(QuickArchive& ar) const { return saveRows(*this, ar, diffuseSpec()); }
+
+bool Diffuse_BRDF::load(QuickArchive& ar) {
+    reset();
+    return loadRows(*this, ar, diffuseSpec(), false);
+}
+
+BrdfPtr Diffuse_BRDF::clone() const {
+    boost::shared_ptr<Diffuse_BRDF> copy(new Diffuse_BRDF(*this));
+    cloneSlots(*copy, diffuseSpec());
+    return copy;
+}
+
+bool Diffuse_BRDF::isEqual(const BrdfPtr& other) const {
+    return fieldsEqual(*this, other, diffuseSpec());
+}
+
+void Diffuse_BRDF::writeXml(AssetXmlWriter& writer, std::u16string url) {
+    writeLayer(*this, writer, url, diffuseSpec());
+}
+
+// ---- Light_BRDF ------------------------------------------------------------------------
+
+Light_BRDF::Light_BRDF() { reset(); }
+
+void Light_BRDF::reset() {
+    Base_BRDF::reset();
+    color = Color(1, 1, 1);
+    transparency = Color(0, 0, 0);
+    intensity = 1;
+    light_value = 1;
+    transparency_tex_mult = 1;
+    color_tex_mult = 1;
+    transparency_tex.reset();
+    color_tex.reset();
+    doubleSided = 1;
+}
+
+bool Light_BRDF::save(QuickArchive& ar) const { return saveRows(*this, ar, lightSpec()); }
+
+bool Light_BRDF::load(QuickArchive& ar) {
+    reset();
+    return loadRows(*this, ar, lightSpec(), false);
+}
+
+BrdfPtr Light_BRDF::clone() const {
+    boost::shared_ptr<Light_BRDF> copy(new Light_BRDF(*this));
+    cloneSlots(*copy, lightSpec());
+    return copy;
+}
+
+bool Light_BRDF::isEqual(const BrdfPtr& other) const {
+    return fieldsEqual(*this, other, lightSpec());
+}
+
+void Light_BRDF::writeXml(AssetXmlWriter& writer, std::u16string url) {
+    writeLayer(*this, writer, url, lightSpec());
+}
+
+}  // namespace OrvaneLumoCore

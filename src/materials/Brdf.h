@@ -1,0 +1,182 @@
+#pragma once
+// The six BRDF layers. Each holds colours, numbers and up to five textures,
+// saves itself as a record of its class (old versions are still read) and
+// writes itself as an Asset of type "BRDF" under its material's url.
+#include <cstdint>
+#include <string>
+
+#include "materials/Base_BRDF.h"
+#include "persistence/Types.h"
+#include "textures/BaseTexture.h"
+
+namespace OrvaneLumoCore {
+
+// Refraction layer, plugin "BRDFRefraction".
+class Glass_BRDF : public Base_BRDF {
+public:
+    Glass_BRDF();
+
+    bool save(QuickArchive& ar) const override;
+    // Resets only the base part before reading.
+    bool load(QuickArchive& ar) override;
+    std::uint32_t getType() const override { return kGlassBrdf; }
+    void reset() override;
+    BrdfPtr clone() const override;
+    bool isEqual(const BrdfPtr& other) const override;
+    void writeXml(AssetXmlWriter& writer, std::u16string url) override;
+    std::u16string getPluginName() const override { return u"BRDFRefraction"; }
+
+    Color color;
+    Color transparency;
+    Color fog_color;
+    Color translucency;
+    float ior;
+    float ior_second;  // stored, copied and compared; no XML shows it
+    float cutoff;
+    float fog_color_mult;
+    float glossiness;
+    float color_tex_mult;
+    float transparency_tex_mult;
+    float glossiness_tex_mult;
+    float ior_tex_mult;
+    float translucency_tex_mult;
+    float thickness;
+    float scatter_coeff;
+    float scatter_direction;
+    std::int32_t subdivs;
+    std::int32_t depth_value;  // stored, copied and compared; no XML shows it
+    std::int32_t affect_shadows;
+    std::int32_t affect_alpha;
+    std::int32_t translucency_on;
+    TexturePtr color_tex;
+    TexturePtr transparency_tex;
+    TexturePtr glossiness_tex;
+    TexturePtr ior_tex;
+    TexturePtr translucency_tex;
+};
+
+// The fields, record and XML that Phong_BRDF and Blinn_BRDF share; the two
+// differ in tag and class only. Plugin "BRDFReflection". The XML colour
+// "transparency" is derived from `reflection`.
+class BaseGlossy_BRDF : public Base_BRDF {
+public:
+    bool save(QuickArchive& ar) const override;
+    bool load(QuickArchive& ar) override;
+    void reset() override;
+    bool isEqual(const BrdfPtr& other) const override;
+    void writeXml(AssetXmlWriter& writer, std::u16string url) override;
+    std::u16string getPluginName() const override { return u"BRDFReflection"; }
+
+    Color color;
+    Color reflection;
+    float hilightGlossiness;
+    float reflectionGlossiness;
+    float cutoff;
+    float hilightGlossiness_tex_mult;
+    float reflectionGlossiness_tex_mult;
+    float color_tex_mult;
+    float transparency_tex_mult;
+    float anisotropy;
+    float anisotropy_rotation;
+    std::int32_t subdivs;
+    std::int32_t depth_value;  // stored, copied and compared; no XML shows it
+    std::int32_t back_side;
+    TexturePtr hilightGlossiness_tex;
+    TexturePtr reflectionGlossiness_tex;
+    TexturePtr color_tex;
+    // A default Fresnel texture in a new layer; a loaded layer holds only
+    // what its record gives.
+    TexturePtr transparency_tex;
+
+protected:
+    BaseGlossy_BRDF() = default;
+    void cloneTextures();
+};
+
+class Phong_BRDF : public BaseGlossy_BRDF {
+public:
+    Phong_BRDF();
+    std::uint32_t getType() const override { return kPhongBrdf; }
+    BrdfPtr clone() const override;
+};
+
+class Blinn_BRDF : public BaseGlossy_BRDF {
+public:
+    Blinn_BRDF();
+    std::uint32_t getType() const override { return kBlinnBrdf; }
+    BrdfPtr clone() const override;
+};
+
+// Mirror layer, plugin "BRDFReflection".
+class Mirror_BRDF : public Base_BRDF {
+public:
+    Mirror_BRDF();
+
+    bool save(QuickArchive& ar) const override;
+    bool load(QuickArchive& ar) override;
+    std::uint32_t getType() const override { return kMirrorBrdf; }
+    void reset() override;
+    BrdfPtr clone() const override;
+    bool isEqual(const BrdfPtr& other) const override;
+    void writeXml(AssetXmlWriter& writer, std::u16string url) override;
+    std::u16string getPluginName() const override { return u"BRDFReflection"; }
+
+    Color color;
+    Color reflection;
+    float transparency_tex_mult;
+    float color_tex_mult;
+    float cutoff;
+    std::int32_t mirror_value;  // stored, copied and compared; no XML shows it
+    TexturePtr transparency_tex;
+    TexturePtr color_tex;
+};
+
+// Diffuse layer, plugin "BRDFDiffuse".
+class Diffuse_BRDF : public Base_BRDF {
+public:
+    Diffuse_BRDF();
+
+    bool save(QuickArchive& ar) const override;
+    bool load(QuickArchive& ar) override;
+    std::uint32_t getType() const override { return kDiffuseBrdf; }
+    void reset() override;
+    BrdfPtr clone() const override;
+    bool isEqual(const BrdfPtr& other) const override;
+    void writeXml(AssetXmlWriter& writer, std::u16string url) override;
+    std::u16string getPluginName() const override { return u"BRDFDiffuse"; }
+
+    Color color;
+    Color transparency;
+    float color_tex_mult;
+    float transparency_tex_mult;
+    TexturePtr color_tex;
+    TexturePtr transparency_tex;
+    bool use_color_tex_alpha_as_transparency;
+};
+
+// Emissive layer, plugin "BRDFLight".
+class Light_BRDF : public Base_BRDF {
+public:
+    Light_BRDF();
+
+    bool save(QuickArchive& ar) const override;
+    bool load(QuickArchive& ar) override;
+    std::uint32_t getType() const override { return kLightBrdf; }
+    void reset() override;
+    BrdfPtr clone() const override;
+    bool isEqual(const BrdfPtr& other) const override;
+    void writeXml(AssetXmlWriter& writer, std::u16string url) override;
+    std::u16string getPluginName() const override { return u"BRDFLight"; }
+
+    Color color;
+    Color transparency;
+    float intensity;
+    float light_value;  // stored, copied and compared; no XML shows it
+    float transparency_tex_mult;
+    float color_tex_mult;
+    TexturePtr transparency_tex;
+    TexturePtr color_tex;
+    std::int32_t doubleSided;  // written as a boolean
+};
+
+}  // namespace OrvaneLumoCore

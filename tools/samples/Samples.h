@@ -1,0 +1,16 @@
+#pragma once
+// Sample files written by orvxml-samples. Each family adds its samples to the
+// list; main writes them all into the directory given on the command line.
+#include <string>
+#include <vector>
+
+namespace samples {
+
+struct Sample {
+    const char* fileName;                      // name inside the output directory
+    bool (*write)(const std::string& path);    // writes the file; false on failure
+};
+
+void addMaterialSamples(std::vector<Sample>& list);
+
+}  // namespace samples
