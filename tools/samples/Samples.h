@@ -12,5 +12,6 @@ struct Sample {
 };
 
 void addMaterialSamples(std::vector<Sample>& list);
+void addTextureSamples(std::vector<Sample>& list);
 
 }  // namespace samples

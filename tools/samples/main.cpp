@@ -20,6 +20,7 @@ int main(int argc, char** argv) {
 
     std::vector<samples::Sample> list;
     samples::addMaterialSamples(list);
+    samples::addTextureSamples(list);
 
     int failures = 0;
     for (const samples::Sample& s : list) {
