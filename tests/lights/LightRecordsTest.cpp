@@ -233,22 +233,6 @@ TEST(OmniLightRecords, Version3LacksOnlyTheAffectFlags) {
     EXPECT_TRUE(o->affectSpecular);
 }
 
-TEST(OmniLightRecords, Version1) {
-    // Version 1: color, shadowBias, decay, intensity, storedFactor,
-    // photonSubdivs, causticSubdivs, storedMode, enabled.
-    RecordBytes b;
-    b.u32(0x10000);
-    color(b, 0.1f, 0.2f, 0.3f);
-    b.f32(0.01f).f32(2).f32(10).f32(3).i32(5).i32(6).i32(2).u8(0);
-    boost::shared_ptr<OmniLight> o = loaded<OmniLight>(b);
-    EXPECT_EQ(o->decay, 2.0f);
-    EXPECT_EQ(o->storedFactor, 3.0f);
-    EXPECT_EQ(o->storedMode, 2);
-    EXPECT_FALSE(o->enabled);
-    EXPECT_EQ(o->cutoffThreshold, 0.005f);
-    EXPECT_EQ(o->transform, Transform());
-}
-
 namespace {
 // MayaDirectLight version 1: color, shadowBias, intensity, storedFactor,
 // causticSubdivs, photonSubdivs, storedMode, enabled.

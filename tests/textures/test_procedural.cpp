@@ -124,22 +124,6 @@ const Newest kNewest[] = {
 
 }  // namespace
 
-TEST(ProceduralTextures, FactoryAndNames) {
-    struct Case {
-        std::int32_t tag;
-        const char16_t* plugin;
-    };
-    const Case cases[] = {{3, u"TexNoise"}, {4, u"TexChecker"}, {6, u"TexGrid"},
-                          {7, u"TexCloth"}, {8, u"TexBulge"},   {11, u"TexRamp"}};
-    for (const Case& c : cases) {
-        TexturePtr t = createTexture(c.tag);
-        ASSERT_TRUE(t) << c.tag;
-        EXPECT_EQ(t->getType(), static_cast<std::uint32_t>(c.tag));
-        EXPECT_EQ(t->getPluginName(), c.plugin);
-        EXPECT_EQ(t->getAssetType(), u"texture");
-    }
-}
-
 TEST(ProceduralTextures, NewestRecordsGoBackByteForByte) {
     for (const Newest& n : kNewest) {
         SCOPED_TRACE(n.tag);
