@@ -69,9 +69,10 @@ bool loadKeys(QuickArchive& ar, KeyTrack<V>& track, bool* interpolate) {
     ar.readLength(width);
     if (width != kTimeWidth) return false;
     if (interpolate) ar.readByte(*interpolate);
+    // Keys that run past the end of the data keep the values read last.
+    double time = 0;
+    V value = V();
     for (std::uint64_t i = 0; i < count; ++i) {
-        double time = 0;
-        V value = V();
         ar.readDouble(time);
         readValue(ar, value);
         track.set(time, value);

@@ -167,19 +167,17 @@ RenderView::RenderView() : viewAngle(true), viewReal2(true), viewReal3(true), vi
     reset();
 }
 
+// Only the camera transform loses its other keys; the animated values get
+// their defaults at time 0 and keep any further keys.
 void RenderView::reset() {
     cameraTransform.reset();
     viewRect1 = kNoRect;
     viewRect2 = kNoRect;
-    viewAngle.reset();
     viewAngle.setValue(0.7853982f, 0.0);
-    viewReal2.reset();
     viewReal2.setValue(1.0f, 0.0);
-    viewReal3.reset();
     viewReal3.setValue(1.0f, 0.0);
     img_width = 320;
     img_height = 240;
-    viewState.reset();
     viewState.setValue(0, 0.0);
 }
 

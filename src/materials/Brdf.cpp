@@ -97,7 +97,7 @@ struct Slot {
 };
 
 template <class L>
-struct LayerSpec {
+struct LayerTable {
     int currentVersion;
     std::vector<Rows<L>> records;  // by version; entry 0 unused
     std::vector<Slot<L>> slots;    // in the order their Assets are written
@@ -120,9 +120,9 @@ TexturePtr makeFresnelTexture(float ior) {
 }
 
 template <class L>
-bool saveRows(const L& layer, QuickArchive& ar, const LayerSpec<L>& spec) {
-    writeVersion(ar, spec.currentVersion);
-    for (const Row<L>& row : spec.records[spec.currentVersion]) {
+bool saveRows(const L& layer, QuickArchive& ar, const LayerTable<L>& table) {
+    writeVersion(ar, table.currentVersion);
+    for (const Row<L>& row : table.records[table.currentVersion]) {
         switch (row.kind) {
         case RowKind::Color: ar.writeColor(layer.*row.color); break;
         case RowKind::Float: ar.writeFloat(layer.*row.number); break;
@@ -144,13 +144,13 @@ bool saveRows(const L& layer, QuickArchive& ar, const LayerSpec<L>& spec) {
 // Reads the rows of the version that the tag names. The caller has reset
 // the layer as its class requires.
 template <class L>
-bool loadRows(L& layer, QuickArchive& ar, const LayerSpec<L>& spec, bool emptyFresnelTarget) {
-    const int version = readVersion(ar, 1, spec.currentVersion);
+bool loadRows(L& layer, QuickArchive& ar, const LayerTable<L>& table, bool emptyFresnelTarget) {
+    const int version = readVersion(ar, 1, table.currentVersion);
     if (version < 0) return false;
     // The default Fresnel texture of a new layer survives in no loaded one.
-    if (emptyFresnelTarget) (layer.*spec.fresnelTarget).reset();
+    if (emptyFresnelTarget) (layer.*table.fresnelTarget).reset();
     FresnelPair fresnel;
-    for (const Row<L>& row : spec.records[version]) {
+    for (const Row<L>& row : table.records[version]) {
         switch (row.kind) {
         case RowKind::Color: ar.readColor(layer.*row.color); break;
         case RowKind::Float: ar.readFloat(layer.*row.number); break;
@@ -168,7 +168,7 @@ bool loadRows(L& layer, QuickArchive& ar, const LayerSpec<L>& spec, bool emptyFr
         case RowKind::FresnelIor: ar.readFloat(fresnel.ior); break;
         case RowKind::FresnelSwitch: ar.readInt(fresnel.enabled); break;
         case RowKind::FresnelRule:
-            if (fresnel.enabled != 0) layer.*spec.fresnelTarget = makeFresnelTexture(fresnel.ior);
+            if (fresnel.enabled != 0) layer.*table.fresnelTarget = makeFresnelTexture(fresnel.ior);
             break;
         case RowKind::BaseRecord:
             if (!layer.Base_BRDF::load(ar)) return false;
@@ -181,11 +181,11 @@ bool loadRows(L& layer, QuickArchive& ar, const LayerSpec<L>& spec, bool emptyFr
 // Every field of the current record but the base record: textures through
 // their own isEqual, colours per component, numbers exactly.
 template <class L>
-bool fieldsEqual(const L& a, const BrdfPtr& other, const LayerSpec<L>& spec) {
+bool fieldsEqual(const L& a, const BrdfPtr& other, const LayerTable<L>& table) {
     if (!other || other->getType() != a.getType()) return false;
     const L* b = dynamic_cast<const L*>(other.get());
     if (!b) return false;
-    for (const Row<L>& row : spec.records[spec.currentVersion]) {
+    for (const Row<L>& row : table.records[table.currentVersion]) {
         bool same = true;
         switch (row.kind) {
         case RowKind::Color: same = a.*row.color == b->*row.color; break;
@@ -201,13 +201,13 @@ bool fieldsEqual(const L& a, const BrdfPtr& other, const LayerSpec<L>& spec) {
 }
 
 template <class L>
-void cloneSlots(L& copy, const LayerSpec<L>& spec) {
-    for (const Slot<L>& slot : spec.slots) copy.*slot.texture = cloneChild(copy.*slot.texture);
+void cloneSlots(L& copy, const LayerTable<L>& table) {
+    for (const Slot<L>& slot : table.slots) copy.*slot.texture = cloneChild(copy.*slot.texture);
 }
 
 template <class L>
-const char16_t* slotWord(TexturePtr L::*texture, const LayerSpec<L>& spec) {
-    for (const Slot<L>& slot : spec.slots) {
+const char16_t* slotWord(TexturePtr L::*texture, const LayerTable<L>& table) {
+    for (const Slot<L>& slot : table.slots) {
         if (slot.texture == texture) return slot.word;
     }
     return u"";
@@ -220,18 +220,18 @@ Color colorFromReflection(const Color& reflection) {
 
 template <class L>
 void writeLayer(const L& layer, AssetXmlWriter& writer, std::u16string url,
-                const LayerSpec<L>& spec) {
+                const LayerTable<L>& table) {
     url += u'/';
     url += layer.name;
     const std::u16string slotPrefix = url + u'/';
-    for (const Slot<L>& slot : spec.slots) {
+    for (const Slot<L>& slot : table.slots) {
         const TexturePtr& texture = layer.*slot.texture;
         if (texture) texture->writeXml(writer, slotPrefix + slot.word);
     }
     writer.openAsset(url, layer.getAssetType(), "");
     writer.openPlugin(layer.getPluginName(), layer.getAssetType());
     writer.openParameters();
-    for (const Param<L>& p : spec.params) {
+    for (const Param<L>& p : table.params) {
         const Row<L>& f = p.field;
         switch (p.form) {
         case Form::Color: writer.writeColor(p.name, layer.*f.color); break;
@@ -244,7 +244,7 @@ void writeLayer(const L& layer, AssetXmlWriter& writer, std::u16string url,
         case Form::BoolFromInt: writer.writeBool(p.name, layer.*f.integer != 0); break;
         case Form::Plugin:
             writer.writePluginRef(p.name, boost::any(layer.*f.texture),
-                                  slotPrefix + slotWord(f.texture, spec));
+                                  slotPrefix + slotWord(f.texture, table));
             break;
         }
     }
@@ -260,9 +260,9 @@ const RowKind kFresnelRule = RowKind::FresnelRule;
 
 // ---- Glass_BRDF ------------------------------------------------------------------------
 
-const LayerSpec<Glass_BRDF>& glassSpec() {
+const LayerTable<Glass_BRDF>& glassTable() {
     typedef Glass_BRDF G;
-    static const LayerSpec<G> spec = [] {
+    static const LayerTable<G> table = [] {
         // The rows of the current record, numbered as old versions name them.
         const Rows<G> r1 = {&G::color, &G::fog_color};
         const Rows<G> r2 = {&G::ior, &G::ior_second, &G::cutoff, &G::fog_color_mult, &G::glossiness};
@@ -283,7 +283,7 @@ const LayerSpec<Glass_BRDF>& glassSpec() {
         const Rows<G> v2Paths = {path(&G::transparency_tex), path(&G::glossiness_tex),
                                  path(&G::ior_tex)};
 
-        LayerSpec<G> s;
+        LayerTable<G> s;
         s.currentVersion = 6;
         s.records = {
             {},
@@ -332,14 +332,14 @@ const LayerSpec<Glass_BRDF>& glassSpec() {
         s.fresnelTarget = &G::transparency_tex;
         return s;
     }();
-    return spec;
+    return table;
 }
 
 // ---- Phong_BRDF, Blinn_BRDF ------------------------------------------------------------
 
-const LayerSpec<BaseGlossy_BRDF>& glossySpec() {
+const LayerTable<BaseGlossy_BRDF>& glossyTable() {
     typedef BaseGlossy_BRDF P;
-    static const LayerSpec<P> spec = [] {
+    static const LayerTable<P> table = [] {
         // The head that all old records share, with the Fresnel pair inside.
         const Rows<P> head = {&P::color, &P::reflection, &P::hilightGlossiness,
                               &P::reflectionGlossiness, kFresnelIor, &P::cutoff, &P::subdivs,
@@ -352,7 +352,7 @@ const LayerSpec<BaseGlossy_BRDF>& glossySpec() {
                                  &P::reflectionGlossiness_tex};
         const Rows<P> anisotropy = {&P::anisotropy, &P::anisotropy_rotation};
 
-        LayerSpec<P> s;
+        LayerTable<P> s;
         s.currentVersion = 6;
         s.records = {
             {},
@@ -399,20 +399,20 @@ const LayerSpec<BaseGlossy_BRDF>& glossySpec() {
         s.fresnelTarget = &P::transparency_tex;
         return s;
     }();
-    return spec;
+    return table;
 }
 
 // ---- Mirror_BRDF -----------------------------------------------------------------------
 
-const LayerSpec<Mirror_BRDF>& mirrorSpec() {
+const LayerTable<Mirror_BRDF>& mirrorTable() {
     typedef Mirror_BRDF M;
-    static const LayerSpec<M> spec = [] {
+    static const LayerTable<M> table = [] {
         // Version 1 up to `mirror_value`, with the Fresnel pair inside.
         const Rows<M> head = {&M::color, &M::reflection, &M::transparency_tex_mult, kFresnelIor,
                               &M::cutoff, kFresnelSwitch, &M::mirror_value};
         const Rows<M> members = {&M::color_tex_mult, &M::transparency_tex, &M::color_tex};
 
-        LayerSpec<M> s;
+        LayerTable<M> s;
         s.currentVersion = 5;
         s.records = {
             {},
@@ -440,19 +440,19 @@ const LayerSpec<Mirror_BRDF>& mirrorSpec() {
         s.fresnelTarget = &M::transparency_tex;
         return s;
     }();
-    return spec;
+    return table;
 }
 
 // ---- Diffuse_BRDF ----------------------------------------------------------------------
 
-const LayerSpec<Diffuse_BRDF>& diffuseSpec() {
+const LayerTable<Diffuse_BRDF>& diffuseTable() {
     typedef Diffuse_BRDF D;
-    static const LayerSpec<D> spec = [] {
+    static const LayerTable<D> table = [] {
         const Rows<D> head = {&D::color, &D::transparency, &D::color_tex_mult,
                               &D::transparency_tex_mult};
         const Rows<D> members = {&D::color_tex, &D::transparency_tex};
 
-        LayerSpec<D> s;
+        LayerTable<D> s;
         s.currentVersion = 4;
         s.records = {
             {},
@@ -478,19 +478,19 @@ const LayerSpec<Diffuse_BRDF>& diffuseSpec() {
         s.fresnelTarget = &D::transparency_tex;
         return s;
     }();
-    return spec;
+    return table;
 }
 
 // ---- Light_BRDF ------------------------------------------------------------------------
 
-const LayerSpec<Light_BRDF>& lightSpec() {
+const LayerTable<Light_BRDF>& lightTable() {
     typedef Light_BRDF E;
-    static const LayerSpec<E> spec = [] {
+    static const LayerTable<E> table = [] {
         const Rows<E> head = {&E::color, &E::transparency, &E::intensity, &E::light_value,
                               &E::color_tex_mult, &E::transparency_tex_mult};
         const Rows<E> members = {&E::color_tex, &E::transparency_tex};
 
-        LayerSpec<E> s;
+        LayerTable<E> s;
         s.currentVersion = 5;
         s.records = {
             {},
@@ -517,7 +517,7 @@ const LayerSpec<Light_BRDF>& lightSpec() {
         s.fresnelTarget = &E::transparency_tex;
         return s;
     }();
-    return spec;
+    return table;
 }
 
 void removeControlCharacters(std::u16string& text) {
@@ -606,25 +606,25 @@ void Glass_BRDF::reset() {
     translucency_tex.reset();
 }
 
-bool Glass_BRDF::save(QuickArchive& ar) const { return saveRows(*this, ar, glassSpec()); }
+bool Glass_BRDF::save(QuickArchive& ar) const { return saveRows(*this, ar, glassTable()); }
 
 bool Glass_BRDF::load(QuickArchive& ar) {
     Base_BRDF::reset();
-    return loadRows(*this, ar, glassSpec(), false);
+    return loadRows(*this, ar, glassTable(), false);
 }
 
 BrdfPtr Glass_BRDF::clone() const {
     boost::shared_ptr<Glass_BRDF> copy(new Glass_BRDF(*this));
-    cloneSlots(*copy, glassSpec());
+    cloneSlots(*copy, glassTable());
     return copy;
 }
 
 bool Glass_BRDF::isEqual(const BrdfPtr& other) const {
-    return fieldsEqual(*this, other, glassSpec());
+    return fieldsEqual(*this, other, glassTable());
 }
 
 void Glass_BRDF::writeXml(AssetXmlWriter& writer, std::u16string url) {
-    writeLayer(*this, writer, url, glassSpec());
+    writeLayer(*this, writer, url, glassTable());
 }
 
 // ---- Phong_BRDF, Blinn_BRDF ------------------------------------------------------------
@@ -651,21 +651,21 @@ void BaseGlossy_BRDF::reset() {
     transparency_tex = createTexture(1);
 }
 
-bool BaseGlossy_BRDF::save(QuickArchive& ar) const { return saveRows(*this, ar, glossySpec()); }
+bool BaseGlossy_BRDF::save(QuickArchive& ar) const { return saveRows(*this, ar, glossyTable()); }
 
 bool BaseGlossy_BRDF::load(QuickArchive& ar) {
     reset();
-    return loadRows(*this, ar, glossySpec(), true);
+    return loadRows(*this, ar, glossyTable(), true);
 }
 
-void BaseGlossy_BRDF::cloneTextures() { cloneSlots(*this, glossySpec()); }
+void BaseGlossy_BRDF::cloneTextures() { cloneSlots(*this, glossyTable()); }
 
 bool BaseGlossy_BRDF::isEqual(const BrdfPtr& other) const {
-    return fieldsEqual(*this, other, glossySpec());
+    return fieldsEqual(*this, other, glossyTable());
 }
 
 void BaseGlossy_BRDF::writeXml(AssetXmlWriter& writer, std::u16string url) {
-    writeLayer(*this, writer, url, glossySpec());
+    writeLayer(*this, writer, url, glossyTable());
 }
 
 Phong_BRDF::Phong_BRDF() { reset(); }
@@ -700,25 +700,25 @@ void Mirror_BRDF::reset() {
     color_tex.reset();
 }
 
-bool Mirror_BRDF::save(QuickArchive& ar) const { return saveRows(*this, ar, mirrorSpec()); }
+bool Mirror_BRDF::save(QuickArchive& ar) const { return saveRows(*this, ar, mirrorTable()); }
 
 bool Mirror_BRDF::load(QuickArchive& ar) {
     reset();
-    return loadRows(*this, ar, mirrorSpec(), true);
+    return loadRows(*this, ar, mirrorTable(), true);
 }
 
 BrdfPtr Mirror_BRDF::clone() const {
     boost::shared_ptr<Mirror_BRDF> copy(new Mirror_BRDF(*this));
-    cloneSlots(*copy, mirrorSpec());
+    cloneSlots(*copy, mirrorTable());
     return copy;
 }
 
 bool Mirror_BRDF::isEqual(const BrdfPtr& other) const {
-    return fieldsEqual(*this, other, mirrorSpec());
+    return fieldsEqual(*this, other, mirrorTable());
 }
 
 void Mirror_BRDF::writeXml(AssetXmlWriter& writer, std::u16string url) {
-    writeLayer(*this, writer, url, mirrorSpec());
+    writeLayer(*this, writer, url, mirrorTable());
 }
 
 // ---- Diffuse_BRDF ----------------------------------------------------------------------
@@ -736,25 +736,25 @@ void Diffuse_BRDF::reset() {
     use_color_tex_alpha_as_transparency = false;
 }
 
-bool Diffuse_BRDF::save(QuickArchive& ar) const { return saveRows(*this, ar, diffuseSpec()); }
+bool Diffuse_BRDF::save(QuickArchive& ar) const { return saveRows(*this, ar, diffuseTable()); }
 
 bool Diffuse_BRDF::load(QuickArchive& ar) {
     reset();
-    return loadRows(*this, ar, diffuseSpec(), false);
+    return loadRows(*this, ar, diffuseTable(), false);
 }
 
 BrdfPtr Diffuse_BRDF::clone() const {
     boost::shared_ptr<Diffuse_BRDF> copy(new Diffuse_BRDF(*this));
-    cloneSlots(*copy, diffuseSpec());
+    cloneSlots(*copy, diffuseTable());
     return copy;
 }
 
 bool Diffuse_BRDF::isEqual(const BrdfPtr& other) const {
-    return fieldsEqual(*this, other, diffuseSpec());
+    return fieldsEqual(*this, other, diffuseTable());
 }
 
 void Diffuse_BRDF::writeXml(AssetXmlWriter& writer, std::u16string url) {
-    writeLayer(*this, writer, url, diffuseSpec());
+    writeLayer(*this, writer, url, diffuseTable());
 }
 
 // ---- Light_BRDF ------------------------------------------------------------------------
@@ -774,25 +774,25 @@ void Light_BRDF::reset() {
     doubleSided = 1;
 }
 
-bool Light_BRDF::save(QuickArchive& ar) const { return saveRows(*this, ar, lightSpec()); }
+bool Light_BRDF::save(QuickArchive& ar) const { return saveRows(*this, ar, lightTable()); }
 
 bool Light_BRDF::load(QuickArchive& ar) {
     reset();
-    return loadRows(*this, ar, lightSpec(), false);
+    return loadRows(*this, ar, lightTable(), false);
 }
 
 BrdfPtr Light_BRDF::clone() const {
     boost::shared_ptr<Light_BRDF> copy(new Light_BRDF(*this));
-    cloneSlots(*copy, lightSpec());
+    cloneSlots(*copy, lightTable());
     return copy;
 }
 
 bool Light_BRDF::isEqual(const BrdfPtr& other) const {
-    return fieldsEqual(*this, other, lightSpec());
+    return fieldsEqual(*this, other, lightTable());
 }
 
 void Light_BRDF::writeXml(AssetXmlWriter& writer, std::u16string url) {
-    writeLayer(*this, writer, url, lightSpec());
+    writeLayer(*this, writer, url, lightTable());
 }
 
 }  // namespace OrvaneLumoCore

@@ -236,9 +236,9 @@ bool QuickArchive::saveBlocks(std::ostream& out) const {
 
 bool QuickArchive::loadBlocks(std::istream& in) {
     clear();
+    // A stream that ends inside the count keeps the bytes it delivered.
     std::uint32_t count = 0;
     in.read(reinterpret_cast<char*>(&count), 4);
-    if (in.gcount() != 4) count = 0;
     // Blocks are appended as the stream delivers them: a count read from a
     // damaged file does not reserve memory ahead of the data that backs it.
     for (std::uint32_t i = 0; i < count && in; ++i) {

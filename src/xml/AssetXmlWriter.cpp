@@ -207,7 +207,7 @@ void AssetXmlWriter::writeNumber(double value) { platform::appendFloat(out_, val
 
 // ---- parameters ------------------------------------------------------------------
 
-void AssetXmlWriter::writeFloat(const WriterText& name, double value, const WriterText& label,
+void AssetXmlWriter::writeFloat(const WriterText& name, float value, const WriterText& label,
                                 bool isUserData) {
     openParameter(name, "float", label, "none", isUserData, "default");
     openInlineValue();

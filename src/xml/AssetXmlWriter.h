@@ -59,7 +59,7 @@ public:
     void closeParameters();
 
     // ---- parameters ----
-    void writeFloat(const WriterText& name, double value, const WriterText& label = {},
+    void writeFloat(const WriterText& name, float value, const WriterText& label = {},
                     bool isUserData = false);
     void writeInteger(const WriterText& name, std::int32_t value, const WriterText& label = {},
                       bool isUserData = false);

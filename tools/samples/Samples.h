@@ -13,5 +13,6 @@ struct Sample {
 
 void addMaterialSamples(std::vector<Sample>& list);
 void addTextureSamples(std::vector<Sample>& list);
+void addTextRoadSamples(std::vector<Sample>& list);
 
 }  // namespace samples

@@ -19,6 +19,7 @@ int main(int argc, char** argv) {
     }
 
     std::vector<samples::Sample> list;
+    samples::addTextRoadSamples(list);
     samples::addMaterialSamples(list);
     samples::addTextureSamples(list);
 
