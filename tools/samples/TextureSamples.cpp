@@ -213,9 +213,12 @@ public:
     }
 };
 
-boost::shared_ptr<SkyRecord> sky(int version, LightPtr sun) {
+// A sky of `version` with its own sun, if given. The sky's id is fixed, so
+// that the sample files come out the same at every run.
+boost::shared_ptr<SkyRecord> sky(int version, LightPtr sun, const char16_t* skyId) {
     boost::shared_ptr<SkyRecord> s(new SkyRecord);
     s->version = version;
+    s->skyId = skyId;
     if (sun) s->sun = sun;
     s->turbidity = 2.5f;
     return s;
@@ -223,16 +226,24 @@ boost::shared_ptr<SkyRecord> sky(int version, LightPtr sun) {
 
 bool writeSkyVersions(const std::string& path) {
     // Version 1 without a sun of its own: the document sun.
-    boost::shared_ptr<SkyRecord> v1 = sky(1, LightPtr());
+    boost::shared_ptr<SkyRecord> v1 =
+        sky(1, LightPtr(), u"{A0000000-0000-4000-8000-000000000001}");
     v1->sun.reset();  // no own sun in the record
     // Version 1 with a sun of its own.
-    boost::shared_ptr<SkyRecord> v1Own = sky(1, sunNamed(u"Morning", u"{1E7A0C52-3B9D-4C61-9F0E-2D4B8A6C1357}", 3));
+    boost::shared_ptr<SkyRecord> v1Own =
+        sky(1, sunNamed(u"Morning", u"{1E7A0C52-3B9D-4C61-9F0E-2D4B8A6C1357}", 3),
+            u"{A0000000-0000-4000-8000-000000000002}");
     // Version 2 with its own sun and a sky transform.
-    boost::shared_ptr<SkyRecord> v2 = sky(2, sunNamed(u"Noon", u"{2F8B1D63-4CAE-4D72-A01F-3E5C9B7D2468}", 4));
+    boost::shared_ptr<SkyRecord> v2 =
+        sky(2, sunNamed(u"Noon", u"{2F8B1D63-4CAE-4D72-A01F-3E5C9B7D2468}", 4),
+            u"{A0000000-0000-4000-8000-000000000003}");
     // Version 3 whose sun is the document sun (which it carries unchanged).
-    boost::shared_ptr<SkyRecord> v3 = sky(3, documentSun());
+    boost::shared_ptr<SkyRecord> v3 =
+        sky(3, documentSun(), u"{A0000000-0000-4000-8000-000000000004}");
     // Version 3 with its own sun, and the document sun unchanged.
-    boost::shared_ptr<SkyRecord> v3Own = sky(3, sunNamed(u"Dusk", u"{3A9C2E74-5DBF-4E83-B12A-4F6DAC8E3579}", 6));
+    boost::shared_ptr<SkyRecord> v3Own =
+        sky(3, sunNamed(u"Dusk", u"{3A9C2E74-5DBF-4E83-B12A-4F6DAC8E3579}", 6),
+            u"{A0000000-0000-4000-8000-000000000005}");
     return saveLibrary({materialOf(u"Skies", {{u"SkyV1", v1},
                                               {u"SkyV1OwnSun", v1Own},
                                               {u"SkyV2", v2},
@@ -245,7 +256,8 @@ bool writeSkyVersions(const std::string& path) {
 // with the id {4B0D3F85-6EC0-4F94-8C3B-5A7EBD9F468A}. Reading it replaces the
 // document sun of the process.
 bool writeDocumentSunFirst(const std::string& path) {
-    boost::shared_ptr<SkyRecord> s = sky(3, LightPtr());
+    boost::shared_ptr<SkyRecord> s =
+        sky(3, LightPtr(), u"{A0000000-0000-4000-8000-000000000006}");
     s->docSun = sunNamed(u"Studio", u"{4B0D3F85-6EC0-4F94-8C3B-5A7EBD9F468A}", 7);
     s->sun = s->docSun;  // the sky's sun is that document sun
     return saveLibrary({materialOf(u"SetsTheSun", {{u"Sky", s}})}, path);
@@ -255,7 +267,8 @@ bool writeDocumentSunFirst(const std::string& path) {
 // refers to "/Rhino Document Sun"; converted after the first one, to the
 // sun that the first one brought, "/{4B0D3F85-6EC0-4F94-8C3B-5A7EBD9F468A}".
 bool writeDocumentSunSecond(const std::string& path) {
-    boost::shared_ptr<SkyRecord> s = sky(1, LightPtr());
+    boost::shared_ptr<SkyRecord> s =
+        sky(1, LightPtr(), u"{A0000000-0000-4000-8000-000000000007}");
     s->sun.reset();
     return saveLibrary({materialOf(u"UsesTheSun", {{u"Sky", s}})}, path);
 }
