@@ -12,6 +12,7 @@ struct Sample {
 };
 
 void addMaterialSamples(std::vector<Sample>& list);
+void addTextureSamples(std::vector<Sample>& list);
 void addTextRoadSamples(std::vector<Sample>& list);
 void addOptionSamples(std::vector<Sample>& list);
 

@@ -21,6 +21,7 @@ int main(int argc, char** argv) {
     std::vector<samples::Sample> list;
     samples::addTextRoadSamples(list);
     samples::addMaterialSamples(list);
+    samples::addTextureSamples(list);
     samples::addOptionSamples(list);
 
     int failures = 0;
