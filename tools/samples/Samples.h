@@ -11,7 +11,10 @@ struct Sample {
     bool (*write)(const std::string& path);    // writes the file; false on failure
 };
 
-void addWrappedMaterialSamples(std::vector<Sample>& list);
 void addMaterialSamples(std::vector<Sample>& list);
+void addWrappedMaterialSamples(std::vector<Sample>& list);
+void addTextureSamples(std::vector<Sample>& list);
+void addTextRoadSamples(std::vector<Sample>& list);
+void addOptionSamples(std::vector<Sample>& list);
 
 }  // namespace samples

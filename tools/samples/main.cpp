@@ -19,8 +19,11 @@ int main(int argc, char** argv) {
     }
 
     std::vector<samples::Sample> list;
-    samples::addWrappedMaterialSamples(list);
+    samples::addTextRoadSamples(list);
     samples::addMaterialSamples(list);
+    samples::addWrappedMaterialSamples(list);
+    samples::addTextureSamples(list);
+    samples::addOptionSamples(list);
 
     int failures = 0;
     for (const samples::Sample& s : list) {

@@ -1,0 +1,157 @@
+#pragma once
+// Lights placed in a scene: infinite direct, omni, spot, rectangle and
+// sphere lights. Their records carry `storedFactor` and `storedMode`, which
+// no XML shows; `save` gives back what `load` read.
+#include <cstdint>
+#include <string>
+
+#include "animation/Animated.h"
+#include "lights/LightFrame.h"
+#include "persistence/Types.h"
+
+namespace OrvaneLumoCore {
+
+class MayaDirectLight : public LightOf<MayaDirectLight, 0> {
+public:
+    bool save(QuickArchive& ar) const override;
+    bool load(QuickArchive& ar) override;
+    bool isEqual(const LightPtr& other) const override;
+    void writeXml(AssetXmlWriter& writer, std::u16string url) override;
+    std::u16string getPluginName() const override { return u"MayaLightDirect"; }
+
+    Color color{1, 1, 1};
+    Color shadowColor{0, 0, 0};
+    AnimatedTransform transform;  // identity at time 0
+    float intensity = 1.0f;
+    float shadowBias = 0.0f;
+    float shadowRadius = 0.0f;
+    float storedFactor = 1.0f;
+    std::int32_t photonSubdivs = 500;
+    std::int32_t causticSubdivs = 1000;
+    std::int32_t shadowSubdivs = 8;
+    std::int32_t storedMode = 3;
+    bool enabled = true;
+    bool shadows = true;
+};
+
+class OmniLight : public LightOf<OmniLight, 2> {
+public:
+    bool save(QuickArchive& ar) const override;
+    bool load(QuickArchive& ar) override;
+    bool isEqual(const LightPtr& other) const override;
+    void writeXml(AssetXmlWriter& writer, std::u16string url) override;
+    std::u16string getPluginName() const override { return u"LightOmni"; }
+
+    Color color{1, 1, 1};
+    Color shadowColor{0, 0, 0};
+    Transform transform;
+    float intensity = 30.0f;
+    float shadowBias = 0.0f;
+    float shadowRadius = 0.0f;
+    float cutoffThreshold = 0.005f;
+    float decay = 0.0f;
+    float storedFactor = 1.0f;
+    std::int32_t units = 0;
+    std::int32_t photonSubdivs = 500;
+    std::int32_t causticSubdivs = 1000;
+    std::int32_t shadowSubdivs = 8;
+    std::int32_t storedMode = 3;
+    bool enabled = true;
+    bool shadows = true;
+    bool affectDiffuse = true;
+    bool affectSpecular = true;
+};
+
+class SpotLight : public LightOf<SpotLight, 4> {
+public:
+    bool save(QuickArchive& ar) const override;
+    bool load(QuickArchive& ar) override;
+    bool isEqual(const LightPtr& other) const override;
+    void writeXml(AssetXmlWriter& writer, std::u16string url) override;
+    std::u16string getPluginName() const override { return u"LightSpot"; }
+
+    Color color{1, 1, 1};
+    Color shadowColor{0, 0, 0};
+    Transform transform;
+    float intensity = 50.0f;
+    float shadowBias = 0.0f;
+    float shadowRadius = 0.0f;
+    float cutoffThreshold = 0.005f;
+    float decay = 0.0f;
+    float storedFactor = 1.0f;
+    float barnDoorLeft = 20.0f;
+    float barnDoorRight = 20.0f;
+    float barnDoorTop = 20.0f;
+    float barnDoorBottom = 20.0f;
+    float coneAngle = 1.0f;
+    float penumbraAngle = 0.0f;
+    std::int32_t units = 0;
+    std::int32_t photonSubdivs = 500;
+    std::int32_t causticSubdivs = 1000;
+    std::int32_t shadowSubdivs = 8;
+    std::int32_t storedMode = 3;
+    bool enabled = true;
+    bool shadows = true;
+    bool affectDiffuse = true;
+    bool affectSpecular = true;
+    bool barnDoor = false;
+};
+
+class RectangleLight : public LightOf<RectangleLight, 3> {
+public:
+    bool save(QuickArchive& ar) const override;
+    bool load(QuickArchive& ar) override;
+    bool isEqual(const LightPtr& other) const override;
+    void writeXml(AssetXmlWriter& writer, std::u16string url) override;
+    std::u16string getPluginName() const override { return u"LightRectangle"; }
+
+    Color color{1, 1, 1};
+    Color shadowColor{0, 0, 0};
+    Transform transform;
+    float intensity = 30.0f;
+    float shadowBias = 0.0f;
+    float cutoffThreshold = 0.005f;
+    float storedFactor = 1.0f;
+    float u_size = 1.0f;
+    float v_size = 1.0f;
+    std::int32_t units = 0;
+    std::int32_t photonSubdivs = 500;
+    std::int32_t causticSubdivs = 1000;
+    std::int32_t subdivs = 8;
+    std::int32_t storedMode = 3;
+    bool enabled = true;
+    bool shadows = true;
+    bool affectDiffuse = true;
+    bool affectSpecular = true;
+    bool doubleSided = false;
+    bool invisible = false;
+    bool lightPortal = false;
+    bool noDecay = false;
+    bool storeWithIrradianceMap = false;
+    bool ignoreLightNormals = true;
+    bool affectReflections = true;
+};
+
+// Carries its settings in the record only: it writes no XML and has no
+// plugin name.
+class SphereLight : public LightOf<SphereLight, 7> {
+public:
+    static constexpr int kRealCount = 4;
+    static constexpr int kIntCount = 4;
+    static constexpr int kFlagCount = 8;
+    static constexpr int kVersion1FlagCount = 5;
+
+    bool save(QuickArchive& ar) const override;
+    bool load(QuickArchive& ar) override;
+    bool isEqual(const LightPtr& other) const override;
+
+    Color color{1, 1, 1};
+    Color shadowColor{0, 0, 0};
+    Transform transform;
+    // Three groups that the record holds without names.
+    float reals[kRealCount] = {0.0f, 0.005f, 1.0f, 1.0f};
+    std::int32_t ints[kIntCount] = {500, 1000, 0, 8};
+    bool flags[kFlagCount] = {true, true, false, false, false, true, true, true};
+};
+
+}  // namespace OrvaneLumoCore

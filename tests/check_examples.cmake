@@ -1,0 +1,15 @@
+# Writes the samples into OUT and compares each with its copy in EXAMPLES.
+file(REMOVE_RECURSE ${OUT})
+execute_process(COMMAND ${SAMPLES} ${OUT} RESULT_VARIABLE rc OUTPUT_QUIET)
+if(NOT rc EQUAL 0)
+  message(FATAL_ERROR "orvxml-samples failed")
+endif()
+file(GLOB written ${OUT}/*)
+foreach(f ${written})
+  get_filename_component(name ${f} NAME)
+  execute_process(COMMAND ${CMAKE_COMMAND} -E compare_files ${f} ${EXAMPLES}/${name}
+                  RESULT_VARIABLE diff)
+  if(NOT diff EQUAL 0)
+    message(FATAL_ERROR "examples/${name} differs from what orvxml-samples writes; run: build/orvxml-samples examples")
+  endif()
+endforeach()

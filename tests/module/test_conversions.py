@@ -1,0 +1,84 @@
+# -*- coding: utf-8 -*-
+"""Whole conversions through the interpreter, on the bundled sample files."""
+import os
+import re
+import shutil
+import sys
+import tempfile
+import unittest
+
+sys.path.insert(0, os.environ.get('ORVXML_BUILD_DIR', 'build'))
+import PyOrvXml  # noqa: E402
+
+EXAMPLES = os.path.join(os.environ.get('ORVXML_SOURCE_DIR', '.'), 'examples')
+
+
+def example(name):
+    return os.path.join(EXAMPLES, name).decode('utf-8')
+
+
+class MaterialDocuments(unittest.TestCase):
+    def check_document(self, xml, groups):
+        self.assertTrue(xml.startswith(u'<orvmat>\n'), xml[:40])
+        self.assertTrue(xml.endswith(u'</orvmat>\n'))
+        self.assertEqual(xml.count(u'\n  <Assets>\n'), groups)
+        self.assertEqual(xml.count(u'<Asset '), xml.count(u'</Asset>'))
+
+    def test_each_container_generation(self):
+        # Version 3 (blocks), version 2 (plain stream) and version 1 (text-mode
+        # stream with CR LF pairs) all load rather than falling to the text road.
+        for name in ('materials_all_layers.orvmat', 'materials_old_records_v2.orvmat',
+                     'materials_old_records_v1.lumat'):
+            xml = PyOrvXml.getOrvmatXml(example(name))
+            self.assertTrue(xml.startswith(u'<orvmat>\n'), name)
+            self.check_document(xml, xml.count(u'\n  <Assets>\n'))
+            self.assertGreater(xml.count(u'\n  <Assets>\n'), 0)
+
+    def test_same_file_under_both_extensions(self):
+        tmp = tempfile.mkdtemp()
+        try:
+            src = os.path.join(EXAMPLES, 'materials_all_layers.orvmat')
+            dst = os.path.join(tmp, 'copy.LUMAT')
+            shutil.copy(src, dst)
+            self.assertEqual(PyOrvXml.getOrvmatXml(dst.decode('utf-8')),
+                             PyOrvXml.getOrvmatXml(example('materials_all_layers.orvmat')))
+        finally:
+            shutil.rmtree(tmp)
+
+    def test_damaged_record_takes_the_text_road(self):
+        tmp = tempfile.mkdtemp()
+        try:
+            data = open(os.path.join(EXAMPLES, 'materials_all_layers.orvmat'), 'rb').read()
+            bad = os.path.join(tmp, 'bad.orvmat')
+            # Break the first material's version tag (behind header, block count, type tag).
+            open(bad, 'wb').write(data[:18] + '\x07\x00' + data[20:])
+            self.assertEqual(PyOrvXml.getOrvmatXml(bad.decode('utf-8')), u'')
+        finally:
+            shutil.rmtree(tmp)
+
+
+class OptionsDocuments(unittest.TestCase):
+    def test_saved_and_old_files_give_22_blocks(self):
+        for name in ('render_settings.orvopt', 'old_settings_v4.luopt'):
+            xml = PyOrvXml.getOrvoptXml(example(name))
+            self.assertTrue(xml.startswith(u'<orvopt>\n'), name)
+            self.assertTrue(xml.endswith(u'</orvopt>\n'))
+            self.assertEqual(xml.count(u'\n  <Assets>\n'), 22)
+            self.assertEqual(len(re.findall(u'<Asset layout="" renderer="lumo" type="settings"', xml)) >= 22, True)
+
+    def test_damaged_options_file_gives_its_first_character(self):
+        tmp = tempfile.mkdtemp()
+        try:
+            data = open(os.path.join(EXAMPLES, 'render_settings.orvopt'), 'rb').read()
+            bad = os.path.join(tmp, 'bad.orvopt')
+            open(bad, 'wb').write(data[:4].replace('\x00', '\x7f', 1) + data[4:])
+            # The tag's low half stays 1; only the version changes.
+            bad_version = os.path.join(tmp, 'badversion.orvopt')
+            open(bad_version, 'wb').write('\x01\x00\x0f\x00' + data[4:])
+            self.assertEqual(PyOrvXml.getOrvoptXml(bad_version.decode('utf-8')), u'\x01')
+        finally:
+            shutil.rmtree(tmp)
+
+
+if __name__ == '__main__':
+    unittest.main()
