@@ -12,6 +12,7 @@
 #include "persistence/Record.h"
 #include "textures/BasicTextures.h"
 #include "textures/Bitmaps.h"
+#include "textures/ProceduralTextures.h"
 
 namespace OrvaneLumoCore {
 
@@ -237,7 +238,17 @@ void collectTextureBitmapFiles(const TexturePtr& texture, std::vector<std::u16st
         collectFromTextures(files, {blend->color_a, blend->color_b});
     } else if (const InvertTexture* invert = dynamic_cast<const InvertTexture*>(t)) {
         collectTextureBitmapFiles(invert->texture, files);
+    } else if (const CheckerTexture* checker = dynamic_cast<const CheckerTexture*>(t)) {
+        collectFromTextures(files, {checker->white_color, checker->black_color});
+    } else if (const GridTexture* grid = dynamic_cast<const GridTexture*>(t)) {
+        collectFromTextures(files, {grid->line_color, grid->fill_color});
+    } else if (const NoiseTexture* noise = dynamic_cast<const NoiseTexture*>(t)) {
+        collectFromTextures(files, {noise->color1_tex, noise->color2_tex});
+    } else if (const RampTexture* ramp = dynamic_cast<const RampTexture*>(t)) {
+        collectTextureBitmapFiles(ramp->colors, files);
     }
+    // The other textures (constant, UVW, bulge, cloth, sky) hold no texture
+    // and no bitmap.
 }
 
 }  // namespace OrvaneLumoCore

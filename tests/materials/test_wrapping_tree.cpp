@@ -11,6 +11,7 @@
 #include "materials/TwoSidedBump.h"
 #include "materials/WrappingMaterials.h"
 #include "textures/Bitmaps.h"
+#include "textures/ProceduralTextures.h"
 #include "test_wrapping_util.h"
 
 using namespace OrvaneLumoCore;
@@ -166,6 +167,26 @@ TEST_F(MaterialTreeWalks, BitmapFilesOfEveryClass) {
     EXPECT_EQ(collectBitmapFiles(multi, empty), 0u);
     EXPECT_EQ(collectBitmapFiles(MaterialPtr(new MaterialInstance(bump)), empty), 0u);
     EXPECT_EQ(collectBitmapFiles(MaterialPtr(), empty), 0u);
+}
+
+TEST_F(MaterialTreeWalks, BitmapFilesBelowProceduralTextures) {
+    boost::shared_ptr<GridTexture> grid(new GridTexture);
+    grid->line_color = bitmap(u"grid_line.png");
+    grid->fill_color = bitmap(u"grid_fill.png");
+    boost::shared_ptr<RampTexture> ramp(new RampTexture);
+    ramp->colors = bitmap(u"ramp.png");
+    boost::shared_ptr<NoiseTexture> noise(new NoiseTexture);
+    noise->color2_tex = ramp;
+    boost::shared_ptr<CheckerTexture> checker(new CheckerTexture);
+    checker->white_color = grid;
+    checker->black_color = noise;
+
+    boost::shared_ptr<MaterialLayeredBRDF> m = layered(u"M");
+    static_cast<Diffuse_BRDF&>(*m->brdfs[0]).color_tex = checker;
+    std::vector<std::u16string> files;
+    EXPECT_EQ(collectBitmapFiles(m, files), 3u);
+    std::sort(files.begin(), files.end());
+    EXPECT_EQ(files, (std::vector<std::u16string>{u"grid_fill.png", u"grid_line.png", u"ramp.png"}));
 }
 
 }  // namespace
