@@ -1,282 +1,254 @@
-// The three option groups: params, frame data and stamp info.
-#include <cmath>
-#include <cstring>
-
+// The option records: params, frame data, stamp info and the whole document.
+// The settings they hold are checked through the document (OptionsDocumentTest).
 #include <gtest/gtest.h>
 
-#include "OptionBytes.h"
-#include "options/OptionRecords.h"
-#include "xml/AssetXmlWriter.h"
+#include <algorithm>
+#include <chrono>
 
-using namespace OrvaneLumoCore;
+#include "OptionBytes.h"
+#include "textures/BasicTextures.h"
+
 using namespace opttest;
 typedef LumoUtils::LumoParams P;
 
 namespace {
 
-// Rows that reach no XML, so that only the record shows them. The rows of
-// settings are checked through the document (OptionsDocumentTest).
+// Rows of the params that reach no XML, so that only the record shows them.
 const std::pair<int, std::int32_t P::*> kKeptIntRows[] = {
-    {12, &P::kept12}, {15, &P::kept15}, {26, &P::kept26}, {27, &P::kept27}, {30, &P::kept30},
-    {31, &P::kept31}, {32, &P::kept32}, {37, &P::kept37}, {72, &P::kept72}, {163, &P::kept163},
-    {172, &P::kept172}, {173, &P::kept173}};
-const std::pair<int, float P::*> kKeptFloatRows[] = {
-    {16, &P::kept16}, {29, &P::kept29}, {33, &P::kept33}};
+    {12, &P::kept12}, {15, &P::kept15}, {26, &P::kept26}, {27, &P::kept27}, {30, &P::kept30}, {31, &P::kept31},
+    {32, &P::kept32}, {37, &P::kept37}, {72, &P::kept72}, {163, &P::kept163}, {172, &P::kept172}, {173, &P::kept173}};
+const std::pair<int, float P::*> kKeptFloatRows[] = {{16, &P::kept16}, {29, &P::kept29}, {33, &P::kept33}};
 const std::pair<int, std::string P::*> kKeptPathRows[] = {
     {69, &P::imKeptPath1}, {73, &P::imKeptPath2}, {89, &P::pmKeptPath1}, {94, &P::pmKeptPath2},
-    {104, &P::lcKeptPath1}, {107, &P::lcKeptPath2}, {122, &P::causticsKeptPath1},
-    {123, &P::causticsKeptPath2}};
+    {104, &P::lcKeptPath1}, {107, &P::lcKeptPath2}, {122, &P::causticsKeptPath1}, {123, &P::causticsKeptPath2}};
 
-void expectKeptRows(const OrvaneParams& p, int version) {
-    for (const auto& r : kKeptIntRows)
-        EXPECT_EQ(intAt(kParams, r.first), p.*r.second) << "row " << r.first << ", version " << version;
-    for (const auto& r : kKeptFloatRows)
-        EXPECT_EQ(floatAt(kParams, r.first), p.*r.second) << "row " << r.first << ", version " << version;
-    for (const auto& r : kKeptPathRows)
-        EXPECT_EQ(textAt(kParams, r.first), p.*r.second) << "row " << r.first << ", version " << version;
+// Tags that T refuses; the object, loaded from `valid` before, is reset all the same.
+template <class T>
+void expectRefusedTags(const RecordBytes& valid, std::initializer_list<std::uint32_t> tags) {
+    for (std::uint32_t t : tags) {
+        T o;
+        ASSERT_TRUE(loadsWhole(o, valid));
+        QuickArchive ar = RecordBytes().u32(t).archive();
+        EXPECT_FALSE(o.load(ar)) << std::hex << t;
+        EXPECT_EQ(savedBytes(o), savedBytes(T())) << std::hex << t;
+    }
 }
 
 }  // namespace
 
-TEST(OrvaneParams, EveryVersionReadsItsRowsInPlace) {
-    for (int version = 1; version <= 5; ++version) {
-        OrvaneParams p;
-        ASSERT_TRUE(loadFrom(p, paramsRecord(version))) << version;
-        expectKeptRows(p, version);
-        if (version >= 5) {
-            EXPECT_EQ(flagAt(kParams, 74), p.irradianceMap_detail_enhancement);
-            EXPECT_EQ(floatAt(kParams, 76), p.irradianceMap_detail_subdivs_mult);
-            EXPECT_EQ(floatAt(kParams, 75), p.irradianceMap_detail_radius);
-            EXPECT_EQ(intAt(kParams, 77), p.irradianceMap_detail_scale);
-        } else {
-            // The single f32 of old versions is dropped; the four keep their defaults.
-            EXPECT_EQ(60.0f, p.irradianceMap_detail_radius);
-            EXPECT_EQ(0.3f, p.irradianceMap_detail_subdivs_mult);
-        }
-        EXPECT_EQ(version >= 4 ? floatAt(kParams, 145) : 1.0f, p.colorMapping_gamma) << version;
-        EXPECT_EQ(2, p.dmcSampler_path_sampler_type) << "row 140 reads as 2 in every version";
-    }
+TEST(OptionRecords, RefusedTagsAfterReset) {
+    expectRefusedTags<OrvaneParams>(paramsRecord(5), {0, tag(6), tag(5) | 1, 1});
+    expectRefusedTags<OrvaneFrameData>(rowsRecord(kFrame, kFrameRowTypes), {0, tag(2), tag(1) | 1});
+    expectRefusedTags<OrvaneLFBStampInfo>(stampV1Record(), {0, tag(3), tag(2) | 1});
+    // A document before version 17: reset keeps the carried floats of later ones.
+    expectRefusedTags<AllOptions>(documentRecord(16, {101}),
+                                  {documentTag(10), documentTag(15), documentTag(24), tag(23), tag(0), tag(5) | 2});
+    QuickArchive empty(static_cast<std::size_t>(0));
+    EXPECT_FALSE(AllOptions().load(empty)) << "no data at all";
 }
 
-TEST(OrvaneParams, RefusesOtherTags) {
-    for (std::uint32_t bad : {0u, 0x00060000u, 0x00050001u, 0x00000001u}) {
-        RecordBytes b;
-        b.u32(bad);
-        OrvaneParams p;
-        EXPECT_FALSE(loadFrom(p, b)) << std::hex << bad;
-    }
-    OrvaneParams p;
-    EXPECT_FALSE(loadFrom(p, RecordBytes())) << "a tag behind the end of the data";
-}
-
-TEST(OrvaneParams, SaveWritesTheNewestVersionWithConstantRows) {
-    // Whatever version was read, save writes version 5, with rows 133 and
-    // 135 as constants; a re-read keeps every other row.
+TEST(OrvaneParams, EveryVersionReadsItsRowsAndSavesVersion5) {
     for (int version = 1; version <= 5; ++version) {
-        OrvaneParams p;
-        ASSERT_TRUE(loadFrom(p, paramsRecord(version)));
+        OrvaneParams p, q;
+        SCOPED_TRACE(version);
+        ASSERT_TRUE(loadsWhole(p, paramsRecord(version)));
+        for (const auto& r : kKeptIntRows) EXPECT_EQ(intAt(kParams, r.first), p.*r.second) << "row " << r.first;
+        for (const auto& r : kKeptFloatRows) EXPECT_EQ(floatAt(kParams, r.first), p.*r.second) << "row " << r.first;
+        for (const auto& r : kKeptPathRows) EXPECT_EQ(textAt(kParams, r.first), p.*r.second) << "row " << r.first;
+        // Save writes version 5, rows 133 and 135 as constants, and reads back the same.
         const std::vector<std::uint8_t> bytes = savedBytes(p);
-        if (version == 5) {
-            EXPECT_EQ(paramsRecord(5, true).bytes(), bytes);
-        }
-
-        RecordBytes again;
-        again.append(bytes);
-        OrvaneParams q;
-        ASSERT_TRUE(loadFrom(q, again));
-        expectKeptRows(q, version);
-        EXPECT_EQ(p.irradianceMap_detail_radius, q.irradianceMap_detail_radius);
-        EXPECT_EQ(p.colorMapping_gamma, q.colorMapping_gamma);
+        EXPECT_TRUE(version < 5 || paramsRecord(5, true).bytes() == bytes);
+        ASSERT_TRUE(loadsWhole(q, RecordBytes().append(bytes)));
+        EXPECT_EQ(bytes, savedBytes(q));
     }
-}
-
-TEST(OrvaneParams, NarrowPathsGoThroughWideStrings) {
-    OrvaneParams p;
-    p.imKeptPath1 = "C:\\maps\\caf\xc3\xa9.vrmap";  // UTF-8 narrow text
-    RecordBytes again;
-    again.append(savedBytes(p));
-    OrvaneParams q;
-    ASSERT_TRUE(loadFrom(q, again));
+    // Narrow paths are UTF-8, stored as wide strings; an empty stored string leaves reset's text.
+    OrvaneParams p, q;
+    p.imKeptPath1 = "C:\\maps\\caf\xc3\xa9.vrmap";
+    ASSERT_TRUE(loadsWhole(q, RecordBytes().append(savedBytes(p))));
     EXPECT_EQ(p.imKeptPath1, q.imKeptPath1);
-    EXPECT_EQ("", q.imKeptPath2) << "an empty stored string leaves the text as reset left it";
+    EXPECT_EQ("", q.imKeptPath2);
 }
 
-TEST(OrvaneParams, ResetGivesTheBareValuesAndTheFixedSettings) {
-    OrvaneParams p;
-    EXPECT_EQ(0, p.imageFilter_on);
-    EXPECT_EQ(0, p.imageSampler_type);
-    EXPECT_EQ(0, p.options_mtl_limitDepth);
-    EXPECT_EQ(1e18f, p.caustics_search_distance);
-    EXPECT_EQ(2, p.irradianceMap_interp_frames);
-    EXPECT_EQ(16, p.lightCache_min_paths_per_sample);
-    EXPECT_EQ(1.0f, p.colorMapping_clamp_level);
-    EXPECT_EQ(1, p.options_geom_doHidden);
-    EXPECT_EQ(1, p.options_mtl_filterMapsForSecondaryRays);
-    EXPECT_EQ(2, p.dmcSampler_path_sampler_type);
-    EXPECT_EQ(-3, p.irradianceMap_min_rate);
-    EXPECT_EQ(16, p.kept173);
-    EXPECT_EQ(6, p.kept27);
-
-    // Loading can't change the settings that no record holds.
-    p.lightCache_min_paths_per_sample = 99;
-    ASSERT_TRUE(loadFrom(p, paramsRecord(5)));
-    EXPECT_EQ(16, p.lightCache_min_paths_per_sample);
-}
-
-// ---- frame data --------------------------------------------------------------------
-
-TEST(OrvaneFrameData, RecordHoldsDoublesAndNarrowedOffsets) {
-    OrvaneFrameData f;
-    EXPECT_EQ(3, f.fieldMask);
-    EXPECT_EQ(200.0f, f.cameraDof_focal_dist);
-    EXPECT_EQ(0.0f, f.worldToCam.m[0].x) << "the default transform is all zero";
-    EXPECT_EQ(1.0, f.frameEnd);
-
-    const RecordBytes b = frameRecord();
-    ASSERT_TRUE(loadFrom(f, b));
-    EXPECT_EQ(floatAt(kFrame, 1), f.t);
-    EXPECT_EQ(floatAt(kFrame, 3), f.frameEnd);
-    EXPECT_EQ(intAt(kFrame, 4), f.currentFrame);
-    EXPECT_EQ(Matrix(), f.camToWorld.m);
-    EXPECT_EQ(floatAt(kFrame, 9), f.farRange);
-    EXPECT_EQ(intAt(kFrame, 18), f.infiniteProj);
-    EXPECT_EQ(intAt(kFrame, 23), f.orthoAdjustToScene);
-    EXPECT_EQ(floatAt(kFrame, 29) + 2, f.lumoRefractBackground.b);
-    EXPECT_EQ(intAt(kFrame, 34), f.keptFrame34);
-    EXPECT_EQ(intAt(kFrame, 35), f.keptFrame35);
-    EXPECT_EQ(floatAt(kFrame, 42), f.devAspect);
-    EXPECT_EQ(intAt(kFrame, 45), f.firstField);
-
-    // Saved again it is byte for byte the same record.
+TEST(OrvaneFrameData, RecordOwnXmlAndNarrowedOffsets) {
+    // The rows show in FrameData's own XML, an Asset without an Assets
+    // element; kept rows 34 and 35 only in the record.
+    OrvaneFrameData f, g, h;
+    const RecordBytes b = rowsRecord(kFrame, kFrameRowTypes);
+    ASSERT_TRUE(loadsWhole(f, b));
     EXPECT_EQ(b.bytes(), savedBytes(f));
-}
-
-TEST(OrvaneFrameData, OffsetsNarrowOnSavingAndDoublesDont) {
-    OrvaneFrameData f;
-    f.camToWorld.offs[1] = 0.1;  // no f32 holds 0.1 exactly
-    f.frameStart = 0.1;          // an f64 of the record
-    RecordBytes again;
-    again.append(savedBytes(f));
-    OrvaneFrameData g;
-    ASSERT_TRUE(loadFrom(g, again));
-    EXPECT_EQ(static_cast<double>(0.1f), g.camToWorld.offs[1]);
-    EXPECT_EQ(0.1, g.frameStart);
-}
-
-TEST(OrvaneFrameData, OnlyVersionOne) {
-    for (std::uint32_t bad : {0u, 0x00020000u, 0x00010001u}) {
-        RecordBytes b;
-        b.u32(bad);
-        OrvaneFrameData f;
-        EXPECT_FALSE(loadFrom(f, b)) << std::hex << bad;
-    }
-}
-
-TEST(OrvaneFrameData, OwnXmlHoldsTheFieldsThatAreNoSettings) {
-    OrvaneFrameData f;
-    f.t = 2.5;
+    EXPECT_TRUE(f.keptFrame34 == intAt(kFrame, 34) && f.keptFrame35 == intAt(kFrame, 35));
     f.worldToCam.offs[0] = 3;
     std::u16string out;
     AssetXmlWriter writer(out);
     f.writeXml(writer, u"/doc");
-    EXPECT_EQ(0u, out.find(u"  <Asset layout=\"\" renderer=\"lumo\" type=\"settings\" url=\"/doc/FrameData\" >\n"
-                           u"    <plugin>\n"
-                           u"      <lumoplugin name=\"FrameData\" type=\"settings\">\n"
-                           u"        <parameters>\n"
-                           u"          <parameter type=\"float\" name=\"t\" handler=\"default\" listType=\"none\" label=\"t\">\n"
-                           u"            <value>2.5</value>\n"));
-    const char16_t* const kNames[] = {
-        u"t", u"frameStart", u"frameEnd", u"currentFrame", u"worldToCam", u"camToWorld", u"fov",
-        u"nearRange", u"farRange", u"clippingPlanes", u"clipNear", u"clipFar", u"projType",
-        u"zoomFractor", u"infiniteProj", u"orthoAdjustToScene", u"ambient", u"background",
-        u"globalLightLevel", u"lumoGIBackground", u"lumoRRBackground", u"lumoRefractBackground",
-        u"devAspect", u"fieldMask", u"fieldOrder", u"firstField"};
-    std::size_t at = 0, count = 0;
-    for (const char16_t* name : kNames) {
-        const std::u16string needle = std::u16string(u"name=\"") + name + u"\"";
-        const std::size_t found = out.find(needle, at);
-        ASSERT_NE(std::u16string::npos, found) << count;
-        at = found + 1;
-        ++count;
-    }
-    std::size_t params = 0;
-    for (std::size_t k = out.find(u"<parameter "); k != std::u16string::npos;
-         k = out.find(u"<parameter ", k + 1))
-        ++params;
-    EXPECT_EQ(26u, params);
-    EXPECT_NE(std::u16string::npos, out.find(u"type=\"transform\" name=\"worldToCam\""));
-    EXPECT_NE(std::u16string::npos, out.find(u"<x>3</x>"));
-    EXPECT_EQ(std::u16string::npos, out.find(u"focal_dist"));
-    EXPECT_EQ(std::u16string::npos, out.find(u"<Assets>"));
+    EXPECT_EQ(golden("options/golden/frame_data.xml"), wideToUtf8(out));
+    // Offsets are f64 in memory and f32 in the record; f64 rows stay whole.
+    g.camToWorld.offs[1] = 0.1;
+    g.frameStart = 0.1;
+    ASSERT_TRUE(loadsWhole(h, RecordBytes().append(savedBytes(g))));
+    EXPECT_EQ(static_cast<double>(0.1f), h.camToWorld.offs[1]);
+    EXPECT_EQ(0.1, h.frameStart);
 }
 
-// ---- stamp info ----------------------------------------------------------------------
+TEST(OrvaneLFBStampInfo, FontBytesOfBothVersionsAndTheSave) {
+    // Version 1: stampFlag, stampValue1, stampValue2, text, 60 font bytes.
+    // Version 2: the same with a byte count before the font bytes: the first
+    // 60 are kept, the rest skipped; missing ones stay 0. Save writes version 2.
+    struct Case { int version; std::uint32_t count; std::size_t kept; const char* text; };
+    const Case kCases[] = {{1, 60, 60, "Frame %frame"}, {2, 60, 60, ""}, {2, 64, 60, "x"}, {2, 10, 10, "y"}};
+    for (const Case& c : kCases) {
+        const auto laid = [&](int version, std::uint32_t count, std::size_t kept) {
+            RecordBytes b;
+            wstr(b.u32(tag(version)).i32(3).i32(-4).i32(5), c.text);
+            if (version == 2) b.u32(count);
+            for (std::size_t k = 0; k < count; ++k) b.u8(k < kept ? k + 1 : 0);
+            return b;
+        };
+        OrvaneLFBStampInfo s;
+        ASSERT_TRUE(loadsWhole(s, laid(c.version, c.count, c.count))) << c.count;
+        // An empty stored text is empty text, not the default.
+        EXPECT_TRUE(s.stampFlag == 3 && s.stampValue1 == -4 && s.stampValue2 == 5 && s.text == c.text) << c.count;
+        EXPECT_EQ(laid(2, 60, c.kept).bytes(), savedBytes(s)) << c.count;
+    }
+}
 
-TEST(OrvaneLFBStampInfo, BothVersionsOfTheFontBytes) {
-    struct Case {
-        const char* what;
-        int version;
-        std::uint32_t storedCount;  // version 2 only
-        std::size_t kept;           // font bytes taken from the record
-    };
+// ---- the whole document --------------------------------------------------------------
+
+TEST(AllOptionsRecord, EveryAcceptedVersionReadsItsWholeRecord) {
+    // Here the record's length and the fields that no XML shows.
+    for (int version : kDocumentVersions) {
+        AllOptions o;
+        o.keptFloat1 = -1;
+        ASSERT_TRUE(loadsWhole(o, documentRecord(version, {101}))) << "version " << version;
+        EXPECT_EQ(version >= 17 ? floatAt(kDocument, 64) : -1.0f, o.keptFloat1) << version;
+        EXPECT_EQ(version >= 17 ? floatAt(kDocument, 65) : 0.0f, o.keptFloat2) << version;
+        EXPECT_EQ(version >= 19 ? intAt(kDocument, 67) : 1, o.keptInt1) << version;
+        EXPECT_EQ(version >= 22 ? intAt(kDocument, 71) : 0, o.keptInt2) << version;
+        EXPECT_EQ(version >= 20 ? utf8ToWide(textAt(kDocument, 70)) : u"", o.dr_folder) << version;
+        EXPECT_TRUE(o.stampInfo.stampValue2 == 3 && o.stampInfo.fontDescription[59] == 59) << version;
+        // A version 1 camera sets its single focal length as the key at time 0.
+        EXPECT_EQ(1u, o.physicalCamera.focal_length.getKeyCount()) << version;
+    }
+}
+
+TEST(AllOptionsRecord, ChannelListRules) {
+    struct Case { int version; std::vector<std::uint32_t> stored; std::vector<std::int32_t> expected; };
     const Case kCases[] = {
-        {"version 1: 60 bytes without a length", 1, 0, 60},
-        {"version 2 with the count 60", 2, 60, 60},
-        {"version 2 with the count 64: the last four are skipped", 2, 64, 60},
-        {"version 2 with the count 10: the rest stays 0", 2, 10, 10},
+        // Version 0 stored "Normals" as 8; values outside 100..132 are dropped.
+        {0, {8, 99, 133, 4294967295u, 100}, {126, 125, 123, 100}},
+        {1, {8, 132}, {126, 125, 132}},
+        {20, {}, {126, 125}},
+        // From version 21 on the list replaces the defaults.
+        {21, {}, {}},
+        {23, {101, 101, 131}, {101, 101, 131}},
     };
     for (const Case& c : kCases) {
-        RecordBytes b;
-        b.u32(tag(c.version)).i32(3).i32(-4).i32(5);
-        wstr(b, "Frame %frame");
-        const std::size_t n = c.version == 1 ? 60 : c.storedCount;
-        if (c.version == 2) b.u32(c.storedCount);
-        for (std::size_t k = 0; k < n; ++k) b.u8(static_cast<std::uint8_t>(k + 1));
-        b.i32(0x12345678);  // the next field behind the record
-
-        OrvaneLFBStampInfo s;
-        QuickArchive ar = b.archive();
-        ASSERT_TRUE(s.load(ar)) << c.what;
-        EXPECT_EQ(3, s.stampFlag) << c.what;
-        EXPECT_EQ(-4, s.stampValue1) << c.what;
-        EXPECT_EQ(5, s.stampValue2) << c.what;
-        EXPECT_EQ("Frame %frame", s.text) << c.what;
-        for (std::size_t k = 0; k < 60; ++k)
-            EXPECT_EQ(k < c.kept ? k + 1 : 0, s.fontDescription[k]) << c.what << " byte " << k;
-        std::int32_t next = 0;
-        ar.readInt(next);
-        EXPECT_EQ(0x12345678, next) << c.what;
+        AllOptions o;
+        ASSERT_TRUE(loadsWhole(o, documentRecord(c.version, c.stored))) << c.version;
+        EXPECT_EQ(c.expected, o.renderChannels) << "version " << c.version;
     }
 }
 
-TEST(OrvaneLFBStampInfo, ResetSaveAndBadTags) {
-    OrvaneLFBStampInfo s;
-    EXPECT_EQ(std::string(OrvaneLFBStampInfo::kDefaultText), s.text);
-    EXPECT_EQ("Lumo Core %lumocore | Render Time %rendertime |", s.text);
-    EXPECT_EQ(8, s.fontSize);
-    EXPECT_STREQ("Helvetica", s.fontName);
+TEST(AllOptionsRecord, HugeCountsFailFast) {
+    // A count of four billion from damaged data fails the load at once
+    // instead of filling memory or spinning. The channel count: records with
+    // and without an entry differ first there.
+    std::vector<std::uint8_t> channels = documentRecord(23, {}).bytes(), keys = savedBytes(AllOptions());
+    const std::vector<std::uint8_t> withOne = documentRecord(23, {100}).bytes();
+    std::fill_n(std::mismatch(channels.begin(), channels.end(), withOne.begin()).first, 4, 0xFF);
+    // The key count of the camera's focal length: its record's tag, the count
+    // of one key and the time width 8.
+    const std::uint8_t head[] = {0, 0, 1, 0, 1, 0, 0, 0, 8, 0, 0, 0};
+    const auto found = std::search(keys.begin(), keys.end(), std::begin(head), std::end(head));
+    ASSERT_NE(keys.end(), found);
+    std::fill_n(found + 4, 4, 0xFF);
+    for (const std::vector<std::uint8_t>& bytes : {channels, keys}) {
+        AllOptions o;
+        const auto start = std::chrono::steady_clock::now();
+        EXPECT_FALSE(loadsWhole(o, RecordBytes().append(bytes)));
+        EXPECT_LT(std::chrono::steady_clock::now() - start, std::chrono::seconds(1));
+    }
+}
 
-    s.stampFlag = 1;
-    s.text.clear();
-    s.fontDescription[59] = 0xEE;
-    RecordBytes expected;
-    expected.u32(tag(2)).i32(1).i32(0).i32(0).u32(0).u32(60);
-    for (int k = 0; k < 59; ++k) expected.u8(0);
-    expected.u8(0xEE);
-    EXPECT_EQ(expected.bytes(), savedBytes(s));
+TEST(AllOptionsRecord, PathsAreCutTo2047Characters) {
+    // A record with a path of 3000 characters, laid by a save that doesn't
+    // cut: the same record with the path's field patched.
+    AllOptions o, p, q;
+    o.output_img_file = u"@@path@@";
+    const std::vector<std::uint8_t> bytes = savedBytes(o);
+    const std::uint8_t marker[] = {8, 0, 0, 0, '@', '@', 'p', 'a', 't', 'h', '@', '@'};
+    const auto at = std::search(bytes.begin(), bytes.end(), std::begin(marker), std::end(marker));
+    ASSERT_NE(bytes.end(), at);
+    RecordBytes laid;
+    wstr(laid.append({bytes.begin(), at}), std::string(3000, 'p')).append({at + sizeof marker, bytes.end()});
+    ASSERT_TRUE(loadsWhole(p, laid));
+    EXPECT_EQ(std::u16string(2047, u'p'), p.output_img_file);
+    // A longer text in memory is saved cut.
+    p.output_luimg_file = std::u16string(2100, u'q');
+    ASSERT_TRUE(loadsWhole(q, RecordBytes().append(savedBytes(p))));
+    EXPECT_EQ(std::u16string(2047, u'p'), q.output_img_file);
+    EXPECT_EQ(std::u16string(2047, u'q'), q.output_luimg_file);
+    EXPECT_NE(std::u16string::npos, documentXml(q).find(u"<value>" + std::u16string(2047, u'p') + u"</value>"));
+}
 
-    // An empty stored text gives empty text, not the default.
-    OrvaneLFBStampInfo t;
-    ASSERT_TRUE(loadFrom(t, expected));
-    EXPECT_EQ("", t.text);
-    EXPECT_EQ(0xEE, t.fontDescription[59]);
-
-    for (std::uint32_t bad : {0u, 0x00030000u, 0x00020001u}) {
+TEST(AllOptionsRecord, TextureTagsWithoutAClassFail) {
+    // The bg texture's flag says present; the tag that follows has no class.
+    for (std::int32_t badTag : {-1, 13, 100}) {
         RecordBytes b;
-        b.u32(bad);
-        OrvaneLFBStampInfo u;
-        u.stampFlag = 9;
-        EXPECT_FALSE(loadFrom(u, b)) << std::hex << bad;
-        EXPECT_EQ(0, u.stampFlag) << "reset runs before the tag is judged";
+        b.u32(documentTag(0)).append(paramsRecord(5)).append(rowsRecord(kFrame, kFrameRowTypes));
+        b.append(stampV1Record()).u8(1).i32(badTag);
+        AllOptions o;
+        EXPECT_FALSE(loadsWhole(o, b)) << badTag;
+    }
+}
+
+TEST(AllOptionsRecord, SaveAndLoadGiveEqualOptions) {
+    AllOptions o, p;
+    ASSERT_TRUE(loadsWhole(o, documentRecord(23, {100, 110, 132})));
+    o.bgTexture.reset(new AColorTexture(AColor(0.5f, 0.25f, 1, 1)));
+    o.refractTexture.reset(new AColorTexture(AColor(1, 0, 0, 0.5f)));
+    o.keptFloat1 = 3.5f; o.stampInfo.fontDescription[7] = 42; o.frameData.worldToCam.offs[2] = 2.5;
+    o.physicalCamera.focal_length.setValue(70, 2.0);
+    // Version 23 with the fields above, textures included, back as they were.
+    const std::vector<std::uint8_t> bytes = savedBytes(o);
+    EXPECT_EQ(RecordBytes().u32(documentTag(23)).bytes(), std::vector<std::uint8_t>(bytes.begin(), bytes.begin() + 4));
+    ASSERT_TRUE(loadsWhole(p, RecordBytes().append(bytes)));
+    EXPECT_EQ(bytes, savedBytes(p));
+    EXPECT_EQ(documentXml(o), documentXml(p));
+}
+
+TEST(AllOptionsRecord, ResetKeepsTheCarriedFloats) {
+    AllOptions o;
+    o.keptFloat1 = 4; o.filterKernel = 9; o.caustics_file = u"x"; o.params.imageSampler_type = 7;
+    o.renderChannels.push_back(111);
+    o.giTexture.reset(new AColorTexture());
+    o.reset();
+    AllOptions fresh;
+    fresh.keptFloat1 = 4;  // everything else as in a new document
+    EXPECT_EQ(savedBytes(fresh), savedBytes(o));
+    EXPECT_EQ(documentXml(fresh), documentXml(o));
+}
+
+TEST(AllOptionsRecord, ShortAndDamagedRecordsNeverCrash) {
+    AllOptions source;
+    ASSERT_TRUE(loadsWhole(source, documentRecord(23, {100, 101, 102})));
+    source.giTexture.reset(new AColorTexture());
+    source.reflectTexture.reset(new InvertTexture());
+    static_cast<InvertTexture&>(*source.reflectTexture).texture.reset(new AColorTexture());
+    const std::vector<std::uint8_t> bytes = savedBytes(source);
+    // Every seventh prefix of the record, then 4 bytes overwritten at every
+    // sixth place with values that make counts, tags and lengths absurd.
+    std::vector<std::vector<std::uint8_t>> damaged;
+    for (std::size_t n = 0; n <= bytes.size(); n += 7) damaged.emplace_back(bytes.begin(), bytes.begin() + n);
+    std::uint32_t seed = 12345;
+    for (std::size_t at = 0; at + 4 <= bytes.size(); at += 6, seed = seed * 1103515245u + 12345u) {
+        damaged.push_back(bytes);
+        std::fill_n(damaged.back().begin() + at, 4, (seed >> 16) & 1 ? 0xFF : static_cast<std::uint8_t>(seed >> 8));
+    }
+    for (const std::vector<std::uint8_t>& d : damaged) {
+        QuickArchive ar(d.data(), d.size());
+        AllOptions o;
+        o.load(ar);
+        documentXml(o);
     }
 }
