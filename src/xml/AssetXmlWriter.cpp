@@ -375,9 +375,10 @@ void AssetXmlWriter::componentLines(const TransformComponents& c) {
     }
 }
 
-void AssetXmlWriter::writeComponentMatrix(const WriterText& name, const TransformComponents& components,
-                                          const WriterText& label) {
-    openParameter(name, "componentMatrix", label, "none", false, "default");
+void AssetXmlWriter::componentParameter(const WriterText& name, const WriterText& type,
+                                        const TransformComponents& components,
+                                        const WriterText& label) {
+    openParameter(name, type, label, "none", false, "default");
     openValue();
     ++indent_;
     componentLines(components);
@@ -386,16 +387,15 @@ void AssetXmlWriter::writeComponentMatrix(const WriterText& name, const Transfor
     closeParameter();
 }
 
+void AssetXmlWriter::writeComponentMatrix(const WriterText& name, const TransformComponents& components,
+                                          const WriterText& label) {
+    componentParameter(name, "componentMatrix", components, label);
+}
+
 void AssetXmlWriter::writeComponentTransform(const WriterText& name,
                                              const TransformComponents& components,
                                              const WriterText& label) {
-    openParameter(name, "componentTransform", label, "none", false, "default");
-    openValue();
-    ++indent_;
-    componentLines(components);
-    --indent_;
-    closeValue();
-    closeParameter();
+    componentParameter(name, "componentTransform", components, label);
 }
 
 void AssetXmlWriter::writePlugin(const WriterText& name, const WriterText& text, const WriterText& label) {

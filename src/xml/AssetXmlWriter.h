@@ -114,6 +114,9 @@ private:
     void writeNumber(double value);
     void vectorBlock(const OrvaneLumoCore::Vector& v);
     void componentLines(const OrvaneLumoCore::TransformComponents& c);
+    void componentParameter(const WriterText& name, const WriterText& type,
+                            const OrvaneLumoCore::TransformComponents& components,
+                            const WriterText& label);
 
     std::u16string& out_;
     int indent_ = 0;

@@ -3,6 +3,7 @@
 import os
 import re
 import shutil
+import subprocess
 import sys
 import tempfile
 import unittest
@@ -57,6 +58,37 @@ class MaterialDocuments(unittest.TestCase):
             shutil.rmtree(tmp)
 
 
+class DocumentSun(unittest.TestCase):
+    SCRIPT = """
+import PyOrvXml, re, sys
+def sun(name):
+    xml = PyOrvXml.getOrvmatXml((sys.argv[1] + '/' + name).decode('utf-8'))
+    return re.search(r'name="sun"[^\\n]*\\n *<value>([^<]*)<', xml).group(1)
+first = sun('textures_sky_document_sun_2.orvmat')
+sun('textures_sky_document_sun_1.orvmat')
+print first + '|' + sun('textures_sky_document_sun_2.orvmat')
+"""
+
+    def test_a_version_3_sky_replaces_the_document_sun_for_later_calls(self):
+        # A fresh interpreter: the document sun lives as long as the process.
+        out = subprocess.check_output([sys.executable, '-c', self.SCRIPT, EXAMPLES],
+                                      env=dict(os.environ, PYTHONPATH=sys.path[0]))
+        before, after = out.strip().split('|')
+        self.assertEqual(before, '/Rhino Document Sun')
+        self.assertNotEqual(after, before)
+        self.assertTrue(after.startswith('/{'), after)
+
+
+class WrappedTrees(unittest.TestCase):
+    def test_wrapped_libraries_load(self):
+        for name in ('materials_wrapped_trees.orvmat', 'materials_folded_wrappers.orvmat',
+                     'materials_old_wrapper_records.orvmat', 'textures_procedural.orvmat',
+                     'textures_procedural_old.orvmat', 'textures_sky_versions.orvmat'):
+            xml = PyOrvXml.getOrvmatXml(example(name))
+            self.assertTrue(xml.startswith(u'<orvmat>\n'), name)
+            self.assertEqual(xml.count(u'<Asset '), xml.count(u'</Asset>'))
+
+
 class OptionsDocuments(unittest.TestCase):
     def test_saved_and_old_files_give_22_blocks(self):
         for name in ('render_settings.orvopt', 'old_settings_v4.luopt'):
@@ -70,9 +102,7 @@ class OptionsDocuments(unittest.TestCase):
         tmp = tempfile.mkdtemp()
         try:
             data = open(os.path.join(EXAMPLES, 'render_settings.orvopt'), 'rb').read()
-            bad = os.path.join(tmp, 'bad.orvopt')
-            open(bad, 'wb').write(data[:4].replace('\x00', '\x7f', 1) + data[4:])
-            # The tag's low half stays 1; only the version changes.
+            # The tag's low half stays 1; the version (15) is one no file has.
             bad_version = os.path.join(tmp, 'badversion.orvopt')
             open(bad_version, 'wb').write('\x01\x00\x0f\x00' + data[4:])
             self.assertEqual(PyOrvXml.getOrvoptXml(bad_version.decode('utf-8')), u'\x01')
