@@ -1,60 +1,80 @@
 #pragma once
-// Helpers of the texture tests: hand-laid record bytes, saved bytes, XML text.
+// Helpers of the texture and light tests: hand-laid record bytes, saved bytes,
+// XML text and golden documents.
 #include <cstdint>
 #include <cstring>
+#include <fstream>
+#include <functional>
+#include <sstream>
 #include <string>
+#include <utility>
 #include <vector>
 
+#include <boost/make_shared.hpp>
+#include <gtest/gtest.h>
+
 #include "persistence/QuickArchive.h"
+#include "persistence/Types.h"
 #include "xml/AssetXmlWriter.h"
 
 namespace textest {
 
-using OrvaneLumoCore::QuickArchive;
+using namespace OrvaneLumoCore;
 
 // Little-endian record bytes, laid out field by field.
 struct Bytes {
     std::vector<std::uint8_t> data;
 
-    Bytes& u8(std::uint8_t v) {
-        data.push_back(v);
-        return *this;
-    }
-    Bytes& u32(std::uint32_t v) {
-        for (int i = 0; i < 4; ++i) data.push_back(static_cast<std::uint8_t>(v >> (8 * i)));
-        return *this;
-    }
+    Bytes& u8(std::uint8_t v) { data.push_back(v); return *this; }
+    Bytes& u32(std::uint32_t v) { for (int s = 0; s < 32; s += 8) u8(std::uint8_t(v >> s)); return *this; }
     Bytes& i32(std::int32_t v) { return u32(static_cast<std::uint32_t>(v)); }
-    Bytes& f32(float f) {
-        std::uint32_t v;
-        std::memcpy(&v, &f, 4);
-        return u32(v);
-    }
+    Bytes& f32(float f) { std::uint32_t v; std::memcpy(&v, &f, 4); return u32(v); }
+    Bytes& f64(double d) { std::uint64_t v; std::memcpy(&v, &d, 8); return u32(std::uint32_t(v)).u32(std::uint32_t(v >> 32)); }
     Bytes& version(int v) { return u32(static_cast<std::uint32_t>(v) << 16); }
-    Bytes& wstr(const std::string& utf8) {
-        u32(static_cast<std::uint32_t>(utf8.size()));
-        data.insert(data.end(), utf8.begin(), utf8.end());
+    Bytes& floats(std::initializer_list<float> fs) { for (float f : fs) f32(f); return *this; }
+    Bytes& ints(std::initializer_list<std::int32_t> is) { for (std::int32_t i : is) i32(i); return *this; }
+    Bytes& flags(std::initializer_list<int> bs) { for (int b : bs) u8(std::uint8_t(b)); return *this; }
+    // wstring: u32 byte length of the UTF-8 form, then the bytes.
+    Bytes& wstr(const std::string& utf8) { u32(std::uint32_t(utf8.size())); data.insert(data.end(), utf8.begin(), utf8.end()); return *this; }
+    // Twelve floats: the three matrix rows, then the offset.
+    Bytes& transform(const Transform& t) {
+        for (const Vector& v : {t.m[0], t.m[1], t.m[2], t.offs}) floats({v.x, v.y, v.z});
         return *this;
     }
-    Bytes& floats(std::initializer_list<float> fs) {
-        for (float f : fs) f32(f);
+    Bytes& identityTransform() { return transform(Transform()); }
+    // AnimatedTransform record: tag 0x10000, key count, time width 8, then
+    // each key as f64 time and transform.
+    Bytes& animated(const std::vector<std::pair<double, Transform>>& keys) {
+        u32(0x10000).u32(std::uint32_t(keys.size())).u32(8);
+        for (const auto& k : keys) f64(k.first).transform(k.second);
         return *this;
     }
-    Bytes& identityTransform() { return floats({1, 0, 0, 0, 1, 0, 0, 0, 1, 0, 0, 0}); }
     // A TransformComponents record: tag, rotation, scale, offset, mirrors.
-    Bytes& components(std::initializer_list<float> nine, int mx, int my, int mz) {
-        version(1);
-        floats(nine);
-        return i32(mx).i32(my).i32(mz);
-    }
+    Bytes& components(std::initializer_list<float> nine, int mx, int my, int mz) { return version(1).floats(nine).ints({mx, my, mz}); }
     Bytes& defaultComponents() { return components({0, 0, 0, 1, 1, 1, 0, 0, 0}, 0, 0, 0); }
-    Bytes& append(const Bytes& o) {
-        data.insert(data.end(), o.data.begin(), o.data.end());
-        return *this;
+    // GenPlanarWorldUVW or GenObjectUVW record: version 1, uvwTransform, components.
+    Bytes& placement() { return version(1).identityTransform().defaultComponents(); }
+    // Required children: a planar generator (tag 0), an AColorTexture (tag 5).
+    Bytes& planar() { return i32(0).placement(); }
+    Bytes& acolor(float r, float g, float b, float a) { return i32(5).version(1).floats({r, g, b, a}); }
+    Bytes& append(const Bytes& o) { data.insert(data.end(), o.data.begin(), o.data.end()); return *this; }
+    // The same bytes with the u32 at `at` replaced.
+    Bytes with(std::size_t at, std::uint32_t v) const {
+        Bytes b(*this);
+        for (int i = 0; i < 4; ++i) b.data.at(at + i) = std::uint8_t(v >> (8 * i));
+        return b;
     }
-
     QuickArchive archive() const { return QuickArchive(data.data(), data.size()); }
 };
+
+// Loads `bytes` into `object`; with `whole`, the load must also read them all.
+template <class T>
+bool loads(T&& object, const Bytes& bytes, bool whole = false) {
+    QuickArchive ar = bytes.archive();
+    const bool ok = object.load(ar);
+    if (whole) EXPECT_EQ(ar.getReadPosition(), bytes.data.size());
+    return ok;
+}
 
 // The bytes an object's save wrote, and whether it succeeded.
 template <class T>
@@ -67,13 +87,40 @@ std::vector<std::uint8_t> savedBytes(const T& object, bool* ok = nullptr) {
     return bytes;
 }
 
-// The XML that writeXml gives on a fresh writer, as UTF-8.
+// The XML that writeXml gives as UTF-8, on a fresh writer or inside an Assets
+// element; the writer's level must come back to where it was.
 template <class T>
-std::string xmlOf(T& object, const std::u16string& url) {
+std::string xmlOf(T& object, const std::u16string& url, bool underAssets = false) {
     std::u16string out;
     AssetXmlWriter writer(out);
+    if (underAssets) writer.openAssets();
+    out.clear();
+    const int level = writer.getIndent();
     object.writeXml(writer, url);
-    return OrvaneLumoCore::wideToUtf8(out);
+    EXPECT_EQ(level, writer.getIndent());
+    return wideToUtf8(out);
+}
+
+// The golden document tests/<path>. EXPECT_EQ of two texts of several lines
+// prints a line-by-line diff.
+inline std::string golden(const std::string& path) {
+    std::ifstream in(std::string(ORVXML_SOURCE_DIR) + "/tests/" + path, std::ios::binary);
+    std::ostringstream text;
+    text << in.rdbuf();
+    EXPECT_FALSE(text.str().empty()) << "no golden document " << path;
+    return text.str();
+}
+
+// isEqual tells `base` from a copy of it with any one of `changes` made.
+template <class T>
+void expectEachChangeSeen(const T& base, std::initializer_list<std::function<void(T&)>> changes) {
+    EXPECT_TRUE(base.isEqual(boost::make_shared<T>(base)));
+    int i = 0;
+    for (const auto& change : changes) {
+        boost::shared_ptr<T> other = boost::make_shared<T>(base);
+        change(*other);
+        EXPECT_FALSE(base.isEqual(other)) << "change " << i++;
+    }
 }
 
 }  // namespace textest
