@@ -2,8 +2,6 @@
 // the sun's registry per writer, copies and comparisons.
 #include <gtest/gtest.h>
 
-#include <tuple>
-
 #include "LightFixtures.h"
 #include "lights/LocalLights.h"
 #include "lights/SunIesDome.h"
@@ -12,13 +10,6 @@ using namespace OrvaneLumoCore;
 using namespace lighttest;
 
 namespace {
-
-template <class T = BaseLight>
-boost::shared_ptr<T> loaded(const Bytes& bytes, std::int32_t tag = T::kType) {
-    boost::shared_ptr<T> light = boost::static_pointer_cast<T>(createLight(tag));
-    EXPECT_TRUE(loads(*light, bytes, true));
-    return light;
-}
 
 struct Newest {
     std::int32_t tag;
@@ -34,15 +25,10 @@ const std::vector<Newest>& newest() {
     return rows;
 }
 
-// The newest record of `tag` without its last `drop` bytes, under `version`.
-Bytes cut(std::int32_t tag, std::size_t drop, int version) {
-    for (const Newest& n : newest())
-        if (n.tag == tag) {
-            Bytes b = n.bytes.with(0, std::uint32_t(version) << 16);
-            b.data.resize(b.data.size() - drop);
-            return b;
-        }
-    return Bytes();
+// `bytes` without their last `drop` bytes, under `version`.
+Bytes cut(Bytes bytes, std::size_t drop, int version) {
+    bytes.data.resize(bytes.data.size() - drop);
+    return bytes.with(0, std::uint32_t(version) << 16);
 }
 
 }  // namespace
@@ -50,7 +36,7 @@ Bytes cut(std::int32_t tag, std::size_t drop, int version) {
 TEST(LightXml, GoldenAssets) {
     for (const Newest& n : newest()) {
         SCOPED_TRACE(n.golden);
-        LightPtr light = loaded(n.bytes, n.tag);
+        LightPtr light = loaded<BaseLight>(n.bytes, createLight(n.tag));
         // A sun under an empty url stands at "/" and its id.
         EXPECT_EQ(golden(std::string("lights/golden/") + n.golden), xmlOf(*light, n.tag == 5 ? u"" : u"/Scene", true));
     }
@@ -110,28 +96,22 @@ TEST(SunXml, TransformIsTheValueAtTimeZero) {
     EXPECT_EQ(xml.find("<x>20</x>"), std::string::npos);
 }
 
-TEST(LightFactory, MakesTheClassesOfTheFamily) {
+TEST(LightFactory, TagsWithoutAClassGiveNull) {
     for (std::int32_t tag : {-1, 1, 8, 9}) EXPECT_FALSE(createLight(tag)) << tag;
-    for (std::int32_t tag : {0, 2, 3, 4, 5, 6, 7}) {
-        EXPECT_EQ(createLight(tag)->getType(), std::uint32_t(tag));
-        EXPECT_EQ(createLight(tag)->getAssetType(), u"light");
-    }
     EXPECT_EQ(DomeLight().getType(), 8u);
 }
 
 TEST(LightRecords, NewestVersionsGoBackByteForByte) {
     for (const Newest& n : newest()) {
         SCOPED_TRACE(n.tag);
-        LightPtr light = loaded(n.bytes, n.tag);
+        LightPtr light = loaded<BaseLight>(n.bytes, createLight(n.tag));
         EXPECT_EQ(savedBytes(*light), n.bytes.data);
-        LightPtr again = loaded(Bytes{savedBytes(*light)}, n.tag);
-        EXPECT_TRUE(light->isEqual(again));
         EXPECT_TRUE(light->isEqual(light->clone()) || n.tag == 5);  // a sun's clone has a new id
         EXPECT_FALSE(light->isEqual(createLight(n.tag)) || light->isEqual(LightPtr()));
     }
     for (std::int32_t tag : {0, 2, 3, 4, 5, 6, 7}) {
         LightPtr light = createLight(tag);
-        EXPECT_TRUE(light->isEqual(loaded(Bytes{savedBytes(*light)}, tag))) << tag;
+        EXPECT_TRUE(light->isEqual(loaded<BaseLight>(Bytes{savedBytes(*light)}, createLight(tag)))) << tag;
     }
     DomeLight dome;
     EXPECT_EQ(savedBytes(dome), (std::vector<std::uint8_t>{0, 0, 1, 0}));
@@ -145,21 +125,18 @@ TEST(LightRecords, RefusedRecords) {
     records.push_back({7, Bytes{savedBytes(SphereLight())}, ""});
     for (const Newest& n : records) {
         const std::uint32_t tag = std::uint32_t(n.bytes.data[2]) << 16;
-        for (std::uint32_t bad : {0u, tag | 1, tag + 0x10000}) EXPECT_FALSE(loads(*createLight(n.tag), n.bytes.with(0, bad))) << n.tag;
-        EXPECT_FALSE(loads(*createLight(n.tag), Bytes())) << n.tag;
-        // Every prefix loads without a crash.
-        for (std::size_t len = 0; len < n.bytes.data.size(); ++len) {
-            QuickArchive ar(n.bytes.data.data(), len);
-            createLight(n.tag)->load(ar);
-        }
+        for (std::uint32_t bad : {0u, tag | 1, tag + 0x10000})
+            EXPECT_FALSE(loads(*createLight(n.tag), n.bytes.with(0, bad))) << n.tag << " " << bad;
+        auto make = [&] { return createLight(n.tag); };
+        expectDamageHandled(loaded<BaseLight>(n.bytes, make()), n.bytes, make);
     }
     DomeLight dome;
     EXPECT_FALSE(loads(dome, Bytes()));
     // Transform records that don't load: a direct light's whose tag is of a
     // version 2, one that announces more keys than the archive holds, and a
     // sun's of version 2.
-    EXPECT_FALSE(loads(MayaDirectLight(), cut(0, 124, 4).u32(0x20000)));
-    EXPECT_FALSE(loads(MayaDirectLight(), cut(0, 124, 4).u32(0x10000).u32(0x7FFFFFFF).u32(8)));
+    EXPECT_FALSE(loads(MayaDirectLight(), cut(directV4(), 124, 4).u32(0x20000)));
+    EXPECT_FALSE(loads(MayaDirectLight(), cut(directV4(), 124, 4).u32(0x10000).u32(0x7FFFFFFF).u32(8)));
     EXPECT_FALSE(loads(SunLight(), sunV4().with(sunV4().data.size() - 124, 0x20000)));
 }
 
@@ -167,20 +144,21 @@ TEST(LightRecords, RefusedRecords) {
 // version with the defaults of the fields they lack.
 TEST(LightRecords, OldVersionsSaveAsTheNewest) {
     const Transform ct1 = countingTransform(1), ct3 = countingTransform(3), ct4 = countingTransform(4);
-    const Transform ct5 = countingTransform(5);
+    const Transform ct5 = countingTransform(5), ct2 = countingTransform(2);
     // SpotLight 1: color, shadowBias, decay, intensity, storedFactor,
     // photonSubdivs, causticSubdivs, storedMode, enabled. 2: then shadows,
     // shadowSubdivs, shadowRadius, transform, coneAngle, penumbraAngle.
     const Bytes spot = Bytes().floats({0.5f, 0.5f, 0.25f, 0.1f, 2, 7, 0.5f}).ints({11, 12, 1}).u8(0);
-    const Bytes spot4 = Bytes().version(4).floats({0.5f, 0.5f, 0.25f, 0, 0, 0, 0.005f, 20, 20, 20, 20, 0.1f, 2, 7, 0.5f})
-                            .ints({0, 11, 12, 1}).flags({0, 0});
+    const Bytes spot4 = Bytes().version(4).floats({0.5f, 0.5f, 0.25f, 0, 0, 0, 0.005f, 20, 20, 20, 20})
+                            .floats({0.1f, 2, 7, 0.5f}).ints({0, 11, 12, 1}).flags({0, 0});
     // RectangleLight 2: color, shadowBias, intensity, storedFactor, subdivs,
     // causticSubdivs, photonSubdivs, storedMode, doubleSided, invisible,
     // lightPortal, noDecay, enabled, storeWithIrradianceMap,
     // ignoreLightNormals, shadows, transform, u_size, v_size. 1: up to
     // ignoreLightNormals.
     const Bytes rect = Bytes().floats({0.5f, 0.5f, 0.5f, 0.01f, 40, 1.5f}).ints({6, 1001, 501, 2});
-    const Bytes rect4 = Bytes().version(4).floats({0.5f, 0.5f, 0.5f, 0, 0, 0, 0.005f, 0.01f, 40, 1.5f}).ints({0, 6, 1001, 501, 2});
+    const Bytes rect4 =
+        Bytes().version(4).floats({0.5f, 0.5f, 0.5f, 0, 0, 0, 0.005f, 0.01f, 40, 1.5f}).ints({0, 6, 1001, 501, 2});
     // MayaDirectLight 1: color, shadowBias, intensity, storedFactor,
     // causticSubdivs, photonSubdivs, storedMode, enabled. 2: then shadows,
     // shadowSubdivs, shadowRadius and a plain transform, which becomes the key
@@ -193,32 +171,34 @@ TEST(LightRecords, OldVersionsSaveAsTheNewest) {
     const Bytes sun = Bytes(sunSet).u8(1).wstr("abc").wstr("Evening");
     // SphereLight 1: transform, color, shadowColor, four reals, four ints,
     // five flags; 2 holds all eight.
-    const Bytes sphere = Bytes().transform(countingTransform(2)).floats({0.5f, 0.5f, 0.5f, 0.1f, 0.1f, 0.1f, 1, 2, 3, 4}).ints({5, 6, 7, 8});
-    const struct {
-        std::int32_t tag;
-        Bytes old, saved;
-    } cases[] = {
-        {4, Bytes().version(1).append(spot), Bytes(spot4).flags({1}).i32(8).f32(0).identityTransform().floats({1, 0}).flags({1, 1})},
+    const Bytes sphere =
+        Bytes().transform(ct2).floats({0.5f, 0.5f, 0.5f, 0.1f, 0.1f, 0.1f, 1, 2, 3, 4}).ints({5, 6, 7, 8});
+    const struct { std::int32_t tag; Bytes old, saved; } cases[] = {
+        {4, Bytes().version(1).append(spot),
+         Bytes(spot4).flags({1}).i32(8).f32(0).transform(Transform()).floats({1, 0}).flags({1, 1})},
         {4, Bytes().version(2).append(spot).u8(0).i32(4).f32(0.25f).transform(ct3).floats({0.5f, 0.1f}),
          Bytes(spot4).flags({0}).i32(4).f32(0.25f).transform(ct3).floats({0.5f, 0.1f}).flags({1, 1})},
         {3, Bytes().version(1).append(rect).flags({0, 1, 0, 1, 0, 0, 1}),
-         Bytes(rect4).flags({0, 1, 0, 1, 0, 0, 1, 1}).identityTransform().floats({1, 1}).flags({1, 1, 1})},
+         Bytes(rect4).flags({0, 1, 0, 1, 0, 0, 1, 1}).transform(Transform()).floats({1, 1}).flags({1, 1, 1})},
         {3, Bytes().version(2).append(rect).flags({1, 0, 1, 0, 1, 1, 0, 0}).transform(ct1).floats({4, 5}),
          Bytes(rect4).flags({1, 0, 1, 0, 1, 1, 0, 0}).transform(ct1).floats({4, 5}).flags({1, 1, 1})},
         // OmniLight 3: version 4 without affectDiffuse and affectSpecular.
-        {2, cut(2, 2, 3), cut(2, 2, 4).flags({1, 1})},
+        {2, cut(omniV4(), 2, 3), cut(omniV4(), 2, 4).flags({1, 1})},
         {0, Bytes().version(1).append(direct), Bytes(direct4).u8(1).i32(8).f32(0).animated({{0, Transform()}})},
         {0, Bytes().version(2).append(direct).u8(0).i32(3).f32(0.5f).transform(ct4),
          Bytes(direct4).u8(0).i32(3).f32(0.5f).animated({{0, ct4}})},
         {0, Bytes().version(3).append(direct).u8(1).i32(3).f32(0.5f).animated({{1, ct4}, {2, countingTransform(8)}}),
          Bytes(direct4).u8(1).i32(3).f32(0.5f).animated({{1, ct4}, {2, countingTransform(8)}})},
-        {5, Bytes().version(2).transform(ct5).append(sun), Bytes().version(4).append(sun).flags({1, 0}).animated({{0, ct5}})},
-        {5, Bytes().version(3).transform(ct5).append(sun).flags({0, 1}), Bytes().version(4).append(sun).flags({0, 1}).animated({{0, ct5}})},
+        {5, Bytes().version(2).transform(ct5).append(sun),
+         Bytes().version(4).append(sun).flags({1, 0}).animated({{0, ct5}})},
+        {5, Bytes().version(3).transform(ct5).append(sun).flags({0, 1}),
+         Bytes().version(4).append(sun).flags({0, 1}).animated({{0, ct5}})},
         // IESLight 1: version 3 without affectDiffuse, affectSpecular and
         // intensity; 2: without intensity.
-        {6, cut(6, 6, 1), cut(6, 6, 3).flags({1, 1}).f32(1)},
-        {6, cut(6, 4, 2), cut(6, 4, 3).f32(1)},
-        {7, Bytes().version(1).append(sphere).flags({0, 0, 1, 1, 1}), Bytes().version(2).append(sphere).flags({0, 0, 1, 1, 1, 1, 1, 1})},
+        {6, cut(iesV3(), 6, 1), cut(iesV3(), 6, 3).flags({1, 1}).f32(1)},
+        {6, cut(iesV3(), 4, 2), cut(iesV3(), 4, 3).f32(1)},
+        {7, Bytes().version(1).append(sphere).flags({0, 0, 1, 1, 1}),
+         Bytes().version(2).append(sphere).flags({0, 0, 1, 1, 1, 1, 1, 1})},
     };
     for (const auto& c : cases) {
         SCOPED_TRACE(c.tag);
@@ -233,15 +213,6 @@ TEST(LightRecords, OldVersionsSaveAsTheNewest) {
     EXPECT_EQ(s1->id.size(), 36u);
     EXPECT_EQ(savedBytes(*s1), Bytes().version(4).append(sunSet).u8(0).wstr(wideToUtf8(s1->id)).wstr("").flags({1, 0})
                                    .animated({{0, ct5}}).data);
-}
-
-TEST(LightCompare, AnyFieldMakesADifference) {
-    boost::shared_ptr<SpotLight> a = loaded<SpotLight>(spotV4());
-    expectEachChangeSeen<SpotLight>(*a, {
-        [](SpotLight& s) { s.storedFactor = 9; },  // in the record, not in XML
-        [](SpotLight& s) { s.storedMode = 9; }, [](SpotLight& s) { s.barnDoorBottom = 1; },
-        [](SpotLight& s) { s.transform.offs.z = 1; }, [](SpotLight& s) { s.affectSpecular = !s.affectSpecular; }});
-    EXPECT_FALSE(a->isEqual(createLight(2)));
 }
 
 TEST(LightCompare, FilePathsIgnoreCaseSunIdsDoNot) {
@@ -271,12 +242,10 @@ TEST(LightCompare, SunCloneAndResetGiveANewId) {
 }
 
 TEST(DocumentSun, IsTheDefaultNamedSun) {
-    const SunLightPtr& sun = documentSun();
-    ASSERT_TRUE(sun);
-    EXPECT_EQ(sun.get(), documentSun().get());
-    EXPECT_EQ(sun->name, u"Default");
-    EXPECT_EQ(sun->id, u"{D3BE9766-E4AA-418b-81A9-23414A2BA98D}");
+    EXPECT_EQ(documentSun().get(), documentSun().get());
+    EXPECT_EQ(documentSun()->name, u"Default");
+    EXPECT_EQ(documentSun()->id, u"{D3BE9766-E4AA-418b-81A9-23414A2BA98D}");
+    // The id compares without regard to case, braces included.
     EXPECT_TRUE(isDocumentSunId(u"{d3be9766-e4aa-418B-81a9-23414a2ba98d}"));
     EXPECT_FALSE(isDocumentSunId(u"D3BE9766-E4AA-418b-81A9-23414A2BA98D"));
-    EXPECT_TRUE(sunSettingsEqual(*sun, SunSettings()));
 }
