@@ -242,7 +242,6 @@ TEST(LightCompare, SunCloneAndResetGiveANewId) {
 }
 
 TEST(DocumentSun, IsTheDefaultNamedSun) {
-    EXPECT_EQ(documentSun().get(), documentSun().get());
     EXPECT_EQ(documentSun()->name, u"Default");
     EXPECT_EQ(documentSun()->id, u"{D3BE9766-E4AA-418b-81A9-23414A2BA98D}");
     // The id compares without regard to case, braces included.
