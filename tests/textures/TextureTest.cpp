@@ -1,0 +1,334 @@
+// Records of every texture, UVW generator and bitmap class, against golden
+// documents; the XML of textures built in code; the composed matrices.
+#include <cmath>
+#include <functional>
+#include <tuple>
+
+#include <gtest/gtest.h>
+
+#include "TextureTestUtil.h"
+#include "textures/BasicTextures.h"
+#include "textures/Bitmaps.h"
+#include "textures/ProceduralTextures.h"
+#include "textures/TextureFrame.h"
+#include "textures/UVWGenerators.h"
+
+using namespace OrvaneLumoCore;
+using namespace textest;
+
+namespace {
+
+// The newest record of every class with a distinct value in each field, as a
+// texture (generators in a UVWTexture, the buffer in a BitmapTexture), and
+// the offsets of a child's tag and of a nested record's version tag (0: none).
+struct Row {
+    int tag;
+    Bytes bytes;
+    const char* golden;
+    std::size_t child, inner;
+    std::function<void(BaseTexture&)> deepChange = nullptr;  // of a copy, leaving the original as it was
+};
+
+std::vector<Row> rows() {
+    const Bytes buffer = Bytes().version(1).i32(2).f32(0.5f).f32(2.2f).wstr("C:\\maps\\\xC3\xA9t\xC3\xA9.png");
+    return {
+        // FresnelTexture 2: whiteInverse, blackInverse, fresnel_ior, refract_ior,
+        // four multipliers, four optional children. The second child is
+        // BlendTexture 2 (color_a, color_b: optional children, each with its
+        // multiplier behind it if present; blend_amount) without color_a.
+        {1, Bytes().version(2).floats({0.1f, 0.2f, 0.3f, 0.4f, 0.5f, 0.6f, 1.3f, 1.7f, 2, 3, 4, 5}).u8(0)
+             .u8(1).i32(10).version(2).u8(0).u8(1).acolor(0, 0, 1, 1).f32(0.25f).f32(0.125f)
+             .u8(0).u8(1).acolor(1, 1, 0, 0), "fresnel.xml", 54, 58, [](BaseTexture& t) {
+             auto& blend = static_cast<BlendTexture&>(*static_cast<FresnelTexture&>(t).refraction_tex);
+             static_cast<AColorTexture&>(*blend.color_b).color.a = 0; }},
+        {10, Bytes().version(2).u8(1).acolor(1, 0, 0, 1).f32(2).u8(1).acolor(0, 0, 1, 1).f32(0.25f).f32(0.125f),
+         "blend.xml", 5, 9},
+        // InvertTexture 1: texture (tag and record), invert_alpha.
+        {9, Bytes().version(1).acolor(1, 1, 1, 1).u8(1), "invert.xml", 4, 8},
+        // AColorTexture 1: the acolor.
+        {5, Bytes().version(1).floats({0.25f, 0.5f, 0.75f, 0.125f}), "acolor.xml", 0, 0},
+        // UVWTexture 1: generator tag and record. GenPlanarWorldUVW and
+        // GenObjectUVW 1: uvwTransform, components record.
+        {2, Bytes().version(1).i32(0).version(1).floats({1, 0, 0, 0, 1, 0, 0, 0, 1, 7, 8, 9})
+             .components({0, 0, 0, 2, 2, 2, 1, 1, 1}, 0, 0, 0), "uvw_planar.xml", 4, 60},
+        {2, Bytes().version(1).i32(1).version(1).floats({1, 0, 0, 0, 1, 0, 0, 0, 1, 7, 8, 9})
+             .components({0, 0, 0, 2, 3, 4, 1, 1, 1}, 1, 0, 0), "uvw_object.xml", 4, 8, [](BaseTexture& t) {
+             static_cast<GenObjectUVW&>(*static_cast<UVWTexture&>(t).uvw).uvwComponents.offset.z = 9; }},
+        // GenEnvironmentUVW 2: uvw_matrix, mapping_type, components record.
+        {2, Bytes().version(1).i32(3).version(2).floats({0, 1, 0, 1, 0, 0, 0, 0, -1}).i32(0)
+             .components({0, 0, 45, 1, 1, 1, 0, 0, 0}, 0, 1, 0), "uvw_environment.xml", 4, 8},
+        // GenChannelUVW 2: uvwTransform, texTransform, wrap_u, wrap_v,
+        // uvw_channel, uvwComponents, texComponents. XML shows the components.
+        {2, Bytes().version(1).i32(4).version(2).floats({1, 2, 3, 4, 5, 6, 7, 8, 9, 10, 11, 12})
+             .floats({3, 0, 0, 0, 3, 0, 0, 0, 3, 100, 100, 100}).ints({1, 0, 2})
+             .components({10, 20, 30, 1, 2, 3, 4, 5, 6}, 1, 0, 1)
+             .components({15, 25, 35, 1, 2, 3, 4, 5, 6}, 1, 0, 0), "uvw_channel.xml", 4, 8},
+        // BitmapTexture 1: uvw tag, bitmap tag, uvw record, bitmap record,
+        // tile. BitmapBuffer 1: filter_type, filter_blur, gamma, file.
+        {0, Bytes().version(1).ints({0, 0}).placement().append(buffer).u8(0), "bitmap.xml", 8, 116,
+         [](BaseTexture& t) { static_cast<BitmapBuffer&>(*static_cast<BitmapTexture&>(t).bitmap).gamma = 3; }},
+        // RampTexture 1: uvw, colors, positions, u_wave, v_wave, type, interpolation.
+        {11, Bytes().version(1).planar().acolor(0.5f, 0.25f, 0.75f, 1).floats({0.25f, 0.5f, 0.75f}).ints({2, 3}),
+         "ramp.xml", 4, 116},
+        // BulgeTexture 1: uvw, u_width, v_width.
+        {8, Bytes().version(1).planar().floats({0.2f, 0.3f}), "bulge.xml", 4, 8},
+        // GridTexture 2: uvw, line_color, fill_color, lineColorMult,
+        // fillColorMult, u_width, v_width.
+        {6, Bytes().version(2).planar().acolor(1, 0, 0, 1).acolor(0, 1, 0, 0.5f)
+             .floats({0.5f, 0.25f, 0.05f, 0.15f}), "grid.xml", 4, 116,
+         [](BaseTexture& t) { static_cast<AColorTexture&>(*static_cast<GridTexture&>(t).fill_color).color.r = 3; }},
+        // ClothTexture 2: uvw, gap_color, u_color, v_color, u_width, v_width, tile.
+        {7, Bytes().version(2).planar().floats({0.1f, 0.2f, 0.3f, 0.4f, 0.5f, 0.6f, 0.7f, 0.8f, 0.9f, 1})
+             .floats({0.125f, 0.25f, 0.2f, 0.4f}).u8(0), "cloth.xml", 4, 8},
+        // NoiseTexture 1: uvw, color1_tex (present), color2_tex (absent), color1,
+        // color2, ten reals (persistence to color2_tex_mult), octaves,
+        // noiseType, inflection.
+        {3, Bytes().version(1).planar().u8(1).acolor(0.2f, 0.4f, 0.6f, 0.8f).u8(0)
+             .floats({0.9f, 0.8f, 0.7f, 0.1f, 0.2f, 0.3f, 0.5f, 1.5f, 2.5f, 3, 4, 5, 0.25f, 0.125f, 0.75f, 0.875f})
+             .ints({4, 1, 1}), "noise.xml", 113, 117},
+        // CheckerTexture 2: uvw, white_color, black_color, tile_u, tile_v,
+        // whiteColorMult, blackColorMult.
+        {4, Bytes().version(2).planar().acolor(0.9f, 0.9f, 0.9f, 1).acolor(0.1f, 0.1f, 0.1f, 1)
+             .u8(0).u8(1).floats({0.5f, 2}), "checker.xml", 4, 116},
+    };
+}
+
+TexturePtr acolor(float r, float g, float b, float a) { return TexturePtr(new AColorTexture(AColor(r, g, b, a))); }
+
+// Rotation, scale, offset, then the mirror flags.
+TransformComponents components(Bytes::Floats nine, int mx = 0, int my = 0, int mz = 0) {
+    TransformComponents c;
+    loads(c, Bytes().components(nine, mx, my, mz));
+    return c;
+}
+
+// A node of another family written through the same frame: its own url, one texture slot.
+class LayerLike : public OrvaneXMLSerializable {
+public:
+    void writeXml(AssetXmlWriter& w, std::u16string url) override {
+        TextureFrame frame(w, *this, url + u"/Layer 1", UrlIs::Own);
+        const SlotRef color = frame.slot(colorTex, u"color_texture");
+        frame.open();
+        frame.writeRef("color_tex", color);
+        frame.close();
+    }
+    std::u16string getPluginName() const override { return u"BRDFDiffuse"; }
+    std::u16string getAssetType() const override { return u"BRDF"; }
+    TexturePtr colorTex = acolor(1, 1, 1, 1);
+};
+
+}  // namespace
+
+TEST(TextureRecords, NewestVersionsRoundTripAndMatchTheirGoldens) {
+    for (const Row& r : rows()) {
+        SCOPED_TRACE(r.golden);
+        TexturePtr t = createTexture(r.tag);
+        ASSERT_TRUE(loads(*t, r.bytes, true));
+        bool ok = false;
+        ASSERT_EQ(savedBytes(*t, &ok), r.bytes.data);  // so that deepChange finds what it changes
+        EXPECT_TRUE(ok);
+        TexturePtr copy = t->clone();
+        EXPECT_TRUE(t->isEqual(copy));
+        if (r.deepChange) r.deepChange(*copy);
+        EXPECT_EQ(!r.deepChange, t->isEqual(copy));
+        EXPECT_FALSE(t->isEqual(createTexture(r.tag)) || t->isEqual(TexturePtr()));
+        const std::string xml = xmlOf(*t, u"/M");
+        EXPECT_EQ(golden(std::string("textures/golden/") + r.golden), xml);
+        EXPECT_EQ(xml, xmlOf(*t, u"/M"));
+    }
+}
+
+TEST(TextureRecords, DamagedRecordsAreRefusedOrFailQuietly) {
+    for (const Row& r : rows()) {
+        SCOPED_TRACE(r.golden);
+        // Version tags: version 0, low half set, newer than the newest.
+        for (std::size_t at : {std::size_t(0), r.inner}) {
+            const std::uint32_t tag = std::uint32_t(r.bytes.data[at + 2]) << 16;
+            for (std::uint32_t bad : {0u, tag | 1, tag + 0x10000, 0xFFFFFFFFu})
+                EXPECT_FALSE(loads(*createTexture(r.tag), r.bytes.with(at, bad))) << at << " " << std::hex << bad;
+        }
+        // A child tag that no factory knows; in the bitmap, also a generator's (2).
+        EXPECT_FALSE(r.child && loads(*createTexture(r.tag), r.bytes.with(r.child, 13)));
+        EXPECT_FALSE(r.tag == 0 && loads(*createTexture(r.tag), r.bytes.with(4, 2)));
+        expectDamageHandled(loaded<BaseTexture>(r.bytes, createTexture(r.tag)), r.bytes,
+                            [&] { return createTexture(r.tag); });
+    }
+}
+
+TEST(TextureRecords, NestingDepthIsBounded) {
+    // InvertTextures n deep: version 1 and tag 9 n times, an AColorTexture, n + 1 invert_alpha flags.
+    auto chain = [](int n) {
+        Bytes b = Bytes().version(1);
+        for (int i = 0; i < n; ++i) b.i32(9).version(1);
+        b.acolor(1, 1, 1, 1);
+        for (int i = 0; i <= n; ++i) b.u8(0);
+        return b;
+    };
+    EXPECT_TRUE(loads(*createTexture(9), chain(200)));
+    EXPECT_FALSE(loads(*createTexture(9), chain(100000)));
+    // Grids as line_color of grids: version 2, the generator, tag 6.
+    Bytes grids;
+    for (int level = 0; level < 100000; ++level) grids.version(2).planar().i32(6);
+    EXPECT_FALSE(loads(*createTexture(6), grids));
+}
+
+// An old record, read over an object that held the newest one, saves as the
+// newest version with the defaults of the fields it lacks.
+TEST(TextureRecords, OldVersionsSaveAsTheNewest) {
+    const Bytes fresnel = Bytes().floats({0.1f, 0.2f, 0.3f, 0.4f, 0.5f, 0.6f, 1.3f, 1.7f});
+    const Bytes cloth = Bytes().floats({0, 0, 0, 1, 0, 0, 0, 1, 0, 0, 0, 1, 0.2f, 0.3f});
+    const Bytes gridV1 = Bytes().version(1).planar().acolor(1, 0, 0, 1).acolor(0, 1, 0, 1);
+    const Bytes unit = Bytes().floats({1, 0, 0, 0, 1, 0, 0, 0, 1});
+    const Bytes scaled = Bytes().floats({2, 0, 0, 0, 2, 0, 0, 0, 2, 4, 5, 6}).transform(Transform());
+    const Bytes checker = Bytes().i32(1).placement().i32(3).append(rows()[13].bytes).acolor(0, 0, 1, 1).flags({1, 0});
+    const struct { int tag; Bytes old, newest; } cases[] = {
+        // FresnelTexture 1: whiteInverse, blackInverse, fresnel_ior, refract_ior.
+        {1, Bytes().version(1).append(fresnel),
+         Bytes().version(2).append(fresnel).floats({1, 1, 1, 1}).flags({0, 0, 0, 0})},
+        // BlendTexture 1: color_a, color_b (no multipliers), blend_amount; saved, an absent child has none.
+        {10, Bytes().version(1).u8(0).u8(1).acolor(0, 1, 0, 1).f32(0.75f),
+         Bytes().version(2).u8(0).u8(1).acolor(0, 1, 0, 1).f32(1).f32(0.75f)},
+        // GenChannelUVW 1: uvwTransform, texTransform, tex x and y rotation, tex x
+        // and y mirror, wrap_u, wrap_v, uvw_channel.
+        {2, Bytes().version(1).i32(4).version(1).append(scaled).floats({30, 45}).ints({1, 0, 1, 2, 3}),
+         Bytes().version(1).i32(4).version(2).append(scaled).ints({1, 2, 3}).defaultComponents()
+             .components({30, 45, 0, 1, 1, 1, 0, 0, 0}, 1, 0, 0)},
+        // GenEnvironmentUVW 1: uvw_matrix, mapping_type, z rotation, x rotation,
+        // z mirror, x mirror.
+        {2, Bytes().version(1).i32(3).version(1).append(unit).i32(3).floats({10, 20}).ints({1, 0}),
+         Bytes().version(1).i32(3).version(2).append(unit).i32(3).components({20, 0, 10, 1, 1, 1, 0, 0, 0}, 0, 0, 1)},
+        // GridTexture 1: uvw, line_color, fill_color, u_width, v_width.
+        {6, Bytes(gridV1).floats({0.3f, 0.4f}), Bytes(gridV1).with(0, 0x20000).floats({1, 1, 0.3f, 0.4f})},
+        // ClothTexture 1: as 2 without tile; both directions tile.
+        {7, Bytes().version(1).planar().append(cloth), Bytes().version(2).planar().append(cloth).u8(1)},
+        // CheckerTexture 1: uvw, white_color, black_color, tile_u, tile_v; here an
+        // object generator and a noise texture.
+        {4, Bytes().version(1).append(checker), Bytes().version(2).append(checker).floats({1, 1})},
+    };
+    for (const auto& c : cases) {
+        SCOPED_TRACE(c.tag);
+        TexturePtr t = createTexture(c.tag);
+        for (const Row& r : rows())
+            if (r.tag == c.tag) loads(*t, r.bytes);
+        ASSERT_TRUE(loads(*t, c.old, true));
+        EXPECT_EQ(savedBytes(*t), c.newest.data);
+    }
+}
+
+TEST(TextureRecords, SaveWithoutARequiredChildWritesNothing) {
+    std::vector<TexturePtr> cases;
+    for (int tag : {0, 2, 3, 6, 7, 8, 9, 11}) cases.push_back(createTexture(tag));  // no children
+    auto ramp = boost::make_shared<RampTexture>();   // without colors
+    auto grid = boost::make_shared<GridTexture>();   // without fill_color
+    auto checker = boost::make_shared<CheckerTexture>();
+    auto bitmapOnly = boost::make_shared<BitmapTexture>(), uvwOnly = boost::make_shared<BitmapTexture>();
+    ramp->uvw = grid->uvw = createUVW(0);
+    grid->line_color = createTexture(5);
+    checker->black_color.reset();
+    bitmapOnly->bitmap = createBitmap(0);
+    uvwOnly->uvw = createUVW(4);
+    cases.insert(cases.end(), {ramp, grid, checker, bitmapOnly, uvwOnly});
+    for (const TexturePtr& t : cases) {
+        bool ok = true;
+        EXPECT_TRUE(savedBytes(*t, &ok).empty()) << t->getType();
+        EXPECT_FALSE(ok) << t->getType();
+    }
+}
+
+TEST(TextureFactory, TagsAndComparisons) {
+    for (int tag = 0; tag <= 12; ++tag) EXPECT_EQ(createTexture(tag)->getType(), std::uint32_t(tag));
+    for (int tag : {-1, 13, 1 << 20}) EXPECT_FALSE(createTexture(tag)) << tag;
+    for (int tag : {-1, 2, 5}) EXPECT_FALSE(createUVW(tag)) << tag;
+    for (int tag : {-1, 1}) EXPECT_FALSE(createBitmap(tag)) << tag;
+    // Same fields, other class; a buffer's file compares without regard to case.
+    EXPECT_FALSE(GenPlanarWorldUVW().isEqual(createUVW(1)));
+    BitmapBuffer a;
+    a.file = u"C:\\Maps\\Wood.PNG";
+    auto b = boost::make_shared<BitmapBuffer>(a);
+    b->file = u"c:\\maps\\wood.png";
+    EXPECT_TRUE(a.isEqual(b));
+}
+
+TEST(TextureXml, Goldens) {
+    // The first slot feeds black_color_tex, the second white_color_tex; the
+    // colours shown are the complements, clamped at 0.
+    auto crossover = boost::make_shared<FresnelTexture>();
+    crossover->whiteInverse = Color(1.5f, 0.25f, -1.0f);
+    crossover->reflection_tex = acolor(1, 0, 0, 1);
+    crossover->refraction_tex = acolor(0, 1, 0, 1);
+    // The multipliers don't reach the XML; the url is escaped.
+    auto oneChild = boost::make_shared<BlendTexture>();
+    oneChild->color_b = acolor(0.5f, 1, 1e6f, 0.0001f);
+    oneChild->colorBMult = 4;
+    oneChild->blend_amount = 0.25f;
+    // A child held in two slots is written under each.
+    auto sharedChild = boost::make_shared<BlendTexture>();
+    sharedChild->color_a = sharedChild->color_b = acolor(1, 1, 1, 1);
+    TexturePtr bitmap = makeBitmapTextureFromPath(u"C:\\tex\\a<b>&amp;c.png");
+    auto& bt = dynamic_cast<BitmapTexture&>(*bitmap);
+    EXPECT_TRUE(bt.tile);
+    bt.tile = false;
+    auto& ch = dynamic_cast<GenChannelUVW&>(*bt.uvw);
+    ch.uvw_channel = 2;
+    ch.texComponents.scale = Vector(2, 1, 1);
+    ch.texComponents.offset = Vector(1, 2, 3.5f);
+    auto& buffer = dynamic_cast<BitmapBuffer&>(*bt.bitmap);
+    EXPECT_EQ(buffer.gamma, 1.0f);
+    buffer.gamma = 2.2f;
+    auto uvw = boost::make_shared<UVWTexture>();
+    auto env = boost::make_shared<GenEnvironmentUVW>();
+    env->uvwComponents = components({0, 0, 45.5f, 1, 1, 2, 0, 0, 0}, 0, 0, 1);
+    env->mapping_type = 3;
+    uvw->uvw = env;
+    const std::tuple<const char*, TexturePtr, const char16_t*> cases[] = {
+        {"fresnel_defaults.xml", createTexture(1), u"/M"}, {"fresnel_crossover.xml", crossover, u"/M"},
+        {"blend_one_child.xml", oneChild, u"/A&B"},         {"blend_shared_child.xml", sharedChild, u"/M"},
+        {"bitmap_from_path.xml", bitmap, u"/Wood"},         {"uvw_environment_mirror_ball.xml", uvw, u"/M"},
+        // The three default children of a new checker; a new grid refers to nothing.
+        {"checker_fresh.xml", createTexture(4), u"/M"},     {"grid_fresh.xml", createTexture(6), u"/M"},
+    };
+    for (const auto& c : cases)
+        EXPECT_EQ(golden(std::string("textures/golden/") + std::get<0>(c)), xmlOf(*std::get<1>(c), std::get<2>(c)));
+    // The matrix was recomputed from the components on the way.
+    EXPECT_EQ(composeMatrix(env->uvwComponents), env->uvw_matrix);
+    // An url of its own is taken as it is.
+    LayerLike layer;
+    EXPECT_EQ(golden("textures/golden/frame_own_url.xml"), xmlOf(layer, u"/Wood"));
+}
+
+TEST(TextureXml, OddValues) {
+    EXPECT_FALSE(makeBitmapTextureFromPath(u""));
+    // An empty file name, and mapping types outside the table.
+    BitmapBuffer buffer;
+    ASSERT_TRUE(loads(buffer, Bytes().version(1).i32(0).f32(0).f32(1).wstr("")));
+    EXPECT_NE(xmlOf(buffer, u"/M").find("label=\"file\">\n            <value></value>\n"), std::string::npos);
+    GenEnvironmentUVW env;
+    for (int type : {-1, 4, 1 << 30}) {
+        env.mapping_type = type;
+        EXPECT_NE(xmlOf(env, u"/M").find("label=\"mapping_type\">\n            <value></value>\n"), std::string::npos);
+    }
+    // Each reset of a checker makes new children.
+    CheckerTexture checker;
+    const UVWPtr before = checker.uvw;
+    checker.reset();
+    EXPECT_NE(checker.uvw.get(), before.get());
+}
+
+TEST(UVWCompose, ExactValues) {
+    // The defaults give the identity, without negative zeros.
+    const Matrix m = composeMatrix(TransformComponents());
+    EXPECT_EQ(Matrix(), m);
+    for (int i = 0; i < 9; ++i) EXPECT_FALSE(std::signbit(m.m[i / 3][i % 3])) << i;
+    // 90 degrees in f32 radians, with the f32 degree factor: cos is not quite 0.
+    const float r = 90.0f * 0.017453292f, c = std::cos(r), s = std::sin(r);
+    EXPECT_NE(0.0f, c);
+    auto rotated = [](float x, float y, float z) { return composeMatrix(components({x, y, z, 1, 1, 1, 0, 0, 0})); };
+    EXPECT_EQ(Matrix(Vector(c, s, 0), Vector(-s, c, 0), Vector(0, 0, 1)), rotated(0, 0, 90));
+    EXPECT_EQ(Matrix(Vector(1, 0, 0), Vector(0, c, s), Vector(0, -s, c)), rotated(90, 0, 0));
+    EXPECT_EQ(Matrix(Vector(c, 0, -s), Vector(0, 1, 0), Vector(s, 0, c)), rotated(0, 90, 0));
+    // Scale and mirror on the diagonal; syncTransforms overwrites what was stored.
+    GenObjectUVW uv;
+    uv.uvwComponents = components({0, 0, 0, 2, 3, 1, 0, 0, 7}, 0, 1, 1);
+    uv.syncTransforms();
+    EXPECT_EQ(Transform(Matrix(Vector(2, 0, 0), Vector(0, -3, 0), Vector(0, 0, -1)), Vector(0, 0, 7)), uv.uvwTransform);
+}
