@@ -1,115 +1,80 @@
-// Records of the material base and of the layered, single and multi
-// materials: every version, the name rules, and damaged data.
-#include <gtest/gtest.h>
+// Records of the material base and of the layered, single and multi materials,
+// and the scene table: naming rules, the table operations with their UUID
+// housekeeping, both versions of the table's record, and damaged data.
+#include "materials/MaterialTestUtil.h"
 
-#include "materials/Brdf.h"
-#include "materials/LayeredMaterials.h"
-#include "materials/RecordBytes.h"
-#include "materials/SceneMaterials.h"
-
-using namespace OrvaneLumoCore;
-using testbytes::RecordBytes;
+using namespace mattest;
 
 namespace {
 
-class MaterialRecords : public ::testing::Test {
-protected:
-    void SetUp() override { SceneMaterials::instance()->clear(); }
-    void TearDown() override { SceneMaterials::instance()->clear(); }
-};
+typedef TableTest MaterialRecords;
+typedef TableTest SceneTable;
 
-template <class T>
-boost::shared_ptr<T> loaded(const RecordBytes& bytes, bool expectOk = true) {
-    boost::shared_ptr<T> m(new T);
-    QuickArchive ar = bytes.archive();
-    EXPECT_EQ(m->load(ar), expectOk);
+MaterialPtr named(const std::u16string& name, const std::u16string& uuid = u"") {
+    MaterialPtr m(new MaterialLayeredBRDF);
+    m->name = name;
+    m->uuid = uuid;
     return m;
 }
 
-// ---- base record --------------------------------------------------------------
+// A Diffuse_BRDF with its tag, version 4: colour `grey`, no textures, base
+// record version 4 named `name`, use_color_tex_alpha_as_transparency.
+RecordBytes& diffuseLayer(RecordBytes& b, const std::string& name, float grey) {
+    return b.i32(kDiffuseBrdf).version(4).color(grey, grey, grey).color(0, 0, 0).f32(1).f32(1).b8(false).b8(false)
+        .version(4).str(name).b8(true).b8(false).b8(false).b8(false);
+}
+
+// ---- base record --------------------------------------------------------------------------
 
 TEST_F(MaterialRecords, BaseRecordNames) {
-    struct Case {
-        const char* what;
-        int version;
-        std::string storedName;
-        std::u16string expectedName;
+    const std::tuple<int, std::string, std::u16string> cases[] = {
+        {2, "Wood", u"Wood"},
+        {2, "Wo\nod\x7f\t", u"Wood"},  // control characters removed
+        {2, "A\xc2\x85" "B", u"AB"},   // C1 controls too
+        {2, "", u"DefaultMaterial"},  // an empty name takes the default
+        {2, "\r\n", u""},             // one of controls only stays empty
+        {1, "Old", u"Old"},           // version 1: name only
     };
-    const Case cases[] = {
-        {"plain", 2, "Wood", u"Wood"},
-        {"control characters removed", 2, "Wo\nod\x7f\t", u"Wood"},
-        {"C1 control removed", 2, "A\xc2\x85" "B", u"AB"},
-        {"empty becomes the default name", 2, "", u"DefaultMaterial"},
-        {"only controls stay empty", 2, "\r\n", u""},
-        {"version 1", 1, "Old", u"Old"},
-    };
-    for (const Case& c : cases) {
+    for (const auto& c : cases) {
         // MaterialMulti version 2: count 0, then the base record.
         RecordBytes bytes;
-        bytes.version(2).u32(0).version(c.version).str(c.storedName);
-        if (c.version == 2) bytes.str("UU-1");
+        bytes.version(2).u32(0).version(std::get<0>(c)).str(std::get<1>(c));
+        if (std::get<0>(c) == 2) bytes.str("UU-1");
         MaterialMulti m;
         m.uuid = u"kept";
         QuickArchive ar = bytes.archive();
-        ASSERT_TRUE(m.load(ar)) << c.what;
-        EXPECT_EQ(m.name, c.expectedName) << c.what;
-        EXPECT_EQ(m.uuid, c.version == 2 ? u"UU-1" : u"kept") << c.what;
+        ASSERT_TRUE(m.load(ar)) << std::get<1>(c);
+        EXPECT_EQ(m.name, std::get<2>(c)) << std::get<1>(c);
+        EXPECT_EQ(m.uuid, std::get<0>(c) == 2 ? u"UU-1" : u"kept");
     }
-}
-
-TEST_F(MaterialRecords, BaseRecordRefusedTagStillCleansTheName) {
+    // A refused tag still cleans the name the material had.
     MaterialMulti m;
     m.name = u"A\tB";
-    const RecordBytes bytes = RecordBytes().version(2).u32(0).u32(0x20001).str("X").str("");
-    QuickArchive ar = bytes.archive();
+    QuickArchive ar = RecordBytes().version(2).u32(0).u32(0x20001).str("X").str("").archive();
     EXPECT_FALSE(m.load(ar));
     EXPECT_EQ(m.name, u"AB");
-}
-
-TEST_F(MaterialRecords, BaseRecordRoundTrip) {
-    MaterialMulti m;
+    // The bytes of a save: MaterialMulti version 2, count 0, base record version 2.
     m.name = u"Stein \u00e9";
     m.uuid = u"1234";
-    QuickArchive ar;
-    ASSERT_TRUE(m.save(ar));
-    // MaterialMulti version 2: count 0, base record version 2.
-    const RecordBytes expected =
-        RecordBytes().version(2).u32(0).version(2).str("Stein \xc3\xa9").str("1234");
-    EXPECT_EQ(testbytes::savedBytes(ar), expected.bytes());
+    QuickArchive out;
+    ASSERT_TRUE(m.save(out));
+    EXPECT_EQ(savedBytes(out), RecordBytes().version(2).u32(0).base("Stein \xc3\xa9", "1234").bytes());
 }
 
-// ---- MaterialLayeredBRDF ---------------------------------------------------------
-
-// A Diffuse_BRDF record, version 4, named `name`, with colour `grey`.
-RecordBytes& diffuseLayer(RecordBytes& b, const std::string& name, float grey) {
-    return b.i32(kDiffuseBrdf)
-        .version(4)
-        .color(grey, grey, grey)
-        .color(0, 0, 0)
-        .f32(1)
-        .f32(1)
-        .b8(false)
-        .b8(false)
-        .version(4).str(name).b8(true).b8(false).b8(false)
-        .b8(false);
-}
+// ---- MaterialLayeredBRDF ----------------------------------------------------------------------
 
 TEST_F(MaterialRecords, LayeredVersions) {
     for (int version = 1; version <= 4; ++version) {
         RecordBytes bytes;
-        bytes.version(version).u32(2);
-        diffuseLayer(bytes, "Base", 0.25f);
-        diffuseLayer(bytes, "Top", 0.75f);
-        bytes.i32(2).i32(7);                         // double_sided, layered_value_a
-        if (version >= 3) bytes.i32(8).i32(9);       // layered_value_b, layered_value_c
-        if (version == 1) bytes.str("Wall\n");       // inline name
-        else bytes.version(2).str("Wall\n").str("U");  // base record
-        if (version >= 4) bytes.i32(10);             // layered_value_d
-
-        boost::shared_ptr<MaterialLayeredBRDF> m = loaded<MaterialLayeredBRDF>(bytes);
+        diffuseLayer(diffuseLayer(bytes.version(version).u32(2), "Base", 0.25f), "Top", 0.75f);
+        bytes.i32(2).i32(7);                             // double_sided, layered_value_a
+        if (version >= 3) bytes.i32(8).i32(9);           // layered_value_b, layered_value_c
+        if (version == 1) bytes.str("Wall\n");           // inline name
+        else bytes.base("Wall\n", "U");                  // base record
+        if (version >= 4) bytes.i32(10);                 // layered_value_d
+        const boost::shared_ptr<MaterialLayeredBRDF> m = loaded<MaterialLayeredBRDF>(bytes);
         ASSERT_EQ(m->brdfs.size(), 2u) << version;
         EXPECT_EQ(m->brdfs[0]->name, u"Base");
-        EXPECT_EQ(m->brdfs[1]->name, u"Top");
         EXPECT_EQ(boost::dynamic_pointer_cast<Diffuse_BRDF>(m->brdfs[1])->color.r, 0.75f);
         EXPECT_EQ(m->double_sided, 2);
         EXPECT_EQ(m->layered_value_a, 7);
@@ -127,30 +92,20 @@ TEST_F(MaterialRecords, LayeredLoadStartsFromDefaults) {
     m.brdfs.push_back(createBrdf(kGlassBrdf));
     m.layered_value_b = 42;
     m.uuid = u"old";
-    // Version 2: no layers, double_sided and layered_value_a, base record
-    // version 1 (name only).
-    const RecordBytes bytes = RecordBytes().version(2).u32(0).i32(0).i32(0).version(1).str("N");
-    QuickArchive ar = bytes.archive();
+    // Version 2: no layers, double_sided, layered_value_a, base record version 1 (name only).
+    QuickArchive ar = RecordBytes().version(2).u32(0).i32(0).i32(0).version(1).str("N").archive();
     ASSERT_TRUE(m.load(ar));
     EXPECT_TRUE(m.brdfs.empty());
     EXPECT_EQ(m.layered_value_b, 1);
     EXPECT_EQ(m.uuid, u"");
-
     // Even a refused tag leaves the list empty.
     m.brdfs.push_back(createBrdf(kGlassBrdf));
     QuickArchive bad = RecordBytes().version(5).archive();
     EXPECT_FALSE(m.load(bad));
     EXPECT_TRUE(m.brdfs.empty());
-}
-
-TEST_F(MaterialRecords, LayeredVersionFourReadsValueDBehindAFailedBase) {
-    // Layer count 0, four integers, a base record with a refused version,
-    // then layered_value_d.
-    const RecordBytes bytes =
-        RecordBytes().version(4).u32(0).i32(1).i32(0).i32(1).i32(1).version(3).i32(5);
-    MaterialLayeredBRDF m;
-    QuickArchive ar = bytes.archive();
-    EXPECT_FALSE(m.load(ar));
+    // Version 4 reads layered_value_d behind a base record of a refused version.
+    QuickArchive d = RecordBytes().version(4).u32(0).i32(1).i32(0).i32(1).i32(1).version(3).i32(5).archive();
+    EXPECT_FALSE(m.load(d));
     EXPECT_EQ(m.layered_value_d, 5);
 }
 
@@ -158,21 +113,9 @@ TEST_F(MaterialRecords, LayeredRoundTripAndCopies) {
     MaterialLayeredBRDF m;
     m.name = u"Wall";
     m.uuid = u"U-1";
-    m.double_sided = 2;
-    m.layered_value_a = 3;
-    m.layered_value_b = 4;
-    m.layered_value_c = 5;
-    m.layered_value_d = 6;
-    boost::shared_ptr<Diffuse_BRDF> base(new Diffuse_BRDF);
-    base->name = u"Base";
-    base->color = Color(0.1f, 0.2f, 0.3f);
-    m.brdfs.push_back(base);
-    m.brdfs.push_back(createBrdf(kMirrorBrdf));
-
-    QuickArchive ar;
-    ASSERT_TRUE(m.save(ar));
-    MaterialPtr back = createMaterial(kMaterialLayeredBRDF);
-    ASSERT_TRUE(back->load(ar));
+    m.double_sided = 2, m.layered_value_a = 3, m.layered_value_b = 4, m.layered_value_c = 5, m.layered_value_d = 6;
+    m.brdfs = {BrdfPtr(new Diffuse_BRDF), createBrdf(kMirrorBrdf)};
+    const boost::shared_ptr<MaterialLayeredBRDF> back = roundTrip(m);
     const MaterialPtr original = m.clone();
     EXPECT_TRUE(back->isEqual(original));
     EXPECT_EQ(back->name, u"Wall");
@@ -180,160 +123,290 @@ TEST_F(MaterialRecords, LayeredRoundTripAndCopies) {
 
     // clone keeps the name, duplicate takes a unique one; neither keeps the
     // uuid, and both clone the layers.
-    SceneMaterials::instance()->addMaterial(original);
+    table().addMaterial(original);
     const MaterialPtr dup = m.duplicate();
     EXPECT_EQ(original->name, u"Wall");
     EXPECT_EQ(dup->name, u"Wall1");
-    EXPECT_TRUE(original->uuid.empty());
-    EXPECT_TRUE(dup->uuid.empty());
-    const MaterialLayeredBRDF& d = static_cast<const MaterialLayeredBRDF&>(*dup);
-    EXPECT_NE(d.brdfs[0], m.brdfs[0]);
-    EXPECT_TRUE(d.brdfs[0]->isEqual(m.brdfs[0]));
+    EXPECT_TRUE(original->uuid.empty() && dup->uuid.empty());
+    EXPECT_NE(static_cast<const MaterialLayeredBRDF&>(*dup).brdfs[0], m.brdfs[0]);
+    EXPECT_TRUE(dup->isEqual(original));
 
     // Each integer and each layer takes part in the comparison.
-    boost::shared_ptr<MaterialLayeredBRDF> other =
-        boost::static_pointer_cast<MaterialLayeredBRDF>(m.clone());
-    other->layered_value_d = 7;
-    EXPECT_FALSE(other->isEqual(original));
-    other = boost::static_pointer_cast<MaterialLayeredBRDF>(m.clone());
-    boost::static_pointer_cast<Diffuse_BRDF>(other->brdfs[0])->color.b = 0.4f;
-    EXPECT_FALSE(other->isEqual(original));
-    other->brdfs.pop_back();
-    EXPECT_FALSE(other->isEqual(original));
+    auto changed = [&](const std::function<void(MaterialLayeredBRDF&)>& change) {
+        boost::shared_ptr<MaterialLayeredBRDF> other = boost::static_pointer_cast<MaterialLayeredBRDF>(m.clone());
+        change(*other);
+        return other->isEqual(original);
+    };
+    EXPECT_FALSE(changed([](MaterialLayeredBRDF& o) { o.double_sided = 1; }));
+    EXPECT_FALSE(changed([](MaterialLayeredBRDF& o) { o.layered_value_a = 7; }));
+    EXPECT_FALSE(changed([](MaterialLayeredBRDF& o) { o.layered_value_b = 7; }));
+    EXPECT_FALSE(changed([](MaterialLayeredBRDF& o) { o.layered_value_c = 7; }));
+    EXPECT_FALSE(changed([](MaterialLayeredBRDF& o) { o.layered_value_d = 7; }));
+    EXPECT_FALSE(changed([](MaterialLayeredBRDF& o) { static_cast<Diffuse_BRDF&>(*o.brdfs[0]).color.b = 0.4f; }));
+    EXPECT_FALSE(changed([](MaterialLayeredBRDF& o) { o.brdfs.pop_back(); }));
+    EXPECT_TRUE(changed([](MaterialLayeredBRDF& o) { o.name = u"Other"; }));
     EXPECT_FALSE(original->isEqual(MaterialPtr()));
     EXPECT_FALSE(original->isEqual(MaterialPtr(new MaterialMulti)));
 }
 
-// ---- MaterialSingleBRDF -------------------------------------------------------------
+// ---- MaterialSingleBRDF, MaterialMulti ----------------------------------------------------------
 
 TEST_F(MaterialRecords, SingleVersions) {
-    // Version 1: single_value_a, single_value_b, inline name, layer tag and
-    // record.
-    RecordBytes v1;
-    v1.version(1).i32(3).i32(4).str("");
-    diffuseLayer(v1, "Only", 0.5f);
-    boost::shared_ptr<MaterialSingleBRDF> a = loaded<MaterialSingleBRDF>(v1);
+    // Version 1: single_value_a, single_value_b, inline name, layer tag and record.
+    RecordBytes v1, v2;
+    diffuseLayer(v1.version(1).i32(3).i32(4).str(""), "Only", 0.5f);
+    const boost::shared_ptr<MaterialSingleBRDF> a = loaded<MaterialSingleBRDF>(v1);
     EXPECT_EQ(a->single_value_a, 3);
     EXPECT_EQ(a->single_value_b, 4);
     EXPECT_EQ(a->name, u"DefaultMaterial");
     ASSERT_TRUE(a->brdf);
     EXPECT_EQ(a->brdf->name, u"Only");
-
-    // Version 2: the two values, layer tag and record, base record.
-    RecordBytes v2;
-    v2.version(2).i32(5).i32(6);
-    diffuseLayer(v2, "Only", 0.5f);
-    v2.version(2).str("Single").str("S-1");
-    boost::shared_ptr<MaterialSingleBRDF> b = loaded<MaterialSingleBRDF>(v2);
+    // Version 2 (current): the two values, layer tag and record, base record.
+    diffuseLayer(v2.version(2).i32(5).i32(6), "Only", 0.5f).base("Single", "S-1");
+    const boost::shared_ptr<MaterialSingleBRDF> b = loaded<MaterialSingleBRDF>(v2);
     EXPECT_EQ(b->single_value_b, 6);
     EXPECT_EQ(b->name, u"Single");
     EXPECT_EQ(b->uuid, u"S-1");
-
     QuickArchive ar;
     ASSERT_TRUE(b->save(ar));
-    EXPECT_EQ(testbytes::savedBytes(ar), v2.bytes());
-
-    // Copies share the layer.
+    EXPECT_EQ(savedBytes(ar), v2.bytes());
+    // Copies share the layer; without a layer there is nothing to save.
     const MaterialPtr copy = b->clone();
     EXPECT_EQ(static_cast<MaterialSingleBRDF&>(*copy).brdf, b->brdf);
     EXPECT_TRUE(copy->isEqual(b));
-    MaterialSingleBRDF empty;
     QuickArchive none;
-    EXPECT_FALSE(empty.save(none));
+    EXPECT_FALSE(MaterialSingleBRDF().save(none));
 }
 
-// ---- MaterialMulti ---------------------------------------------------------------------
-
 TEST_F(MaterialRecords, MultiVersionsAndAppend) {
-    // Version 1: count, per sub-material tag and record (here a
-    // MaterialMulti version 2 without children), then the inline name.
-    const RecordBytes v1 = RecordBytes()
-                               .version(1)
-                               .u32(1)
-                               .i32(kMaterialMulti)
-                               .version(2).u32(0).version(2).str("Inner").str("")
-                               .str("Outer\t");
+    // Version 1: count, per sub-material tag and record, then the inline name.
+    const RecordBytes v1 = RecordBytes().version(1).u32(1).multi("Inner").str("Outer\t");
     MaterialMulti m;
     QuickArchive ar = v1.archive();
     ASSERT_TRUE(m.load(ar));
     ASSERT_EQ(m.materials.size(), 1u);
     EXPECT_EQ(m.materials[0]->name, u"Inner");
     EXPECT_EQ(m.name, u"Outer\t");
-
     // A second load appends to the list.
     QuickArchive again = v1.archive();
     ASSERT_TRUE(m.load(again));
     EXPECT_EQ(m.materials.size(), 2u);
-
+    // Copies share the sub-materials.
     const MaterialPtr dup = m.duplicate();
     EXPECT_EQ(static_cast<MaterialMulti&>(*dup).materials[0], m.materials[0]);
     EXPECT_TRUE(dup->isEqual(m.clone()));
 }
 
-// ---- damaged data ------------------------------------------------------------------------
-
 TEST_F(MaterialRecords, BadAndTruncatedRecordsFail) {
     RecordBytes good;
-    good.version(4).u32(1);
-    diffuseLayer(good, "Base", 0.5f);
-    good.i32(1).i32(0).i32(1).i32(1).version(2).str("Wall").str("").i32(0);
+    diffuseLayer(good.version(4).u32(1), "Base", 0.5f).i32(1).i32(0).i32(1).i32(1).base("Wall").i32(0);
     ASSERT_TRUE(loaded<MaterialLayeredBRDF>(good));
-
-    // Every cut up to the base record's tag fails: what lies behind the end
-    // of the data reads as zeros, and the tag of the base record then has
-    // no valid version. (Behind that tag zeros pass as an empty name.)
-    const std::size_t baseTag = good.size() - 20;
-    for (std::size_t cut = 0; cut <= baseTag; ++cut) {
+    // Every cut up to the base record's tag fails: what lies behind the end of
+    // the data reads as zeros, and the base record's tag then has no valid
+    // version. (Behind that tag zeros pass as an empty name.)
+    for (std::size_t cut = 0; cut <= good.size() - 20; ++cut) {
         MaterialLayeredBRDF m;
         QuickArchive ar = good.archive(cut);
         EXPECT_FALSE(m.load(ar)) << "cut at " << cut;
     }
-
-    struct Case {
-        const char* what;
-        RecordBytes bytes;
+    const std::pair<MaterialPtr, RecordBytes> cases[] = {
+        {MaterialPtr(new MaterialLayeredBRDF), RecordBytes().version(4).u32(1).i32(3)},  // layer tag 3
+        {MaterialPtr(new MaterialLayeredBRDF), RecordBytes().version(4).u32(1).i32(0)},  // layer tag 0
+        {MaterialPtr(new MaterialLayeredBRDF), RecordBytes().u32(0x40001)},              // low half set
+        {MaterialPtr(new MaterialLayeredBRDF), RecordBytes().u32(0)},                    // version 0
+        {MaterialPtr(new MaterialLayeredBRDF), RecordBytes().version(4).u32(0xFFFFFFFF)},  // huge layer count
+        {MaterialPtr(new MaterialSingleBRDF), RecordBytes().version(2).i32(0).i32(0).i32(64)},
+        {MaterialPtr(new MaterialMulti), RecordBytes().version(2).u32(1).i32(15)},
+        {MaterialPtr(new MaterialMulti), RecordBytes().version(3)},
     };
-    const Case cases[] = {
-        {"layer tag 3", RecordBytes().version(4).u32(1).i32(3)},
-        {"layer tag 0", RecordBytes().version(4).u32(1).i32(0)},
-        {"low half set", RecordBytes().u32(0x40001)},
-        {"version 0", RecordBytes().u32(0)},
-        {"huge layer count", RecordBytes().version(4).u32(0xFFFFFFFF)},
-    };
-    for (const Case& c : cases) {
-        MaterialLayeredBRDF m;
-        QuickArchive ar = c.bytes.archive();
-        EXPECT_FALSE(m.load(ar)) << c.what;
+    for (const auto& c : cases) {
+        QuickArchive ar = c.second.archive();
+        EXPECT_FALSE(c.first->load(ar)) << &c - cases;
     }
-
-    MaterialSingleBRDF single;
-    QuickArchive s = RecordBytes().version(2).i32(0).i32(0).i32(64).archive();
-    EXPECT_FALSE(single.load(s));
-    MaterialMulti multi;
-    QuickArchive mm = RecordBytes().version(2).u32(1).i32(15).archive();
-    EXPECT_FALSE(multi.load(mm));
-    QuickArchive m3 = RecordBytes().version(3).archive();
-    EXPECT_FALSE(multi.load(m3));
+    // 300 MaterialMulti records, each the only sub-material of the one before:
+    // deeper than any real file, and refused instead of overflowing.
+    RecordBytes deep;
+    for (int i = 0; i < 300; ++i) deep.version(2).u32(1).i32(kMaterialMulti);
+    loaded<MaterialMulti>(deep, false);
 }
 
-TEST_F(MaterialRecords, DeepNestingFailsInsteadOfOverflowing) {
-    // 300 MaterialMulti records, each the only sub-material of the one
-    // before: deeper than any real file.
-    RecordBytes bytes;
-    for (int i = 0; i < 300; ++i) bytes.version(2).u32(1).i32(kMaterialMulti);
-    MaterialMulti m;
-    QuickArchive ar = bytes.archive();
-    EXPECT_FALSE(m.load(ar));
-}
-
-TEST_F(MaterialRecords, FactoryTags) {
-    EXPECT_EQ(createMaterial(0)->getType(), kMaterialSingleBRDF);
-    EXPECT_EQ(createMaterial(1)->getPluginName(), u"MtlORVANE");
-    EXPECT_EQ(createMaterial(2)->getPluginName(), u"MtlMulti");
-    EXPECT_EQ(createMaterial(0)->getPluginName(), u"MtlSingleBRDF");
-    EXPECT_EQ(createMaterial(1)->getAssetType(), u"material");
-    EXPECT_FALSE(createMaterial(15));
+TEST_F(MaterialRecords, FactoryGivesEveryClass) {
+    const char16_t* plugins[] = {u"MtlSingleBRDF", u"MtlORVANE", u"MtlMulti", u"MtlBump", u"", u"Mtl2Sided", u"",
+                                 u"MtlSkp2Sided", u"MtlOverrideEnvironment", u"MtlDisplaced", u"MtlObjectExclusion",
+                                 u"MtlAlphaContribution", u"MtlAngleBlend", u"", u"MtlToon"};
+    for (std::uint32_t tag = 0; tag < kMaterialTagCount; ++tag) {
+        const MaterialPtr m = createMaterial(tag);
+        ASSERT_TRUE(m) << tag;
+        EXPECT_EQ(m->getType(), tag);
+        EXPECT_EQ(m->getPluginName(), plugins[tag]) << tag;
+        EXPECT_EQ(m->getAssetType(), u"material");
+    }
+    EXPECT_FALSE(createMaterial(kMaterialTagCount));
     EXPECT_FALSE(createMaterial(0xFFFFFFFFu));
+}
+
+// ---- the scene table ------------------------------------------------------------------------
+
+TEST_F(SceneTable, UniqueNames) {
+    const std::tuple<std::vector<std::u16string>, std::u16string, std::u16string> cases[] = {
+        {{}, u"Mat", u"Mat"},
+        {{}, u"Mat7", u"Mat"},
+        {{u"Mat"}, u"Mat", u"Mat1"},
+        {{u"Mat"}, u"Mat7", u"Mat1"},
+        {{u"Mat", u"Mat1", u"Mat2"}, u"Mat", u"Mat3"},
+        {{u"MAT"}, u"mat", u"mat1"},  // keys ignore case
+        {{}, u"3 Wood", u"a3_Wood"},
+        {{}, u"Big Wood 12", u"Big_Wood_"},
+        {{}, u"123", u""},
+        {{}, u"", u""},
+        {{u"a b"}, u"a b", u"a_b1"},  // the blank counts in the lookup
+        {{u"a_b"}, u"a b", u"a_b"},   // the result is not looked up again
+        {{u"x", u"x1", u"x2", u"x3", u"x4", u"x5", u"x6", u"x7", u"x8", u"x9"}, u"x", u"x10"},
+    };
+    for (const auto& c : cases) {
+        table().clear();
+        for (const std::u16string& t : std::get<0>(c)) ASSERT_TRUE(table().addMaterial(named(t)));
+        EXPECT_EQ(table().getUniqueName(std::get<1>(c)), std::get<2>(c)) << wideToUtf8(std::get<1>(c));
+    }
+    // A new material takes a unique default name but isn't entered.
+    ASSERT_TRUE(table().addMaterial(named(u"DefaultMaterial")));
+    MaterialMulti a, b;
+    EXPECT_EQ(a.name, u"DefaultMaterial1");
+    EXPECT_EQ(b.name, u"DefaultMaterial1");
+}
+
+TEST_F(SceneTable, NameValidity) {
+    ASSERT_TRUE(table().addMaterial(named(u"Wood")));
+    std::u16string message = u"stale";
+    EXPECT_TRUE(table().isNameValid(u"Stone", message));
+    EXPECT_EQ(message, u"");
+    EXPECT_FALSE(table().isNameValid(u"WOOD", message));
+    EXPECT_EQ(message, u"The name, \"WOOD\", is already in use");
+    EXPECT_FALSE(table().isNameValid(u"", message));
+    EXPECT_EQ(message, u"A name must have at least one character");
+    EXPECT_TRUE(table().isNameUnused(u"Stone"));
+    EXPECT_FALSE(table().isNameUnused(u"wood"));
+}
+
+TEST_F(SceneTable, AddKeepsOneKeyPerNameAndMakesUuids) {
+    EXPECT_FALSE(table().addMaterial(MaterialPtr()));
+    EXPECT_FALSE(table().addMaterial(named(u"")));
+    ASSERT_TRUE(table().addMaterial(named(u"wood", u"ID-1")));
+    EXPECT_FALSE(table().addMaterial(named(u"WOOD", u"ID-2")));
+    EXPECT_EQ(table().getMaterials().size(), 1u);
+    EXPECT_EQ(table().getUuids().size(), 1u);
+    EXPECT_EQ(table().getUuid(u"Wood"), u"ID-1");
+    // A material without a uuid gets one in the map only.
+    MaterialPtr stone = named(u"Stone");
+    ASSERT_TRUE(table().addMaterial(stone));
+    EXPECT_TRUE(stone->uuid.empty());
+    const std::u16string id = table().getUuid(u"stone");
+    EXPECT_EQ(id.size(), 36u);
+    EXPECT_EQ(table().getMaterialByUuid(id), stone);
+    EXPECT_EQ(table().getMaterialByUuid(u"id-1"), table().getMaterial(u"wood"));
+    EXPECT_FALSE(table().getMaterialByUuid(u"nothing"));
+    std::vector<std::u16string> names;
+    table().getMaterialNames(names);
+    EXPECT_EQ(names, (std::vector<std::u16string>{u"Stone", u"wood"}));
+}
+
+TEST_F(SceneTable, ReplaceMovesTheEntryAndItsUuid) {
+    MaterialPtr wood = named(u"Wood", u"ID-W");
+    ASSERT_TRUE(table().addMaterial(wood));
+    ASSERT_TRUE(table().addMaterial(named(u"Stone", u"ID-S")));
+    wood->name = u"Stone";
+    EXPECT_FALSE(table().replaceMaterial(u"Wood", wood));  // new name taken
+    wood->name = u"Oak";
+    EXPECT_FALSE(table().replaceMaterial(u"Pine", wood));  // old name missing
+    EXPECT_TRUE(table().replaceMaterial(u"wood", wood));
+    EXPECT_FALSE(table().getMaterial(u"Wood"));
+    EXPECT_EQ(table().getMaterial(u"oak"), wood);
+    EXPECT_EQ(table().getUuid(u"Oak"), u"ID-W");
+    // Only a change of case: allowed although the key exists.
+    wood->name = u"OAK";
+    EXPECT_TRUE(table().replaceMaterial(u"Oak", wood));
+    std::vector<std::u16string> names;
+    table().getMaterialNames(names);
+    EXPECT_EQ(names, (std::vector<std::u16string>{u"OAK", u"Stone"}));
+    EXPECT_EQ(table().getUuids().at(u"ID-W"), u"OAK");
+}
+
+TEST_F(SceneTable, RemoveCopyAndDump) {
+    ASSERT_TRUE(table().addMaterial(named(u"b", u"U2")));
+    ASSERT_TRUE(table().addMaterial(named(u"A", u"U1")));
+    std::u16string out;
+    table().dump(out);
+    EXPECT_EQ(out, u"A\nb\nBeginning UUIDs\nU1 A\nU2 b\n");
+    const MaterialPtr copy = table().getMaterialCopy(u"B");
+    ASSERT_TRUE(copy);
+    EXPECT_EQ(copy->name, u"b1");
+    EXPECT_TRUE(copy->uuid.empty());
+    EXPECT_FALSE(table().getMaterialCopy(u"Stone"));
+    EXPECT_FALSE(table().removeMaterial(u"Stone"));
+    EXPECT_TRUE(table().removeMaterial(u"a"));
+    EXPECT_TRUE(table().removeMaterial(u"b"));
+    EXPECT_TRUE(table().getMaterials().empty());
+    EXPECT_TRUE(table().getUuids().empty());
+    // An entry without a UUID entry is removed all the same: a version 2
+    // record with one material and an empty UUID map.
+    QuickArchive ar = RecordBytes().version(2).u32(1).multi("Solo").u32(0).archive();
+    ASSERT_TRUE(table().load(ar));
+    ASSERT_TRUE(table().getUuids().empty());
+    EXPECT_TRUE(table().removeMaterial(u"Solo"));
+    EXPECT_TRUE(table().getMaterials().empty());
+}
+
+TEST_F(SceneTable, RecordVersions) {
+    // The current record, round trip.
+    ASSERT_TRUE(table().addMaterial(named(u"Wood", u"ID-W")));
+    ASSERT_TRUE(table().addMaterial(named(u"Stone")));
+    QuickArchive ar;
+    ASSERT_TRUE(table().save(ar));
+    SceneMaterials copy;
+    ASSERT_TRUE(copy.load(ar));
+    ASSERT_EQ(copy.getMaterials().size(), 2u);
+    EXPECT_TRUE(copy.getMaterial(u"Wood")->isEqual(table().getMaterial(u"Wood")));
+    EXPECT_EQ(copy.getMaterial(u"Wood")->uuid, u"ID-W");
+    EXPECT_EQ(copy.getUuids(), table().getUuids());
+
+    // Version 1: count, then per material its tag and record; no UUID map.
+    // The materials go through addMaterial.
+    SceneMaterials t;
+    QuickArchive v1 = RecordBytes().version(1).u32(2).multi("Wood", "ID-W").multi("Stone").archive();
+    ASSERT_TRUE(t.load(v1));
+    EXPECT_EQ(t.getMaterials().size(), 2u);
+    EXPECT_EQ(t.getUuid(u"Wood"), u"ID-W");
+    EXPECT_EQ(t.getUuid(u"Stone").size(), 36u);
+    // A name that addMaterial refuses ends the load; what came before stays.
+    QuickArchive twice = RecordBytes().version(1).u32(2).multi("Wood").multi("WOOD").archive();
+    EXPECT_FALSE(t.load(twice));
+    EXPECT_EQ(t.getMaterials().size(), 1u);
+
+    // Version 2 takes names and pairs without any test: an empty name (which
+    // became a unique default name) and a UUID of a name that isn't there are kept.
+    QuickArchive v2 = RecordBytes().version(2).u32(1).multi("").u32(2).str("U1").str("Ghost").str("U2").str("Other").archive();
+    ASSERT_TRUE(t.load(v2));
+    ASSERT_EQ(t.getMaterials().size(), 1u);
+    EXPECT_EQ(t.getMaterials().begin()->first, u"DefaultMaterial");
+    EXPECT_EQ(t.getUuids().size(), 2u);
+    EXPECT_FALSE(t.getMaterialByUuid(u"U1"));
+}
+
+TEST_F(SceneTable, BadRecordsFail) {
+    ASSERT_TRUE(table().addMaterial(named(u"Wood")));
+    const RecordBytes cases[] = {
+        RecordBytes().u32(0x20001).u32(0).u32(0),                      // low half set
+        RecordBytes().version(3).u32(0).u32(0),                        // version 3
+        RecordBytes(),                                                 // empty data
+        RecordBytes().version(2).u32(1).i32(15),                       // material tag 15
+        RecordBytes().version(2).u32(0x7FFFFFFF),                      // count past the data
+        RecordBytes().version(2).u32(1).i32(kMaterialMulti).version(2),  // truncated material
+    };
+    for (const RecordBytes& c : cases) {
+        SceneMaterials t;
+        QuickArchive ar = c.archive();
+        EXPECT_FALSE(t.load(ar)) << &c - cases;
+    }
 }
 
 }  // namespace

@@ -1,0 +1,177 @@
+#pragma once
+// Shared by the material tests: hand-laid record bytes, builders of small
+// materials, round trips and the golden documents under golden/.
+#include <gtest/gtest.h>
+
+#include <cstdint>
+#include <cstdlib>
+#include <cstring>
+#include <fstream>
+#include <functional>
+#include <sstream>
+#include <string>
+#include <vector>
+
+#include "materials/Brdf.h"
+#include "materials/LayeredMaterials.h"
+#include "materials/SceneMaterials.h"
+#include "persistence/QuickArchive.h"
+#include "textures/BasicTextures.h"
+#include "textures/Bitmaps.h"
+#include "xml/AssetXmlWriter.h"
+
+namespace mattest {
+
+using namespace OrvaneLumoCore;
+
+// Little-endian values appended one by one, the way the archive stores them.
+class RecordBytes {
+public:
+    RecordBytes& u8(std::uint8_t v) { bytes_.push_back(static_cast<char>(v)); return *this; }
+    RecordBytes& b8(bool v) { return u8(v ? 1 : 0); }
+    RecordBytes& u32(std::uint32_t v) {
+        for (int i = 0; i < 4; ++i) u8(static_cast<std::uint8_t>(v >> (8 * i)));
+        return *this;
+    }
+    RecordBytes& i32(std::int32_t v) { return u32(static_cast<std::uint32_t>(v)); }
+    RecordBytes& version(int v) { return u32(static_cast<std::uint32_t>(v) << 16); }
+    RecordBytes& f32(float v) { std::uint32_t bits; std::memcpy(&bits, &v, 4); return u32(bits); }
+    RecordBytes& color(float r, float g, float b) { return f32(r).f32(g).f32(b); }
+    RecordBytes& str(const std::string& utf8) {  // a wstring given as its UTF-8 bytes
+        u32(static_cast<std::uint32_t>(utf8.size()));
+        bytes_.insert(bytes_.end(), utf8.begin(), utf8.end());
+        return *this;
+    }
+    RecordBytes& raw(const std::vector<char>& more) { bytes_.insert(bytes_.end(), more.begin(), more.end()); return *this; }
+    // Base record of a material, version 2: name, uuid.
+    RecordBytes& base(const std::string& name, const std::string& uuid = "") { return version(2).str(name).str(uuid); }
+    // Optional texture member: an AColorTexture (tag 5, version 1: acolor) whose red channel marks it.
+    RecordBytes& acolor(float red) { return b8(true).u32(5).version(1).f32(red).f32(0).f32(0).f32(1); }
+    // A bare material (tag and record): an empty MaterialMulti, version 2 (count 0, base record).
+    RecordBytes& multi(const std::string& name, const std::string& uuid = "") {
+        return u32(kMaterialMulti).version(2).u32(0).base(name, uuid);
+    }
+    // The same as an optional material member.
+    RecordBytes& multiMember(const std::string& name) { return b8(true).multi(name); }
+
+    const std::vector<char>& bytes() const { return bytes_; }
+    std::size_t size() const { return bytes_.size(); }
+    // An archive holding the bytes, the first `length` only if given.
+    QuickArchive archive(std::size_t length = std::string::npos) const {
+        return QuickArchive(bytes_.data(), length < bytes_.size() ? length : bytes_.size());
+    }
+
+private:
+    std::vector<char> bytes_;
+};
+
+// The bytes that a save wrote, from the start of the archive.
+inline std::vector<char> savedBytes(const QuickArchive& ar) {
+    std::vector<char> out(static_cast<std::size_t>(ar.getWritePosition()));
+    QuickArchive copy(ar);
+    copy.setReadPosition(0);
+    if (!out.empty()) copy.getRaw(out.data(), out.size());
+    return out;
+}
+
+// Loads `bytes` into a new T; on success the record must be read to its end.
+template <class T>
+boost::shared_ptr<T> loaded(const RecordBytes& bytes, bool expectOk = true) {
+    boost::shared_ptr<T> object(new T);
+    QuickArchive ar = bytes.archive();
+    EXPECT_EQ(object->load(ar), expectOk);
+    if (expectOk) {
+        EXPECT_EQ(ar.getReadPosition(), bytes.size()) << "the record was read to its end";
+    }
+    return object;
+}
+
+// An archive over the bytes of `object`'s save, for loading.
+template <class T>
+QuickArchive savedArchive(const T& object, bool expectOk = true) {
+    QuickArchive ar(1);
+    EXPECT_EQ(object.save(ar), expectOk);
+    const std::vector<char> bytes = savedBytes(ar);
+    return QuickArchive(bytes.data(), bytes.size());
+}
+
+// Saves `object` and loads the bytes into a fresh object of the same class.
+template <class T>
+boost::shared_ptr<T> roundTrip(const T& object) {
+    QuickArchive ar = savedArchive(object);
+    boost::shared_ptr<T> copy(new T);
+    EXPECT_TRUE(copy->load(ar));
+    EXPECT_EQ(ar.getReadPosition(), ar.getWritePosition()) << "the record was read to its end";
+    return copy;
+}
+
+// A layered material `name` with one default diffuse layer `layerName`.
+inline boost::shared_ptr<MaterialLayeredBRDF> layered(const std::u16string& name, const std::u16string& layerName = u"Base") {
+    boost::shared_ptr<MaterialLayeredBRDF> m(new MaterialLayeredBRDF);
+    m->name = name;
+    m->brdfs.push_back(BrdfPtr(new Diffuse_BRDF));
+    m->brdfs[0]->name = layerName;
+    return m;
+}
+
+inline TexturePtr acolor(float r, float g, float b, float a = 1) {
+    boost::shared_ptr<AColorTexture> t(new AColorTexture);
+    t->color = AColor(r, g, b, a);
+    return t;
+}
+inline TexturePtr bitmap(const std::u16string& path) { return makeBitmapTextureFromPath(path); }
+
+// The red channel of an AColorTexture, or -1 for anything else.
+inline float acolorRed(const TexturePtr& t) {
+    const AColorTexture* a = dynamic_cast<const AColorTexture*>(t.get());
+    return a ? a->color.r : -1;
+}
+
+// The XML of an object's own writeXml, as UTF-8.
+template <class T>
+std::string ownXml(T& object, const std::u16string& url = u"") {
+    std::u16string out;
+    AssetXmlWriter writer(out);
+    object.writeXml(writer, url);
+    return wideToUtf8(out);
+}
+
+inline int countOf(const std::string& text, const std::string& needle) {
+    int n = 0;
+    for (std::size_t p = text.find(needle); p != std::string::npos; p = text.find(needle, p + 1)) ++n;
+    return n;
+}
+
+// Compares `actual` with tests/materials/golden/<name>, naming the first line
+// that differs. With ORVXML_UPDATE_GOLDEN set the file is written instead.
+inline void expectGolden(const std::string& name, const std::string& actual) {
+    const std::string path = ORVXML_SOURCE_DIR "/tests/materials/golden/" + name;
+    if (std::getenv("ORVXML_UPDATE_GOLDEN")) std::ofstream(path, std::ios::binary) << actual;
+    std::ifstream file(path, std::ios::binary);
+    ASSERT_TRUE(file) << path;
+    std::ostringstream content;
+    content << file.rdbuf();
+    const std::string expected = content.str();
+    std::istringstream e(expected), a(actual);
+    std::string el, al;
+    for (int line = 1;; ++line) {
+        const bool moreE = static_cast<bool>(std::getline(e, el)), moreA = static_cast<bool>(std::getline(a, al));
+        if (!moreE && !moreA) break;
+        if (!moreE || !moreA || el != al) {
+            ADD_FAILURE() << name << " line " << line << "\n expected: " << (moreE ? el : "<end>")
+                          << "\n actual:   " << (moreA ? al : "<end>");
+            return;
+        }
+    }
+    EXPECT_EQ(expected, actual) << name;  // also catches a difference in the last line break
+}
+
+// Tests that use the scene table start and end with an empty one.
+class TableTest : public ::testing::Test {
+protected:
+    void SetUp() override { table().clear(); }
+    void TearDown() override { table().clear(); }
+    static SceneMaterials& table() { return *SceneMaterials::instance(); }
+};
+
+}  // namespace mattest
