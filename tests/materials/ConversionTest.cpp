@@ -188,131 +188,81 @@ MaterialPtr allFiveWrappers(bool bumpOutermost) {
     return below;
 }
 
-TEST_F(Conversion, GoldenCases) {
-    const std::pair<const char*, std::function<std::string()>> cases[] = {
-        // The folded wrappers: the textures first, then the layer, then one main
-        // Asset under the top's name with the wrappers' parameters behind the
-        // layered material's, in the order bump, displaced, environment,
-        // exclusion, alpha; whatever the order of the chain. No object list.
-        {"folded_wrappers.xml", [] { return conversion(allFiveWrappers(true)); }},
-        {"folded_wrappers.xml", [] { return conversion(allFiveWrappers(false)); }},
-        // Only the first wrapper of a type counts.
-        {"first_bump_counts.xml", [] {
-             boost::shared_ptr<MaterialBump> inner = wrap<MaterialBump>(layered(u"L"), u"InnerBump");
-             inner->bump_tex_mult = 9, inner->bump_tex = acolor(1, 0, 0);
-             boost::shared_ptr<MaterialBump> outer = wrap<MaterialBump>(inner, u"Outer");
-             outer->bump_tex_mult = 2;
-             return conversion(outer);
-         }},
-        // Layers of one name share their url.
-        {"same_layer_names.xml", [] {
-             boost::shared_ptr<MaterialLayeredBRDF> m = layered(u"M", u"Same");
-             m->brdfs.push_back(layer<Diffuse_BRDF>(u"Same"));
-             return conversion(m);
-         }},
-        // Below a bump a two-sided material is flattened to its front, or to
-        // its back where the front holds no layered material; a toon is passed through.
-        {"two_sided_below_bump.xml", [] {
-             return conversion(wrap<MaterialBump>(sided<Material2Sided>(u"Two", layered(u"F", u"Front"), layered(u"B", u"Back"))));
-         }},
-        {"two_sided_back_below_bump.xml", [] {
-             const MaterialPtr multi(new MaterialMulti);
-             return conversion(wrap<MaterialBump>(sided<Material2Sided>(u"Two", multi, layered(u"B", u"Back"))));
-         }},
-        {"toon_below_bump.xml", [] {
-             boost::shared_ptr<MaterialToon> toon = wrap<MaterialToon>(layered(u"Paper"), u"Toon");
-             toon->lineColorTex = acolor(1, 0, 0);
-             return conversion(wrap<MaterialBump>(toon));
-         }},
-        // At the top, two-child classes write the flat Assets of their children,
-        // then their own Asset, whose layout names the class.
-        {"two_sided_top.xml", [] {
-             boost::shared_ptr<Material2Sided> two = sided<Material2Sided>(u"Two", layered(u"F", u"FL"), layered(u"B", u"BL"));
-             two->translucency = Color(0.25f, 0.5f, 0.75f), two->transparency = Color(1, 1, 1);
-             two->translucency_tex = acolor(1, 1, 1), two->force_1sided = true;
-             return conversion(two);
-         }},
-        // An absent child leaves its parameter out altogether.
-        {"skp_top_without_back.xml", [] { return conversion(sided<MaterialSkp2Sided>(u"Skp", layered(u"F"), MaterialPtr())); }},
-        // A usable child without a layered material gets no Asset, yet the
-        // parent refers to it by name. A child that resolves to a reference
-        // without a target UUID isn't usable: no parameter, while its flat
-        // Asset is written from the inner copy.
-        {"blend_without_layered_children.xml", [] {
-             boost::shared_ptr<MaterialMulti> multi(new MaterialMulti);
-             multi->name = u"Multi";
-             return conversion(blend(u"Blend", multi, referenceTo(u"outer", referenceTo(u"", layered(u"Copy")))));
-         }},
-        {"blend_over_reference.xml", [] { return conversion(blend(u"Blend", referenceTo(u"u-1", layered(u"Copy")), MaterialPtr())); }},
-        // A reference at the top is written from its copy, searched through a
-        // further reference under that one's name.
-        {"reference_in_reference.xml", [] {
-             return conversion(referenceTo(u"u-1", referenceTo(u"u-2", layered(u"Deep", u"Layer"), u"InnerRef")));
-         }},
-        {"reference_top.xml", [] { return conversion(referenceTo(u"u-1", layered(u"Copy", u"Layer"))); }},
-        // A toon at the top: its base through the flat conversion under its own
-        // name, the textures in slot order, then the toon Asset without lineUnits.
-        {"toon_top.xml", [] {
-             boost::shared_ptr<MaterialToon> toon = wrap<MaterialToon>(wrap<MaterialBump>(layered(u"Paper"), u"Bumped"), u"Ink");
-             toon->opacityTex = acolor(0.5f, 0, 0), toon->lineWidthTex = acolor(0.25f, 0, 0), toon->divideByDist = true;
-             return conversion(toon);
-         }},
-        // A base without a layered material is still referred to; one that
-        // resolves to a reference without a target UUID isn't.
-        {"toon_over_multi.xml", [] {
-             boost::shared_ptr<MaterialMulti> multi(new MaterialMulti);
-             multi->name = u"Multi";
-             return conversion(wrap<MaterialToon>(multi, u"Ink"));
-         }},
-        {"toon_over_unusable_reference.xml", [] {
-             return conversion(wrap<MaterialToon>(referenceTo(u"outer", referenceTo(u"", layered(u"Copy"))), u"Ink"));
-         }},
-        // Own forms: the two-sided material whole, textures before it; with a
-        // child, the child's Assets first, below the material's url.
-        {"own_two_sided.xml", [] {
-             boost::shared_ptr<Material2Sided> two = sided<Material2Sided>(u"Two", MaterialPtr(), MaterialPtr());
-             two->transparency_tex = acolor(1, 0.5f, 0), two->translucency_tex_mult = 2;
-             return ownXml(*two, u"/Lib");
-         }},
-        {"own_two_sided_with_front.xml", [] {
-             boost::shared_ptr<Material2Sided> two = sided<Material2Sided>(u"Two", layered(u"F", u"FL"), MaterialPtr());
-             two->transparency_tex = acolor(1, 0.5f, 0);
-             return ownXml(*two);
-         }},
-        {"own_bump.xml", [] {
-             boost::shared_ptr<MaterialBump> bump = wrap<MaterialBump>(layered(u"L"), u"Bump");
-             bump->bump_tex = acolor(1, 0, 0);
-             return ownXml(*bump);
-         }},
-        {"own_skp.xml", [] { return ownXml(*sided<MaterialSkp2Sided>(u"Skp", MaterialPtr(), layered(u"K"))); }},
-        // The object list has an empty list type and string entries, unescaped.
-        {"own_exclusion.xml", [] {
-             boost::shared_ptr<MaterialObjectExclusion> exclusion = wrap<MaterialObjectExclusion>(MaterialPtr(), u"Ex");
-             exclusion->mode = 3, exclusion->objects = {u"Chair", u"Big <Table>"};
-             return ownXml(*exclusion);
-         }},
-        {"own_blend.xml", [] { return ownXml(*blend(u"AB", layered(u"One"), MaterialPtr())); }},
-        {"own_alpha.xml", [] {
-             boost::shared_ptr<MaterialAlphaContribution> alpha = wrap<MaterialAlphaContribution>(MaterialPtr(), u"Al");
-             alpha->alpha_tex = acolor(0, 0, 0);
-             return ownXml(*alpha);
-         }},
-        // The environment override writes only its base, under its own url;
-        // the displaced material its base one step (the name) below.
-        {"own_environment.xml", [] {
-             boost::shared_ptr<MaterialOverrideEnvironment> env = wrap<MaterialOverrideEnvironment>(layered(u"L"), u"Env");
-             env->gi_tex = acolor(1, 1, 1);
-             return ownXml(*env, u"/Lib");
-         }},
-        {"own_displaced.xml", [] { return ownXml(*wrap<MaterialDisplaced>(layered(u"L"), u"Disp"), u"/Lib"); }},
-        // The toon's own form uses the lower-case words.
-        {"own_toon.xml", [] {
-             boost::shared_ptr<MaterialToon> toon = wrap<MaterialToon>(MaterialPtr(), u"Toon");
-             toon->distortTex = acolor(0, 0, 1);
-             return ownXml(*toon);
-         }},
-    };
-    for (const auto& c : cases) expectGolden(c.first, c.second());
+TEST_F(Conversion, TopLevelTrees) {
+    // Folded wrappers: the textures first, then the layer, then one main Asset
+    // under the top's name with the wrappers' parameters behind the layered
+    // material's, in the order bump, displaced, environment, exclusion, alpha,
+    // whatever the order of the chain. No object list.
+    std::string xml = conversion(allFiveWrappers(true));
+    EXPECT_EQ(conversion(allFiveWrappers(false)), xml);
+    // Only the first wrapper of a type counts.
+    boost::shared_ptr<MaterialBump> inner = wrap<MaterialBump>(layered(u"L"), u"InnerBump");
+    inner->bump_tex_mult = 9, inner->bump_tex = acolor(1, 0, 0);
+    boost::shared_ptr<MaterialBump> outer = wrap<MaterialBump>(inner, u"Outer");
+    outer->bump_tex_mult = 2;
+    xml += conversion(outer);
+    // Layers of one name share their url.
+    boost::shared_ptr<MaterialLayeredBRDF> same = layered(u"M", u"Same");
+    same->brdfs.push_back(layer<Diffuse_BRDF>(u"Same"));
+    xml += conversion(same);
+    // Below a bump a two-sided material is flattened to its front, or to its
+    // back where the front holds no layered material; a toon is passed through.
+    boost::shared_ptr<MaterialMulti> multi(new MaterialMulti);
+    multi->name = u"Multi";
+    xml += conversion(wrap<MaterialBump>(sided<Material2Sided>(u"Two", multi, layered(u"B", u"Back"))));
+    boost::shared_ptr<MaterialToon> toon = wrap<MaterialToon>(layered(u"Paper"), u"Toon");
+    toon->lineColorTex = acolor(1, 0, 0);
+    xml += conversion(wrap<MaterialBump>(toon));
+    // At the top, two-child classes write the flat Assets of their children,
+    // then their own Asset, whose layout names the class. An absent child
+    // leaves its parameter out. A usable child without a layered material gets
+    // no Asset, yet the parent refers to it by name; a child that resolves to a
+    // reference without a target UUID isn't usable: no parameter, while its
+    // flat Asset is written from the inner copy.
+    boost::shared_ptr<Material2Sided> two = sided<Material2Sided>(u"Two", layered(u"F", u"FL"), layered(u"B", u"BL"));
+    two->translucency = Color(0.25f, 0.5f, 0.75f), two->transparency = Color(1, 1, 1);
+    two->translucency_tex = acolor(1, 1, 1), two->force_1sided = true;
+    xml += conversion(two);
+    xml += conversion(sided<MaterialSkp2Sided>(u"Skp", layered(u"F"), MaterialPtr()));
+    const MaterialPtr unusable = referenceTo(u"outer", referenceTo(u"", layered(u"Copy")));
+    xml += conversion(blend(u"Blend", multi, unusable));
+    xml += conversion(blend(u"Blend", referenceTo(u"u-1", layered(u"Copy")), MaterialPtr()));
+    // A reference at the top is searched through a further reference, under that one's name.
+    xml += conversion(referenceTo(u"u-1", referenceTo(u"u-2", layered(u"Deep", u"Layer"), u"InnerRef")));
+    // A toon at the top: its base through the flat conversion under its own
+    // name, the textures in slot order, then the toon Asset without lineUnits.
+    // A base without a layered material is still referred to, an unusable one isn't.
+    toon = wrap<MaterialToon>(wrap<MaterialBump>(layered(u"Paper"), u"Bumped"), u"Ink");
+    toon->opacityTex = acolor(0.5f, 0, 0), toon->lineWidthTex = acolor(0.25f, 0, 0), toon->divideByDist = true;
+    xml += conversion(toon);
+    xml += conversion(wrap<MaterialToon>(multi, u"Ink"));
+    xml += conversion(wrap<MaterialToon>(unusable, u"Ink"));
+    expectGolden("top_level_trees.xml", xml);
+}
+
+TEST_F(Conversion, OwnForms) {
+    // The two-sided material whole, its textures first.
+    boost::shared_ptr<Material2Sided> two = sided<Material2Sided>(u"Two", MaterialPtr(), MaterialPtr());
+    two->transparency_tex = acolor(1, 0.5f, 0), two->translucency_tex_mult = 2;
+    expectGolden("own_two_sided.xml", ownXml(*two, u"/Lib"));
+    // Every class in one tree: a parent writes its children's Assets first,
+    // below its own url, and refers to them there. The environment override
+    // writes only its base, under its own url; the displaced material its base
+    // one step (the name) below. The object list has an empty list type and
+    // string entries, unescaped. The toon's own form uses the lower-case words.
+    boost::shared_ptr<MaterialOverrideEnvironment> env = wrap<MaterialOverrideEnvironment>(layered(u"L"), u"Env");
+    env->gi_tex = acolor(1, 1, 1);
+    boost::shared_ptr<MaterialObjectExclusion> exclusion = wrap<MaterialObjectExclusion>(wrap<MaterialDisplaced>(env, u"Disp"), u"Ex");
+    exclusion->mode = 3, exclusion->objects = {u"Chair", u"Big <Table>"};
+    boost::shared_ptr<MaterialAlphaContribution> alpha = wrap<MaterialAlphaContribution>(exclusion, u"Al");
+    alpha->alpha_tex = acolor(0, 0, 0);
+    boost::shared_ptr<MaterialToon> toon = wrap<MaterialToon>(alpha, u"Toon");
+    toon->distortTex = acolor(0, 0, 1);
+    boost::shared_ptr<MaterialBump> bump = wrap<MaterialBump>(toon, u"Bump");
+    bump->bump_tex = acolor(1, 0, 0);
+    two->front = bump;
+    two->back = sided<MaterialSkp2Sided>(u"Skp", MaterialPtr(), blend(u"AB", layered(u"One"), MaterialPtr()));
+    expectGolden("own_forms.xml", ownXml(*two, u"/Lib"));
     // Without a base the environment override writes nothing at all.
     EXPECT_EQ(ownXml(*wrap<MaterialOverrideEnvironment>(MaterialPtr(), u"Env"), u"/Lib"), "");
 }
