@@ -12,9 +12,15 @@
 #include <string>
 #include <vector>
 
+#include <boost/make_shared.hpp>
+
 #include "materials/Brdf.h"
 #include "materials/LayeredMaterials.h"
+#include "materials/ReferenceMaterials.h"
 #include "materials/SceneMaterials.h"
+#include "materials/ToonMaterial.h"
+#include "materials/TwoSidedBump.h"
+#include "materials/WrappingMaterials.h"
 #include "persistence/QuickArchive.h"
 #include "textures/BasicTextures.h"
 #include "textures/Bitmaps.h"
@@ -112,6 +118,32 @@ inline boost::shared_ptr<MaterialLayeredBRDF> layered(const std::u16string& name
     m->brdfs.push_back(BrdfPtr(new Diffuse_BRDF));
     m->brdfs[0]->name = layerName;
     return m;
+}
+
+// A wrapper of class W (with a base_mtl) named `name` over `base`.
+template <class W>
+boost::shared_ptr<W> wrap(const MaterialPtr& base, const std::u16string& name = u"Wall") {
+    boost::shared_ptr<W> w(new W);
+    w->name = name, w->base_mtl = base;
+    return w;
+}
+// A two-sided material of either class with its two children.
+template <class T>
+boost::shared_ptr<T> sided(const std::u16string& name, const MaterialPtr& front, const MaterialPtr& back) {
+    boost::shared_ptr<T> m(new T);
+    m->name = name, m->front = front, m->back = back;
+    return m;
+}
+inline boost::shared_ptr<MaterialAngleBlend> blend(const std::u16string& name, const MaterialPtr& one, const MaterialPtr& two) {
+    boost::shared_ptr<MaterialAngleBlend> m(new MaterialAngleBlend);
+    m->name = name, m->mtl_one = one, m->mtl_two = two;
+    return m;
+}
+inline boost::shared_ptr<MaterialReference> referenceTo(const std::u16string& uuid, const std::u16string& name = u"Ref",
+                                                        const MaterialPtr& copy = MaterialPtr()) {
+    boost::shared_ptr<MaterialReference> ref(new MaterialReference);
+    ref->name = name, ref->target_uuid = uuid, ref->target = copy;
+    return ref;
 }
 
 inline TexturePtr acolor(float r, float g, float b, float a = 1) {

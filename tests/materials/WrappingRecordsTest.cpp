@@ -4,13 +4,9 @@
 #include <sstream>
 
 #include "materials/MaterialAssets.h"
-#include "materials/MaterialTree.h"
-#include "materials/ReferenceMaterials.h"
-#include "materials/ToonMaterial.h"
-#include "materials/TwoSidedBump.h"
-#include "materials/WrapperAssets.h"
-#include "materials/WrappingMaterials.h"
 #include "materials/MaterialTestUtil.h"
+#include "materials/MaterialTree.h"
+#include "materials/WrapperAssets.h"
 #include "persistence/OrvMatFile.h"
 #include "persistence/Record.h"
 
@@ -22,138 +18,94 @@ typedef TableTest WrappingRecords;
 
 std::u16string nameOf(const MaterialPtr& m) { return m ? m->name : u"<none>"; }
 
-// ---- old versions ---------------------------------------------------------------------------
+// ---- hand-laid records --------------------------------------------------------------------------
 
-TEST_F(WrappingRecords, TwoSidedVersions) {
-    // Version 1: front, back, translucency_tex, translucency, translucency_tex_mult, force_1sided.
-    RecordBytes v1, v2, v3, skp, skpBad;
-    v1.version(1).multiMember("F").b8(false).acolor(0.25f).color(0.1f, 0.2f, 0.3f).f32(0.5f).b8(true);
-    boost::shared_ptr<Material2Sided> m = loaded<Material2Sided>(v1);
-    EXPECT_EQ(nameOf(m->front), u"F");
-    EXPECT_FALSE(m->back);
-    EXPECT_EQ(acolorRed(m->translucency_tex), 0.25f);
-    EXPECT_EQ(std::make_tuple(m->translucency, m->translucency_tex_mult, m->force_1sided),
-              std::make_tuple(Color(0.1f, 0.2f, 0.3f), 0.5f, true));
-    EXPECT_EQ(std::make_tuple(!m->transparency_tex, m->transparency, m->transparency_tex_mult),
-              std::make_tuple(true, Color(0, 0, 0), 1.f));
-    EXPECT_EQ(m->name, u"DefaultMaterial");  // no name in the record
-    // Version 2: as 1, then transparency_tex, transparency, transparency_tex_mult.
-    v2.version(2).b8(false).b8(false).b8(false).color(0, 0, 0).f32(1).b8(false).acolor(0.75f).color(0.4f, 0.5f, 0.6f).f32(2);
-    m = loaded<Material2Sided>(v2);
-    EXPECT_EQ(acolorRed(m->transparency_tex), 0.75f);
-    EXPECT_EQ(std::make_tuple(m->transparency, m->transparency_tex_mult), std::make_tuple(Color(0.4f, 0.5f, 0.6f), 2.f));
-    // Version 3: as 2, then the base record.
-    v3.version(3).b8(false).multiMember("B").b8(false).color(0, 0, 0).f32(1).b8(false).b8(false).color(0, 0, 0).f32(1);
+TEST_F(WrappingRecords, TwoSidedAndBumpVersions) {
+    // Two-sided 1: front, back, translucency_tex, translucency, translucency_tex_mult, force_1sided.
+    RecordBytes v1, v3, skp, skpBad, b1, b2, b3;
+    auto m = loaded<Material2Sided>(v1.version(1).multiMember("F").b8(false).acolor(0.25f).color(0.1f, 0.2f, 0.3f).f32(0.5f).b8(true));
+    EXPECT_EQ(std::make_tuple(nameOf(m->front), nameOf(m->back), acolorRed(m->translucency_tex), m->translucency),
+              std::make_tuple(u"F", u"<none>", 0.25f, Color(0.1f, 0.2f, 0.3f)));
+    EXPECT_EQ(std::make_tuple(m->translucency_tex_mult, m->force_1sided, m->name), std::make_tuple(0.5f, true, u"DefaultMaterial"));
+    // Two-sided 3 (current): as 1; transparency_tex, transparency, transparency_tex_mult (from 2); the base record.
+    v3.version(3).b8(false).multiMember("B").b8(false).color(0, 0, 0).f32(1).b8(false).acolor(0.75f).color(0.4f, 0.5f, 0.6f).f32(2);
     m = loaded<Material2Sided>(v3.base("Sheet", "uu"));
-    EXPECT_FALSE(m->front);
-    EXPECT_EQ(nameOf(m->back), u"B");
-    EXPECT_EQ(m->name + m->uuid, u"Sheetuu");
-
-    // Skp two-sided, version 1: base record, front, back, force_1sided.
-    const boost::shared_ptr<MaterialSkp2Sided> s =
-        loaded<MaterialSkp2Sided>(skp.version(1).base("Skp").multiMember("F").multiMember("K").b8(true));
-    EXPECT_EQ(s->name + nameOf(s->front) + nameOf(s->back), u"SkpFK");
-    EXPECT_TRUE(s->force_1sided);
-    // A refused base record ends the load before any child is read.
+    EXPECT_EQ(std::make_tuple(nameOf(m->front), nameOf(m->back), m->name, m->uuid), std::make_tuple(u"<none>", u"B", u"Sheet", u"uu"));
+    EXPECT_EQ(std::make_tuple(acolorRed(m->transparency_tex), m->transparency, m->transparency_tex_mult),
+              std::make_tuple(0.75f, Color(0.4f, 0.5f, 0.6f), 2.f));
+    // Skp two-sided 1: base record, front, back, force_1sided. A refused base
+    // record ends the load before any child is read.
+    auto s = loaded<MaterialSkp2Sided>(skp.version(1).base("Skp").multiMember("F").multiMember("K").b8(true));
+    EXPECT_EQ(std::make_tuple(s->name, nameOf(s->front), nameOf(s->back), s->force_1sided), std::make_tuple(u"Skp", u"F", u"K", true));
     EXPECT_FALSE(loaded<MaterialSkp2Sided>(skpBad.version(1).version(3).str("X").multiMember("F"), false)->front);
-}
 
-TEST_F(WrappingRecords, BumpVersions) {
-    // Version 1: name (empty: the default name), path of bump_tex, bump_tex_mult, base_mtl as tag and record.
-    RecordBytes v1, v1NoPath, v2, v3;
-    boost::shared_ptr<MaterialBump> m = loaded<MaterialBump>(v1.version(1).str("").str("C:/maps/bump.png").f32(0.5f).multi("Base"));
-    EXPECT_EQ(m->name, u"DefaultMaterial");
-    EXPECT_EQ(m->bump_tex_mult, 0.5f);
-    EXPECT_EQ(nameOf(m->base_mtl), u"Base");
-    ASSERT_TRUE(m->bump_tex);
-    EXPECT_TRUE(m->bump_tex->isEqual(bitmap(u"C:/maps/bump.png")));
-    // An empty path gives no texture.
-    m = loaded<MaterialBump>(v1NoPath.version(1).str("Old").str("").f32(1).multi("Base"));
-    EXPECT_EQ(m->name, u"Old");
-    EXPECT_FALSE(m->bump_tex);
-    // Version 2: name (an empty one stays empty), bump_tex_mult, bump_tex as member, base_mtl bare.
-    m = loaded<MaterialBump>(v2.version(2).str("").f32(3).acolor(0.5f).multi("Base"));
-    EXPECT_EQ(m->name, u"");
-    EXPECT_EQ(m->bump_tex_mult, 3);
-    EXPECT_EQ(acolorRed(m->bump_tex), 0.5f);
-    // Version 3 (current): bump_tex_mult, bump_tex, base_mtl, base record.
-    m = loaded<MaterialBump>(v3.version(3).f32(2).b8(false).multi("Base").base("Wall", "u-3"));
-    EXPECT_EQ(m->name + m->uuid, u"Wallu-3");
-    EXPECT_FALSE(m->bump_tex);
-    EXPECT_EQ(m->bump_tex_mult, 2);
+    // Bump 1: name (empty: the default name), path of bump_tex, bump_tex_mult, base_mtl as tag and record.
+    auto b = loaded<MaterialBump>(b1.version(1).str("").str("C:/maps/bump.png").f32(0.5f).multi("Base"));
+    EXPECT_EQ(std::make_tuple(b->name, b->bump_tex_mult, nameOf(b->base_mtl)), std::make_tuple(u"DefaultMaterial", 0.5f, u"Base"));
+    EXPECT_TRUE(b->bump_tex && b->bump_tex->isEqual(bitmap(u"C:/maps/bump.png")));
+    // Bump 2: name (an empty one stays empty), bump_tex_mult, bump_tex as member, base_mtl bare.
+    b = loaded<MaterialBump>(b2.version(2).str("").f32(3).acolor(0.5f).multi("Base"));
+    EXPECT_EQ(std::make_tuple(b->name, b->bump_tex_mult, acolorRed(b->bump_tex)), std::make_tuple(u"", 3.f, 0.5f));
+    // Bump 3 (current): bump_tex_mult, bump_tex, base_mtl, base record.
+    b = loaded<MaterialBump>(b3.version(3).f32(2).b8(false).multi("Base").base("Wall", "u-3"));
+    EXPECT_EQ(std::make_tuple(b->name, b->uuid, b->bump_tex_mult, !b->bump_tex), std::make_tuple(u"Wall", u"u-3", 2.f, true));
     QuickArchive out;
-    ASSERT_TRUE(m->save(out));
-    EXPECT_EQ(savedBytes(out), v3.bytes());
+    ASSERT_TRUE(b->save(out));
+    EXPECT_EQ(savedBytes(out), b3.bytes());
     // The base material can't be left out: save fails without it, and a tag
     // without a class fails the load.
-    m->base_mtl.reset();
-    EXPECT_FALSE(m->save(out));
+    b->base_mtl.reset();
+    EXPECT_FALSE(b->save(out));
     loaded<MaterialBump>(RecordBytes().version(3).f32(1).b8(false).u32(15), false);
 }
 
 TEST_F(WrappingRecords, WrapperVersions) {
-    // Environment override, version 1: base record, base_mtl, the textures bg,
-    // gi, reflect, refract, then colours, multipliers and switches in that order.
-    RecordBytes env, d2, d1, x1, x2, x3, blend, alpha;
-    env.version(1).base("Env").multiMember("Base").acolor(0.1f).b8(false).acolor(0.3f).acolor(0.4f);
-    env.color(1, 0, 0).color(0, 1, 0).color(0, 0, 1).color(1, 1, 0).f32(2).f32(3).f32(4).f32(5).b8(true).b8(false).b8(false).b8(true);
-    const boost::shared_ptr<MaterialOverrideEnvironment> e = loaded<MaterialOverrideEnvironment>(env);
+    // Environment override 1: base record, base_mtl, the textures bg, gi,
+    // reflect, refract, then colours, multipliers and switches in that order.
+    RecordBytes env, d2, d1, x1, x3, blend, alpha;
+    env.version(1).base("Env").multiMember("Base").acolor(0.1f).b8(false).acolor(0.3f).acolor(0.4f).color(1, 0, 0).color(0, 1, 0);
+    env.color(0, 0, 1).color(1, 1, 0).f32(2).f32(3).f32(4).f32(5).b8(true).b8(false).b8(false).b8(true);
+    auto e = loaded<MaterialOverrideEnvironment>(env);
     EXPECT_EQ(e->name + nameOf(e->base_mtl), u"EnvBase");
     EXPECT_EQ(std::make_tuple(acolorRed(e->bg_tex), acolorRed(e->gi_tex), acolorRed(e->reflect_tex), acolorRed(e->refract_tex)),
               std::make_tuple(0.1f, -1.f, 0.3f, 0.4f));
     EXPECT_EQ(std::make_tuple(e->bg_color, e->gi_color, e->reflect_color, e->refract_color),
               std::make_tuple(Color(1, 0, 0), Color(0, 1, 0), Color(0, 0, 1), Color(1, 1, 0)));
-    EXPECT_EQ(std::make_tuple(e->bg_tex_mult, e->gi_tex_mult, e->reflect_tex_mult, e->refract_tex_mult),
-              std::make_tuple(2.f, 3.f, 4.f, 5.f));
-    EXPECT_EQ(std::make_tuple(e->override_bg, e->override_gi, e->override_reflect, e->override_refract),
-              std::make_tuple(true, false, false, true));
+    EXPECT_EQ(std::make_tuple(e->bg_tex_mult, e->gi_tex_mult, e->reflect_tex_mult, e->refract_tex_mult, e->override_bg,
+                              e->override_gi, e->override_reflect, e->override_refract),
+              std::make_tuple(2.f, 3.f, 4.f, 5.f, true, false, false, true));
 
-    // Displaced, version 2: base record, base_mtl, displace_tex, the three floats, the four integers.
-    d2.version(2).base("D").b8(false).acolor(0.5f).f32(2).f32(0.25f).f32(8).i32(64).i32(0).i32(0).i32(0);
-    const boost::shared_ptr<MaterialDisplaced> d = loaded<MaterialDisplaced>(d2);
+    // Displaced 2: base record, base_mtl, displace_tex, the three floats, the four integers.
+    auto d = loaded<MaterialDisplaced>(d2.version(2).base("D").b8(false).acolor(0.5f).f32(2).f32(0.25f).f32(8).i32(64).i32(0).i32(0).i32(0));
     auto displaced = [&d] {
         return std::make_tuple(d->displace_tex_mult, d->displace_shift, d->displace_edge_length, d->displace_max_subdivs,
                                d->displace_continuity, d->displace_view_dependent, d->displace_use_globals);
     };
     EXPECT_EQ(displaced(), std::make_tuple(2.f, 0.25f, 8.f, 64, 0, 0, 0));
-    // Version 1 stops behind displace_tex_mult. Loaded into the same object,
+    // Displaced 1 stops behind displace_tex_mult. Loaded into the same object,
     // the later fields are back at their defaults.
     QuickArchive ar = d1.version(1).base("D1").multiMember("Base").b8(false).f32(3).archive();
     ASSERT_TRUE(d->load(ar));
-    EXPECT_EQ(d->name + nameOf(d->base_mtl), u"D1Base");
-    EXPECT_FALSE(d->displace_tex);
+    EXPECT_EQ(std::make_tuple(d->name, nameOf(d->base_mtl), !d->displace_tex), std::make_tuple(u"D1", u"Base", true));
     EXPECT_EQ(displaced(), std::make_tuple(3.f, 0.f, 4.f, 256, 1, 1, 1));
 
-    // Object exclusion, version 1: mode, base_mtl, the object names; no base record.
-    boost::shared_ptr<MaterialObjectExclusion> x =
-        loaded<MaterialObjectExclusion>(x1.version(1).i32(1).multiMember("Base").u32(2).str("Chair").str("Table"));
-    EXPECT_EQ(x->mode, 1);
+    // Object exclusion 1: mode, base_mtl, the object names; no base record (2
+    // adds it, 3 then short_circuit). A count beyond the data fails instead of filling memory.
+    auto x = loaded<MaterialObjectExclusion>(x1.version(1).i32(1).multiMember("Base").u32(2).str("Chair").str("Table"));
+    EXPECT_EQ(std::make_tuple(x->mode, x->name, x->short_circuit), std::make_tuple(1, u"DefaultMaterial", true));
     EXPECT_EQ(x->objects, (std::vector<std::u16string>{u"Chair", u"Table"}));
-    EXPECT_EQ(x->name, u"DefaultMaterial");
-    EXPECT_TRUE(x->short_circuit);
-    // Version 2: as 1, then the base record.
-    x = loaded<MaterialObjectExclusion>(x2.version(2).i32(0).b8(false).u32(0).base("Ex2"));
-    EXPECT_EQ(x->name, u"Ex2");
-    EXPECT_TRUE(x->objects.empty() && x->short_circuit);
-    // Version 3: as 2, then short_circuit.
     x = loaded<MaterialObjectExclusion>(x3.version(3).i32(7).b8(false).u32(1).str("Lamp").base("Ex3").b8(false));
-    EXPECT_EQ(x->mode, 7);
-    EXPECT_FALSE(x->short_circuit);
-    // A count beyond the data fails instead of filling memory.
+    EXPECT_EQ(std::make_tuple(x->mode, x->name, x->short_circuit, x->objects[0]), std::make_tuple(7, u"Ex3", false, u"Lamp"));
     loaded<MaterialObjectExclusion>(RecordBytes().version(3).i32(0).b8(false).u32(0x7FFFFFFF), false);
 
-    // Angle blend, version 1: base record, mtl_one, mtl_two, start, stop.
-    const boost::shared_ptr<MaterialAngleBlend> a =
-        loaded<MaterialAngleBlend>(blend.version(1).base("Blend").b8(false).multiMember("Two").f32(10).f32(20));
-    EXPECT_FALSE(a->mtl_one);
-    EXPECT_EQ(nameOf(a->mtl_two), u"Two");
-    EXPECT_EQ(std::make_tuple(a->start_angle, a->stop_angle), std::make_tuple(10.f, 20.f));
-
-    // Alpha contribution, version 1: base record, base_mtl, alpha_tex, alpha_tex_mult, alpha.
-    const boost::shared_ptr<MaterialAlphaContribution> c =
-        loaded<MaterialAlphaContribution>(alpha.version(1).base("Alpha").multiMember("Base").acolor(0.5f).f32(2).f32(0.25f));
-    EXPECT_EQ(nameOf(c->base_mtl), u"Base");
-    EXPECT_EQ(std::make_tuple(acolorRed(c->alpha_tex), c->alpha_tex_mult, c->alpha), std::make_tuple(0.5f, 2.f, 0.25f));
+    // Angle blend 1: base record, mtl_one, mtl_two, start, stop.
+    auto a = loaded<MaterialAngleBlend>(blend.version(1).base("Blend").b8(false).multiMember("Two").f32(10).f32(20));
+    EXPECT_EQ(std::make_tuple(nameOf(a->mtl_one), nameOf(a->mtl_two), a->start_angle, a->stop_angle),
+              std::make_tuple(u"<none>", u"Two", 10.f, 20.f));
+    // Alpha contribution 1: base record, base_mtl, alpha_tex, alpha_tex_mult, alpha.
+    auto c = loaded<MaterialAlphaContribution>(alpha.version(1).base("Alpha").multiMember("Base").acolor(0.5f).f32(2).f32(0.25f));
+    EXPECT_EQ(std::make_tuple(nameOf(c->base_mtl), acolorRed(c->alpha_tex), c->alpha_tex_mult, c->alpha),
+              std::make_tuple(u"Base", 0.5f, 2.f, 0.25f));
 }
 
 TEST_F(WrappingRecords, ToonVersions) {
@@ -164,7 +116,7 @@ TEST_F(WrappingRecords, ToonVersions) {
     RecordBytes v1;
     v1.version(1).multiMember("Base").f32(2).f32(3).acolor(0.1f).f32(0.5f).f32(4).b8(false).f32(0.25f).f32(5).acolor(0.3f);
     v1.color(0.2f, 0.4f, 0.6f).f32(6).acolor(0.4f).f32(0.9f).f32(0.01f).f32(0.6f).f32(2.5f).b8(false).b8(true).base("Ink");
-    boost::shared_ptr<MaterialToon> t = loaded<MaterialToon>(v1);
+    auto t = loaded<MaterialToon>(v1);
     EXPECT_EQ(t->name + nameOf(t->base_mtl), u"InkBase");
     EXPECT_EQ(std::make_tuple(t->lineWidth, t->lineWidthTexMult, acolorRed(t->lineWidthTex), t->opacity, t->opacityTexMult,
                               acolorRed(t->opacityTex), t->distort, t->distortTexMult, acolorRed(t->distortTex)),
@@ -172,44 +124,37 @@ TEST_F(WrappingRecords, ToonVersions) {
     EXPECT_EQ(std::make_tuple(t->lineColor, t->lineColorTexMult, acolorRed(t->lineColorTex), t->zThreshold, t->traceBias,
                               t->normalThreshold, t->lineUnits, t->doSecondary, t->divideByDist),
               std::make_tuple(Color(0.2f, 0.4f, 0.6f), 6.f, 0.4f, 0.9f, 0.01f, 0.6f, 2.5f, false, true));
-    // Version 1 has neither of the silhouette fields.
+    // Version 1 has neither of the silhouette fields; version 2 adds doSilhouetteMult and silhouetteMult.
     EXPECT_EQ(std::make_tuple(t->doSilhouetteMult, t->silhouetteMult), std::make_tuple(false, 1.5f));
-    // Version 2 adds doSilhouetteMult and silhouetteMult.
     std::vector<char> bytes = v1.bytes();
     bytes[2] = 2;  // the version tag 0x20000
     t = loaded<MaterialToon>(RecordBytes().raw(bytes).b8(true).f32(3));
     EXPECT_EQ(std::make_tuple(t->doSilhouetteMult, t->silhouetteMult, t->lineUnits), std::make_tuple(true, 3.f, 2.5f));
 }
 
-// ---- every class: round trips, copies, comparisons, refused tags --------------------------
+// ---- every class: round trips, copies, comparisons, refused tags ------------------------------------
 
 // One object of each class, with children and values away from the defaults.
 std::vector<MaterialPtr> sampleMaterials() {
-    boost::shared_ptr<Material2Sided> twoSided(new Material2Sided);
-    twoSided->name = u"TwoSided", twoSided->front = layered(u"Front"), twoSided->back = layered(u"Back");
-    twoSided->translucency_tex = acolor(0.5f, 0, 0), twoSided->transparency = Color(0.1f, 0.2f, 0.3f);
-    twoSided->force_1sided = true;
-    boost::shared_ptr<MaterialSkp2Sided> skp(new MaterialSkp2Sided);
-    skp->name = u"Skp", skp->back = layered(u"Back"), skp->force_1sided = true;
-    boost::shared_ptr<MaterialBump> bump(new MaterialBump);
-    bump->name = u"Bump", bump->base_mtl = layered(u"Base"), bump->bump_tex = acolor(0.25f, 0, 0), bump->bump_tex_mult = 0.75f;
-    boost::shared_ptr<MaterialOverrideEnvironment> env(new MaterialOverrideEnvironment);
-    env->name = u"Env", env->base_mtl = layered(u"Base"), env->gi_tex = acolor(0.1f, 0, 0);
-    env->refract_color = Color(1, 0, 1), env->reflect_tex_mult = 3, env->override_gi = true;
-    boost::shared_ptr<MaterialDisplaced> displaced(new MaterialDisplaced);
-    displaced->name = u"Displaced", displaced->base_mtl = layered(u"Base"), displaced->displace_tex = acolor(0.2f, 0, 0);
-    displaced->displace_shift = 0.5f, displaced->displace_use_globals = 0;
-    boost::shared_ptr<MaterialObjectExclusion> exclusion(new MaterialObjectExclusion);
-    exclusion->name = u"Exclusion", exclusion->base_mtl = layered(u"Base"), exclusion->mode = 1;
-    exclusion->objects = {u"Chair", u"Table"}, exclusion->short_circuit = false;
-    boost::shared_ptr<MaterialAlphaContribution> alpha(new MaterialAlphaContribution);
-    alpha->name = u"Alpha", alpha->base_mtl = layered(u"Base"), alpha->alpha_tex = acolor(0.3f, 0, 0), alpha->alpha = 0.5f;
-    boost::shared_ptr<MaterialAngleBlend> blend(new MaterialAngleBlend);
-    blend->name = u"Blend", blend->mtl_one = layered(u"One"), blend->mtl_two = layered(u"Two"), blend->stop_angle = 90;
-    boost::shared_ptr<MaterialToon> toon(new MaterialToon);
-    toon->name = u"Toon", toon->base_mtl = layered(u"Base"), toon->opacityTex = acolor(0.4f, 0, 0);
-    toon->lineUnits = 2, toon->doSilhouetteMult = true;
-    return {twoSided, skp, bump, env, displaced, exclusion, alpha, blend, toon};
+    auto twoSided = sided<Material2Sided>(u"TwoSided", layered(u"Front"), layered(u"Back"));
+    twoSided->translucency_tex = acolor(0.5f, 0, 0), twoSided->transparency = Color(0.1f, 0.2f, 0.3f), twoSided->force_1sided = true;
+    auto skp = sided<MaterialSkp2Sided>(u"Skp", MaterialPtr(), layered(u"Back"));
+    skp->force_1sided = true;
+    auto bump = wrap<MaterialBump>(layered(u"Base"), u"Bump");
+    bump->bump_tex = acolor(0.25f, 0, 0), bump->bump_tex_mult = 0.75f;
+    auto env = wrap<MaterialOverrideEnvironment>(layered(u"Base"), u"Env");
+    env->gi_tex = acolor(0.1f, 0, 0), env->refract_color = Color(1, 0, 1), env->reflect_tex_mult = 3, env->override_gi = true;
+    auto displaced = wrap<MaterialDisplaced>(layered(u"Base"), u"Displaced");
+    displaced->displace_tex = acolor(0.2f, 0, 0), displaced->displace_shift = 0.5f, displaced->displace_use_globals = 0;
+    auto exclusion = wrap<MaterialObjectExclusion>(layered(u"Base"), u"Exclusion");
+    exclusion->mode = 1, exclusion->objects = {u"Chair", u"Table"}, exclusion->short_circuit = false;
+    auto alpha = wrap<MaterialAlphaContribution>(layered(u"Base"), u"Alpha");
+    alpha->alpha_tex = acolor(0.3f, 0, 0), alpha->alpha = 0.5f;
+    auto angle = blend(u"Blend", layered(u"One"), layered(u"Two"));
+    angle->stop_angle = 90;
+    auto toon = wrap<MaterialToon>(layered(u"Base"), u"Toon");
+    toon->opacityTex = acolor(0.4f, 0, 0), toon->lineUnits = 2, toon->doSilhouetteMult = true;
+    return {twoSided, skp, bump, env, displaced, exclusion, alpha, angle, toon};
 }
 
 TEST_F(WrappingRecords, EveryClassRoundTripsAndCompares) {
@@ -220,46 +165,38 @@ TEST_F(WrappingRecords, EveryClassRoundTripsAndCompares) {
         ASSERT_TRUE(copy->load(ar));
         EXPECT_EQ(ar.getReadPosition(), ar.getWritePosition());
         EXPECT_EQ(copy->name, m->name);
-        EXPECT_TRUE(copy->isEqual(m));
-        EXPECT_TRUE(m->isEqual(copy));
+        EXPECT_TRUE(copy->isEqual(m) && m->isEqual(copy));
         // A changed child makes them differ.
         for (const MaterialPtr& child : childMaterials(*copy)) {
             boost::dynamic_pointer_cast<MaterialLayeredBRDF>(child)->double_sided = 5;
             EXPECT_FALSE(copy->isEqual(m));
             boost::dynamic_pointer_cast<MaterialLayeredBRDF>(child)->double_sided = 1;
         }
-        EXPECT_FALSE(m->isEqual(MaterialPtr()));
-        EXPECT_FALSE(m->isEqual(layered(u"Other")));
+        EXPECT_FALSE(m->isEqual(MaterialPtr()) || m->isEqual(layered(u"Other")));
     }
 }
 
+#define CHANGE(Class, change) {k##Class, [](BaseMaterial& m) { static_cast<Class&>(m).change; }}
+
 TEST_F(WrappingRecords, FieldsTakePartInTheComparison) {
     // One field changed at a time must make a copy differ.
-    const std::vector<std::pair<std::uint32_t, std::function<void(BaseMaterial&)>>> cases = {
-        {kMaterial2Sided, [](BaseMaterial& m) { static_cast<Material2Sided&>(m).transparency_tex_mult = 9; }},
-        {kMaterial2Sided, [](BaseMaterial& m) { static_cast<Material2Sided&>(m).translucency_tex.reset(); }},
-        {kMaterialSkp2Sided, [](BaseMaterial& m) { static_cast<MaterialSkp2Sided&>(m).force_1sided = false; }},
-        {kMaterialBump, [](BaseMaterial& m) { static_cast<MaterialBump&>(m).bump_tex_mult = 9; }},
-        {kMaterialOverrideEnvironment, [](BaseMaterial& m) { static_cast<MaterialOverrideEnvironment&>(m).override_refract = true; }},
-        {kMaterialOverrideEnvironment, [](BaseMaterial& m) { static_cast<MaterialOverrideEnvironment&>(m).bg_color = Color(0, 0, 1); }},
-        {kMaterialDisplaced, [](BaseMaterial& m) { static_cast<MaterialDisplaced&>(m).displace_max_subdivs = 1; }},
-        {kMaterialObjectExclusion, [](BaseMaterial& m) { static_cast<MaterialObjectExclusion&>(m).objects[1] = u"Sofa"; }},
-        {kMaterialObjectExclusion, [](BaseMaterial& m) { static_cast<MaterialObjectExclusion&>(m).mode = 0; }},
-        {kMaterialAlphaContribution, [](BaseMaterial& m) { static_cast<MaterialAlphaContribution&>(m).alpha = 1; }},
-        {kMaterialAngleBlend, [](BaseMaterial& m) { static_cast<MaterialAngleBlend&>(m).start_angle = 1; }},
-        {kMaterialToon, [](BaseMaterial& m) { static_cast<MaterialToon&>(m).lineUnits = 1; }},
-        {kMaterialToon, [](BaseMaterial& m) { static_cast<MaterialToon&>(m).divideByDist = true; }},
-        {kMaterialToon, [](BaseMaterial& m) { static_cast<MaterialToon&>(m).opacityTex.reset(); }},
+    const std::pair<std::uint32_t, void (*)(BaseMaterial&)> cases[] = {
+        CHANGE(Material2Sided, transparency_tex_mult = 9),  CHANGE(Material2Sided, translucency_tex.reset()),
+        CHANGE(MaterialSkp2Sided, force_1sided = false),    CHANGE(MaterialBump, bump_tex_mult = 9),
+        CHANGE(MaterialOverrideEnvironment, override_refract = true),
+        CHANGE(MaterialOverrideEnvironment, bg_color = Color(0, 0, 1)),
+        CHANGE(MaterialDisplaced, displace_max_subdivs = 1), CHANGE(MaterialObjectExclusion, objects[1] = u"Sofa"),
+        CHANGE(MaterialObjectExclusion, mode = 0),           CHANGE(MaterialAlphaContribution, alpha = 1),
+        CHANGE(MaterialAngleBlend, start_angle = 1),         CHANGE(MaterialToon, lineUnits = 1),
+        CHANGE(MaterialToon, divideByDist = true),           CHANGE(MaterialToon, opacityTex.reset()),
     };
     const std::vector<MaterialPtr> all = sampleMaterials();
     for (const auto& c : cases) {
-        for (const MaterialPtr& m : all) {
-            if (m->getType() != c.first) continue;
-            const MaterialPtr copy = m->clone();
-            ASSERT_TRUE(copy->isEqual(m)) << c.first;
-            c.second(*copy);
-            EXPECT_FALSE(copy->isEqual(m)) << c.first << " case " << &c - &cases[0];
-        }
+        const MaterialPtr m = *std::find_if(all.begin(), all.end(), [&c](const MaterialPtr& s) { return s->getType() == c.first; });
+        const MaterialPtr copy = m->clone();
+        ASSERT_TRUE(copy->isEqual(m)) << c.first;
+        c.second(*copy);
+        EXPECT_FALSE(copy->isEqual(m)) << c.first << " case " << &c - cases;
     }
     // Object names compare without regard to case.
     const MaterialPtr copy = all[5]->clone();
@@ -268,8 +205,8 @@ TEST_F(WrappingRecords, FieldsTakePartInTheComparison) {
 }
 
 TEST_F(WrappingRecords, CopiesTakeNamesAndShareTexturesAsTheirClassSays) {
-    // Make the names of the sample materials and their children taken, so
-    // that a new unique name differs from the old one.
+    // Make the names of the sample materials and their children taken, so that
+    // a new unique name differs from the old one.
     const std::vector<MaterialPtr> all = sampleMaterials();
     for (const MaterialPtr& m : all) {
         table().addMaterial(m);
@@ -279,50 +216,41 @@ TEST_F(WrappingRecords, CopiesTakeNamesAndShareTexturesAsTheirClassSays) {
         SCOPED_TRACE(wideToUtf8(m->name));
         m->uuid = u"some-uuid";
         const MaterialPtr dup = m->duplicate(), cl = m->clone();
-        EXPECT_NE(dup->name, m->name);
-        EXPECT_EQ(cl->name, m->name);
-        EXPECT_TRUE(dup->uuid.empty() && cl->uuid.empty());
+        EXPECT_EQ(std::make_tuple(dup->name != m->name, cl->name, dup->uuid + cl->uuid), std::make_tuple(true, m->name, u""));
         EXPECT_TRUE(dup->isEqual(m) && cl->isEqual(m));
-        const std::vector<MaterialPtr> mine = childMaterials(*m), dupChildren = childMaterials(*dup),
-                                       clChildren = childMaterials(*cl);
+        const std::vector<MaterialPtr> mine = childMaterials(*m), dupChildren = childMaterials(*dup), clChildren = childMaterials(*cl);
         ASSERT_EQ(dupChildren.size(), mine.size());
         ASSERT_EQ(clChildren.size(), mine.size());
         for (std::size_t i = 0; i < mine.size(); ++i) {
-            EXPECT_NE(dupChildren[i], mine[i]);
-            EXPECT_NE(clChildren[i], mine[i]);
+            EXPECT_TRUE(dupChildren[i] != mine[i] && clChildren[i] != mine[i]);
             EXPECT_NE(dupChildren[i]->name, mine[i]->name) << "children of a duplicate are duplicated";
             // A toon clone takes its base material's duplicate too.
             EXPECT_EQ(clChildren[i]->name == mine[i]->name, m->getType() != kMaterialToon);
         }
     }
     // Two-sided copies share their textures; the others clone them.
-    const Material2Sided& twoSided = static_cast<const Material2Sided&>(*all[0]);
+    auto& twoSided = static_cast<const Material2Sided&>(*all[0]);
     EXPECT_EQ(static_cast<const Material2Sided&>(*twoSided.duplicate()).translucency_tex, twoSided.translucency_tex);
-    const MaterialBump& bump = static_cast<const MaterialBump&>(*all[2]);
+    auto& bump = static_cast<const MaterialBump&>(*all[2]);
     EXPECT_NE(static_cast<const MaterialBump&>(*bump.clone()).bump_tex, bump.bump_tex);
-    const MaterialToon& toon = static_cast<const MaterialToon&>(*all[8]);
+    auto& toon = static_cast<const MaterialToon&>(*all[8]);
     EXPECT_NE(static_cast<const MaterialToon&>(*toon.clone()).opacityTex, toon.opacityTex);
 }
 
-TEST_F(WrappingRecords, ResetsLeaveTheNameAsTheirClassSays) {
-    for (std::uint32_t tag : {kMaterial2Sided, kMaterialSkp2Sided, kMaterialOverrideEnvironment, kMaterialDisplaced,
-                              kMaterialObjectExclusion, kMaterialAlphaContribution, kMaterialAngleBlend, kMaterialToon,
-                              kMaterialBump}) {
-        const MaterialPtr m = createMaterial(tag);
-        m->name = u"Kept";
+TEST_F(WrappingRecords, ResetsRefusedTagsAndTruncatedRecords) {
+    // Only the bump's reset takes a new default name and drops the uuid.
+    for (const MaterialPtr& m : sampleMaterials()) {
         m->uuid = u"kept-uuid";
+        const std::u16string name = m->name;
         m->reset();
-        // Only the bump takes a new default name and drops the uuid.
-        EXPECT_EQ(m->name + m->uuid, tag == kMaterialBump ? u"DefaultMaterial" : u"Keptkept-uuid") << tag;
+        EXPECT_EQ(std::make_tuple(m->name, m->uuid), m->getType() == kMaterialBump ? std::make_tuple(std::u16string(u"DefaultMaterial"), std::u16string())
+                                                                                   : std::make_tuple(name, std::u16string(u"kept-uuid")));
     }
-}
-
-TEST_F(WrappingRecords, RefusedTagsAndTruncatedRecords) {
     const std::pair<std::uint32_t, std::vector<std::uint32_t>> cases[] = {
-        {kMaterial2Sided, {0, 0x40000, 0x30001}},   {kMaterialSkp2Sided, {0, 0x20000, 0x10001}},
-        {kMaterialBump, {0, 0x40000, 0x10100}},     {kMaterialOverrideEnvironment, {0, 0x20000}},
+        {kMaterial2Sided, {0, 0x40000, 0x30001}},    {kMaterialSkp2Sided, {0, 0x20000, 0x10001}},
+        {kMaterialBump, {0, 0x40000, 0x10100}},      {kMaterialOverrideEnvironment, {0, 0x20000}},
         {kMaterialDisplaced, {0, 0x30000, 0x20001}}, {kMaterialObjectExclusion, {0, 0x40000}},
-        {kMaterialAlphaContribution, {0, 0x20000}}, {kMaterialAngleBlend, {0, 0x20000}},
+        {kMaterialAlphaContribution, {0, 0x20000}},  {kMaterialAngleBlend, {0, 0x20000}},
         {kMaterialToon, {0, 0x30000, 0x10002}},
     };
     for (const auto& c : cases) {
@@ -344,7 +272,7 @@ TEST_F(WrappingRecords, RefusedTagsAndTruncatedRecords) {
     }
 }
 
-// ---- nesting ------------------------------------------------------------------------------------
+// ---- nesting ------------------------------------------------------------------------------------------
 
 // How one wrapper class lays its record around its (first) child: the bytes in
 // front of the child's tag, whether a present flag stands there, and the bytes
@@ -357,46 +285,37 @@ struct WrapperLayout {
 };
 
 const std::vector<WrapperLayout>& layouts() {
+    typedef RecordBytes& B;
     static const std::vector<WrapperLayout> all = {
         // Bump 3: bump_tex_mult, bump_tex | base_mtl bare | base record.
-        {"bump", kMaterialBump, false, [](RecordBytes& b) { b.version(3).f32(1).b8(false); },
-         [](RecordBytes& b) { b.base("N"); }},
+        {"bump", kMaterialBump, false, [](B b) { b.version(3).f32(1).b8(false); }, [](B b) { b.base("N"); }},
         // Two-sided 1: front | back, translucency_tex, translucency, mult, force.
-        {"two-sided", kMaterial2Sided, true, [](RecordBytes& b) { b.version(1); },
-         [](RecordBytes& b) { b.b8(false).b8(false).color(0, 0, 0).f32(1).b8(false); }},
+        {"two-sided", kMaterial2Sided, true, [](B b) { b.version(1); }, [](B b) { b.b8(false).b8(false).color(0, 0, 0).f32(1).b8(false); }},
         // Skp two-sided 1: base record | front | back, force.
-        {"skp two-sided", kMaterialSkp2Sided, true, [](RecordBytes& b) { b.version(1).base("N"); },
-         [](RecordBytes& b) { b.b8(false).b8(false); }},
+        {"skp two-sided", kMaterialSkp2Sided, true, [](B b) { b.version(1).base("N"); }, [](B b) { b.b8(false).b8(false); }},
         // Linked 1: id (kind 2) | material bare | base record.
-        {"linked", kMaterialLinked, false, [](RecordBytes& b) { b.version(1).version(1).u32(2).i32(7); },
-         [](RecordBytes& b) { b.base("N"); }},
+        {"linked", kMaterialLinked, false, [](B b) { b.version(1).version(1).u32(2).i32(7); }, [](B b) { b.base("N"); }},
         // Environment override 1: base record | base_mtl | four textures, colours, multipliers, switches.
-        {"environment", kMaterialOverrideEnvironment, true, [](RecordBytes& b) { b.version(1).base("N"); },
-         [](RecordBytes& b) {
+        {"environment", kMaterialOverrideEnvironment, true, [](B b) { b.version(1).base("N"); },
+         [](B b) {
              b.b8(false).b8(false).b8(false).b8(false).color(0, 0, 0).color(0, 0, 0).color(0, 0, 0).color(0, 0, 0);
              b.f32(1).f32(1).f32(1).f32(1).b8(false).b8(false).b8(false).b8(false);
          }},
         // Displaced 1: base record | base_mtl | displace_tex, mult.
-        {"displaced", kMaterialDisplaced, true, [](RecordBytes& b) { b.version(1).base("N"); },
-         [](RecordBytes& b) { b.b8(false).f32(1); }},
+        {"displaced", kMaterialDisplaced, true, [](B b) { b.version(1).base("N"); }, [](B b) { b.b8(false).f32(1); }},
         // Object exclusion 3: mode | base_mtl | names, base record, short_circuit.
-        {"exclusion", kMaterialObjectExclusion, true, [](RecordBytes& b) { b.version(3).i32(0); },
-         [](RecordBytes& b) { b.u32(0).base("N").b8(true); }},
+        {"exclusion", kMaterialObjectExclusion, true, [](B b) { b.version(3).i32(0); }, [](B b) { b.u32(0).base("N").b8(true); }},
         // Alpha contribution 1: base record | base_mtl | alpha_tex, two floats.
-        {"alpha", kMaterialAlphaContribution, true, [](RecordBytes& b) { b.version(1).base("N"); },
-         [](RecordBytes& b) { b.b8(false).f32(1).f32(1); }},
+        {"alpha", kMaterialAlphaContribution, true, [](B b) { b.version(1).base("N"); }, [](B b) { b.b8(false).f32(1).f32(1); }},
         // Angle blend 1: base record | mtl_one | mtl_two, two angles.
-        {"angle blend", kMaterialAngleBlend, true, [](RecordBytes& b) { b.version(1).base("N"); },
-         [](RecordBytes& b) { b.b8(false).f32(75).f32(150); }},
+        {"angle blend", kMaterialAngleBlend, true, [](B b) { b.version(1).base("N"); }, [](B b) { b.b8(false).f32(75).f32(150); }},
         // Reference 2: base record, target_uuid | embedded copy.
-        {"reference", kMaterialReference, true, [](RecordBytes& b) { b.version(2).base("N").str("t"); },
-         [](RecordBytes&) {}},
+        {"reference", kMaterialReference, true, [](B b) { b.version(2).base("N").str("t"); }, [](B) {}},
         // Toon 2: base_mtl | the line fields, base record, silhouette fields.
-        {"toon", kMaterialToon, true, [](RecordBytes& b) { b.version(2); },
-         [](RecordBytes& b) {
+        {"toon", kMaterialToon, true, [](B b) { b.version(2); },
+         [](B b) {
              b.f32(1.5f).f32(1).b8(false).f32(1).f32(1).b8(false).f32(0).f32(1).b8(false);
-             b.color(0, 0, 0).f32(1).b8(false).f32(0.95f).f32(0.02f).f32(0.7f).f32(1).b8(true).b8(false);
-             b.base("N").b8(false).f32(1.5f);
+             b.color(0, 0, 0).f32(1).b8(false).f32(0.95f).f32(0.02f).f32(0.7f).f32(1).b8(true).b8(false).base("N").b8(false).f32(1.5f);
          }},
     };
     return all;
@@ -418,14 +337,13 @@ RecordBytes chain(int depth, const std::function<std::size_t(int)>& pick) {
     return b;
 }
 
-bool loadChain(const RecordBytes& bytes, std::uint32_t topTag, MaterialPtr* out = nullptr) {
+bool loadChain(const RecordBytes& bytes, std::uint32_t topTag) {
     const MaterialPtr top = createMaterial(topTag);
     QuickArchive ar = bytes.archive();
     const bool ok = top->load(ar);
     if (ok) {
         EXPECT_EQ(ar.getReadPosition(), bytes.size());
     }
-    if (out) *out = top;
     return ok;
 }
 
@@ -439,13 +357,6 @@ TEST_F(WrappingRecords, EveryWrapperClassStopsAtTheNestingLimit) {
         EXPECT_FALSE(loadChain(chain(kMaxNestingDepth + 1, same), layouts()[k].tag));
         EXPECT_FALSE(loadChain(chain(1000, same), layouts()[k].tag));
     }
-    // A reference whose copy holds a reference: converted from the copy of the
-    // copy of the copy, under the innermost reference's name.
-    MaterialPtr top;
-    auto refs = [](int) { return std::size_t(9); };
-    ASSERT_EQ(layouts()[9].tag, kMaterialReference);
-    ASSERT_TRUE(loadChain(chain(3, refs), kMaterialReference, &top));
-    EXPECT_EQ(countOf(wideToUtf8(materialToXml(top)), "url=\"/N\""), 1);
 }
 
 TEST_F(WrappingRecords, AThousandNestedWrappersInAFileFailToLoad) {
@@ -460,18 +371,13 @@ TEST_F(WrappingRecords, AThousandNestedWrappersInAFileFailToLoad) {
         if (depth == 100) {
             // Within the limit the tree converts, flattened under the top.
             const std::string xml = wideToUtf8(materialToXml(library.materials[0]));
-            EXPECT_EQ(countOf(xml, "layout=\"deflumat\""), 1);
-            EXPECT_EQ(countOf(xml, "name=\"bump_on\""), 1);
+            EXPECT_EQ(std::make_tuple(countOf(xml, "layout=\"deflumat\""), countOf(xml, "name=\"bump_on\"")), std::make_tuple(1, 1));
         }
     }
     // Built in memory: saving works at any depth; loading the result fails at
     // the limit, while the conversion still finds the layered material.
     MaterialPtr tree = layered(u"Bottom");
-    for (int i = 0; i < 1000; ++i) {
-        boost::shared_ptr<MaterialBump> bump(new MaterialBump);
-        bump->base_mtl = tree;
-        tree = bump;
-    }
+    for (int i = 0; i < 1000; ++i) tree = wrap<MaterialBump>(tree);
     QuickArchive ar = savedArchive(*tree);
     EXPECT_FALSE(MaterialBump().load(ar));
     EXPECT_EQ(countOf(wideToUtf8(materialToXml(tree)), "layout=\"deflumat\""), 1);
