@@ -59,6 +59,10 @@ public:
     }
     // The same as an optional material member.
     RecordBytes& multiMember(const std::string& name) { return b8(true).multi(name); }
+    // A bare MaterialLayeredBRDF, version 4: no layers, four integers, base record, one integer.
+    RecordBytes& layered(const std::string& name) {
+        return u32(kMaterialLayeredBRDF).version(4).u32(0).i32(1).i32(0).i32(1).i32(1).base(name).i32(0);
+    }
 
     const std::vector<char>& bytes() const { return bytes_; }
     std::size_t size() const { return bytes_.size(); }

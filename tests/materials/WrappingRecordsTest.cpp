@@ -16,120 +16,103 @@ namespace {
 
 typedef TableTest WrappingRecords;
 
-std::u16string nameOf(const MaterialPtr& m) { return m ? m->name : u"<none>"; }
-
 // ---- hand-laid records --------------------------------------------------------------------------
 
-TEST_F(WrappingRecords, TwoSidedAndBumpVersions) {
-    // Two-sided 1: front, back, translucency_tex, translucency, translucency_tex_mult, force_1sided.
-    RecordBytes v1, v3, skp, skpBad, b1, b2, b3;
-    auto m = loaded<Material2Sided>(v1.version(1).multiMember("F").b8(false).acolor(0.25f).color(0.1f, 0.2f, 0.3f).f32(0.5f).b8(true));
-    EXPECT_EQ(std::make_tuple(nameOf(m->front), nameOf(m->back), acolorRed(m->translucency_tex), m->translucency),
-              std::make_tuple(u"F", u"<none>", 0.25f, Color(0.1f, 0.2f, 0.3f)));
-    EXPECT_EQ(std::make_tuple(m->translucency_tex_mult, m->force_1sided, m->name), std::make_tuple(0.5f, true, u"DefaultMaterial"));
-    // Two-sided 3 (current): as 1; transparency_tex, transparency, transparency_tex_mult (from 2); the base record.
-    v3.version(3).b8(false).multiMember("B").b8(false).color(0, 0, 0).f32(1).b8(false).acolor(0.75f).color(0.4f, 0.5f, 0.6f).f32(2);
-    m = loaded<Material2Sided>(v3.base("Sheet", "uu"));
-    EXPECT_EQ(std::make_tuple(nameOf(m->front), nameOf(m->back), m->name, m->uuid), std::make_tuple(u"<none>", u"B", u"Sheet", u"uu"));
-    EXPECT_EQ(std::make_tuple(acolorRed(m->transparency_tex), m->transparency, m->transparency_tex_mult),
-              std::make_tuple(0.75f, Color(0.4f, 0.5f, 0.6f), 2.f));
-    // Skp two-sided 1: base record, front, back, force_1sided. A refused base
-    // record ends the load before any child is read.
-    auto s = loaded<MaterialSkp2Sided>(skp.version(1).base("Skp").multiMember("F").multiMember("K").b8(true));
-    EXPECT_EQ(std::make_tuple(s->name, nameOf(s->front), nameOf(s->back), s->force_1sided), std::make_tuple(u"Skp", u"F", u"K", true));
-    EXPECT_FALSE(loaded<MaterialSkp2Sided>(skpBad.version(1).version(3).str("X").multiMember("F"), false)->front);
+struct MaterialRecord {
+    std::uint32_t tag;
+    RecordBytes bytes;
+    bool current;
+};
 
-    // Bump 1: name (empty: the default name), path of bump_tex, bump_tex_mult, base_mtl as tag and record.
-    auto b = loaded<MaterialBump>(b1.version(1).str("").str("C:/maps/bump.png").f32(0.5f).multi("Base"));
-    EXPECT_EQ(std::make_tuple(b->name, b->bump_tex_mult, nameOf(b->base_mtl)), std::make_tuple(u"DefaultMaterial", 0.5f, u"Base"));
-    EXPECT_TRUE(b->bump_tex && b->bump_tex->isEqual(bitmap(u"C:/maps/bump.png")));
-    // Bump 2: name (an empty one stays empty), bump_tex_mult, bump_tex as member, base_mtl bare.
-    b = loaded<MaterialBump>(b2.version(2).str("").f32(3).acolor(0.5f).multi("Base"));
-    EXPECT_EQ(std::make_tuple(b->name, b->bump_tex_mult, acolorRed(b->bump_tex)), std::make_tuple(u"", 3.f, 0.5f));
-    // Bump 3 (current): bump_tex_mult, bump_tex, base_mtl, base record.
-    b = loaded<MaterialBump>(b3.version(3).f32(2).b8(false).multi("Base").base("Wall", "u-3"));
-    EXPECT_EQ(std::make_tuple(b->name, b->uuid, b->bump_tex_mult, !b->bump_tex), std::make_tuple(u"Wall", u"u-3", 2.f, true));
-    QuickArchive out;
-    ASSERT_TRUE(b->save(out));
-    EXPECT_EQ(savedBytes(out), b3.bytes());
-    // The base material can't be left out: save fails without it, and a tag
-    // without a class fails the load.
-    b->base_mtl.reset();
-    EXPECT_FALSE(b->save(out));
-    loaded<MaterialBump>(RecordBytes().version(3).f32(1).b8(false).u32(15), false);
+// Toon 1: base_mtl; lineWidth, lineWidthTexMult, lineWidthTex; opacity,
+// opacityTexMult, opacityTex; distort, distortTexMult, distortTex; lineColor,
+// lineColorTexMult, lineColorTex; zThreshold, traceBias, normalThreshold,
+// lineUnits; doSecondary, divideByDist; base record. Toon 2 adds doSilhouetteMult, silhouetteMult.
+RecordBytes toon(int version) {
+    RecordBytes b;
+    b.version(version).multiMember("Base").f32(2).f32(3).acolor(0.1f).f32(0.5f).f32(4).b8(false).f32(0.25f).f32(5).acolor(0.3f);
+    b.color(0.2f, 0.4f, 0.6f).f32(6).acolor(0.4f).f32(0.9f).f32(0.01f).f32(0.6f).f32(2.5f).b8(false).b8(true).base("Ink");
+    return version == 1 ? b : b.b8(true).f32(3);
 }
 
-TEST_F(WrappingRecords, WrapperVersions) {
-    // Environment override 1: base record, base_mtl, the textures bg, gi,
-    // reflect, refract, then colours, multipliers and switches in that order.
-    RecordBytes env, d2, d1, x1, x3, blend, alpha;
-    env.version(1).base("Env").multiMember("Base").acolor(0.1f).b8(false).acolor(0.3f).acolor(0.4f).color(1, 0, 0).color(0, 1, 0);
-    env.color(0, 0, 1).color(1, 1, 0).f32(2).f32(3).f32(4).f32(5).b8(true).b8(false).b8(false).b8(true);
-    auto e = loaded<MaterialOverrideEnvironment>(env);
-    EXPECT_EQ(e->name + nameOf(e->base_mtl), u"EnvBase");
-    EXPECT_EQ(std::make_tuple(acolorRed(e->bg_tex), acolorRed(e->gi_tex), acolorRed(e->reflect_tex), acolorRed(e->refract_tex)),
-              std::make_tuple(0.1f, -1.f, 0.3f, 0.4f));
-    EXPECT_EQ(std::make_tuple(e->bg_color, e->gi_color, e->reflect_color, e->refract_color),
-              std::make_tuple(Color(1, 0, 0), Color(0, 1, 0), Color(0, 0, 1), Color(1, 1, 0)));
-    EXPECT_EQ(std::make_tuple(e->bg_tex_mult, e->gi_tex_mult, e->reflect_tex_mult, e->refract_tex_mult, e->override_bg,
-                              e->override_gi, e->override_reflect, e->override_refract),
-              std::make_tuple(2.f, 3.f, 4.f, 5.f, true, false, false, true));
-
-    // Displaced 2: base record, base_mtl, displace_tex, the three floats, the four integers.
-    auto d = loaded<MaterialDisplaced>(d2.version(2).base("D").b8(false).acolor(0.5f).f32(2).f32(0.25f).f32(8).i32(64).i32(0).i32(0).i32(0));
-    auto displaced = [&d] {
-        return std::make_tuple(d->displace_tex_mult, d->displace_shift, d->displace_edge_length, d->displace_max_subdivs,
-                               d->displace_continuity, d->displace_view_dependent, d->displace_use_globals);
+const std::vector<MaterialRecord>& materialRecords() {
+    static const std::vector<MaterialRecord> all = {
+        // Two-sided 1: front, back, translucency_tex, translucency, translucency_tex_mult, force_1sided.
+        {kMaterial2Sided, RecordBytes().version(1).multiMember("F").b8(false).acolor(0.25f).color(0.1f, 0.2f, 0.3f).f32(0.5f).b8(true), false},
+        // Two-sided 2: as 1, then transparency_tex, transparency, transparency_tex_mult. 3: as 2, then the base record.
+        {kMaterial2Sided, RecordBytes().version(2).b8(false).b8(false).b8(false).color(0, 0, 0).f32(1).b8(false).acolor(0.75f)
+                              .color(0.4f, 0.5f, 0.6f).f32(2), false},
+        {kMaterial2Sided, RecordBytes().version(3).b8(false).multiMember("B").b8(false).color(0, 0, 0).f32(1).b8(false).b8(false)
+                              .color(0, 0, 0).f32(1).base("Sheet", "uu"), true},
+        // Skp two-sided 1: base record, front, back, force_1sided.
+        {kMaterialSkp2Sided, RecordBytes().version(1).base("Skp").multiMember("F").multiMember("K").b8(true), true},
+        // Bump 1: name (empty: the default name), path of bump_tex, bump_tex_mult, base_mtl as tag and record.
+        {kMaterialBump, RecordBytes().version(1).str("").str("C:/maps/bump.png").f32(0.5f).multi("Base"), false},
+        // Bump 2: name (an empty one stays empty), bump_tex_mult, bump_tex as member, base_mtl bare.
+        {kMaterialBump, RecordBytes().version(2).str("").f32(3).acolor(0.5f).multi("Base"), false},
+        // Bump 3: bump_tex_mult, bump_tex, base_mtl, base record.
+        {kMaterialBump, RecordBytes().version(3).f32(2).b8(false).multi("Base").base("Wall", "u-3"), true},
+        // Environment override 1: base record, base_mtl, the textures bg, gi,
+        // reflect, refract, then colours, multipliers and switches in that order.
+        {kMaterialOverrideEnvironment, RecordBytes().version(1).base("Env").b8(true).layered("Base").acolor(0.1f).b8(false).acolor(0.3f)
+                                           .acolor(0.4f).color(1, 0, 0).color(0, 1, 0).color(0, 0, 1).color(1, 1, 0).f32(2).f32(3)
+                                           .f32(4).f32(5).b8(true).b8(false).b8(false).b8(true), true},
+        // Displaced 1: base record, base_mtl, displace_tex, displace_tex_mult.
+        // 2: as 1, then displace_shift, displace_edge_length, the four integers.
+        {kMaterialDisplaced, RecordBytes().version(1).base("D1").b8(true).layered("Base").b8(false).f32(3), false},
+        {kMaterialDisplaced, RecordBytes().version(2).base("D").b8(true).layered("Base").acolor(0.5f).f32(2).f32(0.25f).f32(8)
+                                 .i32(64).i32(0).i32(0).i32(0), true},
+        // Object exclusion 1: mode, base_mtl, the object names; no base record.
+        // 2: as 1, then the base record. 3: as 2, then short_circuit.
+        {kMaterialObjectExclusion, RecordBytes().version(1).i32(1).multiMember("Base").u32(2).str("Chair").str("Table"), false},
+        {kMaterialObjectExclusion, RecordBytes().version(2).i32(0).b8(false).u32(0).base("Ex2"), false},
+        {kMaterialObjectExclusion, RecordBytes().version(3).i32(7).b8(false).u32(1).str("Lamp").base("Ex3").b8(false), true},
+        // Angle blend 1: base record, mtl_one, mtl_two, start_angle, stop_angle.
+        {kMaterialAngleBlend, RecordBytes().version(1).base("Blend").b8(false).multiMember("Two").f32(10).f32(20), true},
+        // Alpha contribution 1: base record, base_mtl, alpha_tex, alpha_tex_mult, alpha.
+        {kMaterialAlphaContribution, RecordBytes().version(1).base("Alpha").multiMember("Base").acolor(0.5f).f32(2).f32(0.25f), true},
+        {kMaterialToon, toon(1), false},
+        {kMaterialToon, toon(2), true},
     };
-    EXPECT_EQ(displaced(), std::make_tuple(2.f, 0.25f, 8.f, 64, 0, 0, 0));
-    // Displaced 1 stops behind displace_tex_mult. Loaded into the same object,
-    // the later fields are back at their defaults.
-    QuickArchive ar = d1.version(1).base("D1").multiMember("Base").b8(false).f32(3).archive();
-    ASSERT_TRUE(d->load(ar));
-    EXPECT_EQ(std::make_tuple(d->name, nameOf(d->base_mtl), !d->displace_tex), std::make_tuple(u"D1", u"Base", true));
-    EXPECT_EQ(displaced(), std::make_tuple(3.f, 0.f, 4.f, 256, 1, 1, 1));
-
-    // Object exclusion 1: mode, base_mtl, the object names; no base record (2
-    // adds it, 3 then short_circuit). A count beyond the data fails instead of filling memory.
-    auto x = loaded<MaterialObjectExclusion>(x1.version(1).i32(1).multiMember("Base").u32(2).str("Chair").str("Table"));
-    EXPECT_EQ(std::make_tuple(x->mode, x->name, x->short_circuit), std::make_tuple(1, u"DefaultMaterial", true));
-    EXPECT_EQ(x->objects, (std::vector<std::u16string>{u"Chair", u"Table"}));
-    x = loaded<MaterialObjectExclusion>(x3.version(3).i32(7).b8(false).u32(1).str("Lamp").base("Ex3").b8(false));
-    EXPECT_EQ(std::make_tuple(x->mode, x->name, x->short_circuit, x->objects[0]), std::make_tuple(7, u"Ex3", false, u"Lamp"));
-    loaded<MaterialObjectExclusion>(RecordBytes().version(3).i32(0).b8(false).u32(0x7FFFFFFF), false);
-
-    // Angle blend 1: base record, mtl_one, mtl_two, start, stop.
-    auto a = loaded<MaterialAngleBlend>(blend.version(1).base("Blend").b8(false).multiMember("Two").f32(10).f32(20));
-    EXPECT_EQ(std::make_tuple(nameOf(a->mtl_one), nameOf(a->mtl_two), a->start_angle, a->stop_angle),
-              std::make_tuple(u"<none>", u"Two", 10.f, 20.f));
-    // Alpha contribution 1: base record, base_mtl, alpha_tex, alpha_tex_mult, alpha.
-    auto c = loaded<MaterialAlphaContribution>(alpha.version(1).base("Alpha").multiMember("Base").acolor(0.5f).f32(2).f32(0.25f));
-    EXPECT_EQ(std::make_tuple(nameOf(c->base_mtl), acolorRed(c->alpha_tex), c->alpha_tex_mult, c->alpha),
-              std::make_tuple(u"Base", 0.5f, 2.f, 0.25f));
+    return all;
 }
 
-TEST_F(WrappingRecords, ToonVersions) {
-    // Version 1: base_mtl; lineWidth, lineWidthTexMult, lineWidthTex;
-    // opacity, opacityTexMult, opacityTex; distort, distortTexMult,
-    // distortTex; lineColor, lineColorTexMult, lineColorTex; zThreshold,
-    // traceBias, normalThreshold, lineUnits; doSecondary, divideByDist; base record.
-    RecordBytes v1;
-    v1.version(1).multiMember("Base").f32(2).f32(3).acolor(0.1f).f32(0.5f).f32(4).b8(false).f32(0.25f).f32(5).acolor(0.3f);
-    v1.color(0.2f, 0.4f, 0.6f).f32(6).acolor(0.4f).f32(0.9f).f32(0.01f).f32(0.6f).f32(2.5f).b8(false).b8(true).base("Ink");
-    auto t = loaded<MaterialToon>(v1);
-    EXPECT_EQ(t->name + nameOf(t->base_mtl), u"InkBase");
-    EXPECT_EQ(std::make_tuple(t->lineWidth, t->lineWidthTexMult, acolorRed(t->lineWidthTex), t->opacity, t->opacityTexMult,
-                              acolorRed(t->opacityTex), t->distort, t->distortTexMult, acolorRed(t->distortTex)),
-              std::make_tuple(2.f, 3.f, 0.1f, 0.5f, 4.f, -1.f, 0.25f, 5.f, 0.3f));
-    EXPECT_EQ(std::make_tuple(t->lineColor, t->lineColorTexMult, acolorRed(t->lineColorTex), t->zThreshold, t->traceBias,
-                              t->normalThreshold, t->lineUnits, t->doSecondary, t->divideByDist),
-              std::make_tuple(Color(0.2f, 0.4f, 0.6f), 6.f, 0.4f, 0.9f, 0.01f, 0.6f, 2.5f, false, true));
-    // Version 1 has neither of the silhouette fields; version 2 adds doSilhouetteMult and silhouetteMult.
-    EXPECT_EQ(std::make_tuple(t->doSilhouetteMult, t->silhouetteMult), std::make_tuple(false, 1.5f));
-    std::vector<char> bytes = v1.bytes();
-    bytes[2] = 2;  // the version tag 0x20000
-    t = loaded<MaterialToon>(RecordBytes().raw(bytes).b8(true).f32(3));
-    EXPECT_EQ(std::make_tuple(t->doSilhouetteMult, t->silhouetteMult, t->lineUnits), std::make_tuple(true, 3.f, 2.5f));
+TEST_F(WrappingRecords, EveryVersionLoads) {
+    // Each record loaded into a new material and written under a url that
+    // names the record and its uuid: the golden tells where every value landed.
+    // The environment override and the displaced material show their fields
+    // only in the conversion, folded into their layered base.
+    std::string xml;
+    for (const MaterialRecord& r : materialRecords()) {
+        const std::string what = "record " + std::to_string(&r - &materialRecords()[0]);
+        SCOPED_TRACE(what);
+        const MaterialPtr m = createMaterial(r.tag);
+        QuickArchive ar = r.bytes.archive();
+        ASSERT_TRUE(m->load(ar));
+        EXPECT_EQ(ar.getReadPosition(), r.bytes.size());
+        if (r.tag == kMaterialOverrideEnvironment || r.tag == kMaterialDisplaced) xml += wideToUtf8(materialToXml(m));
+        else xml += ownXml(*m, utf8ToWide("/" + what + " uuid " + wideToUtf8(m->uuid)));
+        if (!r.current) continue;
+        QuickArchive out;
+        ASSERT_TRUE(m->save(out));
+        EXPECT_EQ(savedBytes(out), r.bytes.bytes());
+    }
+    expectGolden("wrapper_records.xml", xml);
+
+    // Displaced 1 loaded over a displaced 2: the later fields are back at their defaults.
+    const MaterialPtr d = createMaterial(kMaterialDisplaced);
+    QuickArchive v2 = materialRecords()[9].bytes.archive(), v1 = materialRecords()[8].bytes.archive();
+    ASSERT_TRUE(d->load(v2) && d->load(v1));
+    EXPECT_EQ(materialToXml(d), materialToXml(loaded<MaterialDisplaced>(materialRecords()[8].bytes)));
+    // A refused base record ends the load before any child is read.
+    EXPECT_FALSE(loaded<MaterialSkp2Sided>(RecordBytes().version(1).version(3).str("X").multiMember("F"), false)->front);
+    // A bump can't leave out its base material: save fails without it, and a
+    // tag without a class fails the load.
+    QuickArchive out;
+    EXPECT_FALSE(MaterialBump().save(out));
+    loaded<MaterialBump>(RecordBytes().version(3).f32(1).b8(false).u32(15), false);
+    // A count of object names beyond the data fails instead of filling memory.
+    loaded<MaterialObjectExclusion>(RecordBytes().version(3).i32(0).b8(false).u32(0x7FFFFFFF), false);
 }
 
 // ---- every class: round trips, copies, comparisons, refused tags ------------------------------------
