@@ -175,8 +175,6 @@ TEST(LayerRecords, EveryVersionLoads) {
     EXPECT_EQ(std::make_tuple(used.name, used.layer_flag_b, used.thickness), std::make_tuple(u"BRDFRefraction", false, 7.f));
 }
 
-// ---- comparison, copies ---------------------------------------------------------------------------
-
 // The fields of a layer class; each one changed alone must make two layers differ.
 template <class L>
 struct Fields {
@@ -259,8 +257,6 @@ TEST(LayerCopies, CloneSharesNothing) {
     EXPECT_NE(back->color_tex, back->ior_tex);
     EXPECT_TRUE(back->isEqual(BrdfPtr(new G(g))));
 }
-
-// ---- factory, damaged data ---------------------------------------------------------------------------
 
 TEST(LayerRecords, FactoryAndBadTags) {
     for (std::uint32_t tag : {kGlassBrdf, kDiffuseBrdf, kBlinnBrdf, kPhongBrdf, kMirrorBrdf, kLightBrdf}) {

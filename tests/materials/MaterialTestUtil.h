@@ -1,18 +1,14 @@
 #pragma once
-// Shared by the material tests: hand-laid record bytes, builders of small
-// materials, round trips and the golden documents under golden/.
+// Shared by the material tests: hand-laid record bytes, small builders, round
+// trips and the golden documents under golden/.
 #include <gtest/gtest.h>
 
-#include <cstdint>
+#include <boost/make_shared.hpp>
 #include <cstdlib>
 #include <cstring>
 #include <fstream>
 #include <functional>
 #include <sstream>
-#include <string>
-#include <vector>
-
-#include <boost/make_shared.hpp>
 
 #include "materials/Brdf.h"
 #include "materials/LayeredMaterials.h"
@@ -156,12 +152,6 @@ inline TexturePtr acolor(float r, float g, float b, float a = 1) {
     return t;
 }
 inline TexturePtr bitmap(const std::u16string& path) { return makeBitmapTextureFromPath(path); }
-
-// The red channel of an AColorTexture, or -1 for anything else.
-inline float acolorRed(const TexturePtr& t) {
-    const AColorTexture* a = dynamic_cast<const AColorTexture*>(t.get());
-    return a ? a->color.r : -1;
-}
 
 // The XML of an object's own writeXml, as UTF-8.
 template <class T>

@@ -14,8 +14,6 @@ namespace {
 typedef TableTest ReferenceMaterials;
 typedef TableTest MaterialTreeWalks;
 
-// ---- MaterialReference, MaterialInstance --------------------------------------------------------
-
 TEST_F(ReferenceMaterials, ReferenceVersions) {
     // Version 1: base record, target_uuid; no embedded copy.
     RecordBytes v1, v2;
@@ -100,8 +98,6 @@ TEST_F(ReferenceMaterials, InstanceIsAnAliasThatIsNeverEqual) {
     for (std::uint32_t tag : {0x10001u, 0x20000u, 0u}) loaded<MaterialInstance>(RecordBytes().u32(tag).base("W"), false);
 }
 
-// ---- MaterialLinked --------------------------------------------------------------------------------
-
 TEST_F(ReferenceMaterials, LinkedRecordsOfEveryIdKind) {
     const std::tuple<std::int32_t, std::u16string, std::int32_t> cases[] = {{0, u"obj-0", 0}, {1, u"", 0}, {1, u"Node", 0}, {2, u"", 42}};
     for (const auto& c : cases) {
@@ -161,8 +157,6 @@ TEST_F(ReferenceMaterials, LinkedCopiesAndComparisons) {
     b.text = u"ignored for numbers", b.number = 5;
     EXPECT_TRUE(a.isEqual(b));
 }
-
-// ---- the scene table ---------------------------------------------------------------------------------
 
 TEST_F(ReferenceMaterials, CreateReferenceAndDefaultMaterial) {
     auto wood = layered(u"Wood");
@@ -232,8 +226,6 @@ TEST_F(ReferenceMaterials, MergeDuplicateUuidsKeepsTheLastAndMovesTheReferences)
     EXPECT_EQ(ref.target_uuid, u"b-2");
     EXPECT_EQ(ref.target, table().getMaterial(u"Wood"));
 }
-
-// ---- tree walks ------------------------------------------------------------------------------------
 
 TEST_F(MaterialTreeWalks, FindParentFollowsFirstChildren) {
     const MaterialPtr leaf = layered(u"Leaf");
