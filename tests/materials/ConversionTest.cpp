@@ -4,10 +4,14 @@
 // the layered material inside a tree.
 #include <cstdio>
 
+#include <algorithm>
+
 #include "materials/MaterialAssets.h"
 #include "materials/MaterialTestUtil.h"
+#include "materials/MaterialTree.h"
 #include "materials/WrapperAssets.h"
 #include "persistence/OrvMatFile.h"
+#include "textures/ProceduralTextures.h"
 
 using namespace mattest;
 
@@ -253,6 +257,103 @@ TEST_F(Conversion, SearchGoesThroughEveryWrapperInChildOrder) {
     EXPECT_EQ(resolveReference(inTable), inTable);
     EXPECT_FALSE(resolveReference(MaterialPtr()));
     EXPECT_FALSE(resolveReference(referenceTo(u"x")));
+}
+
+TEST_F(Conversion, FindParentFollowsFirstChildren) {
+    const MaterialPtr leaf = layered(u"Leaf");
+    // Every single-child wrapper and the angle blend's first child.
+    auto linked = boost::make_shared<MaterialLinked>();
+    linked->linked_material = leaf;
+    const MaterialPtr top = blend(u"B", linked, layered(u"Other"));
+    const MaterialPtr root = wrap<MaterialBump>(wrap<MaterialOverrideEnvironment>(
+        wrap<MaterialDisplaced>(wrap<MaterialObjectExclusion>(wrap<MaterialAlphaContribution>(wrap<MaterialToon>(top))))));
+    EXPECT_EQ(findParentMaterial(leaf, root), linked);
+    EXPECT_EQ(findParentMaterial(linked, root), top);
+    EXPECT_EQ(findParentMaterial(top, root)->getType(), kMaterialToon);
+    EXPECT_EQ(findParentMaterial(childMaterials(*root)[0], root), root);
+    EXPECT_FALSE(findParentMaterial(childMaterials(*top)[1], root));  // the second child of an angle blend isn't searched
+    EXPECT_FALSE(findParentMaterial(leaf->clone(), root));              // the same object, not an equal one
+    EXPECT_FALSE(findParentMaterial(leaf, MaterialPtr()) || findParentMaterial(MaterialPtr(), root) || findParentMaterial(root, root));
+    // Two-sided materials and references end the search; an empty first child
+    // of an angle blend isn't skipped over.
+    const MaterialPtr two = sided<Material2Sided>(u"T", leaf, MaterialPtr());
+    EXPECT_FALSE(findParentMaterial(leaf, two) || findParentMaterial(leaf, wrap<MaterialBump>(two)));
+    EXPECT_FALSE(findParentMaterial(leaf, referenceTo(u"x", u"Ref", leaf)));
+    EXPECT_FALSE(findParentMaterial(leaf, blend(u"Gap", MaterialPtr(), leaf)));
+    // Usable: anything but an empty pointer or a reference without a target UUID.
+    EXPECT_FALSE(isUsableMaterial(MaterialPtr()) || isUsableMaterial(referenceTo(u"")));
+    EXPECT_TRUE(isUsableMaterial(MaterialPtr(new MaterialMulti)) && isUsableMaterial(referenceTo(u"x")));
+}
+
+TEST_F(Conversion, BitmapFilesOfEveryClass) {
+    // A layered material whose layers hold bitmaps, directly and below other
+    // textures, procedural ones too.
+    auto layers = layered(u"Layers");
+    static_cast<Diffuse_BRDF&>(*layers->brdfs[0]).transparency_tex = bitmap(u"diffuse.png");
+    auto glass = boost::make_shared<Glass_BRDF>();
+    glass->color_tex = bitmap(u"glass_color.png"), glass->ior_tex = bitmap(u"glass_ior.png");
+    auto phong = boost::make_shared<Phong_BRDF>();
+    static_cast<FresnelTexture&>(*phong->transparency_tex).refract_ior_tex = bitmap(u"fresnel.png");
+    auto invert = boost::make_shared<InvertTexture>();
+    invert->texture = bitmap(u"inverted.png");
+    auto mix = boost::make_shared<BlendTexture>();
+    mix->color_b = invert;
+    auto light = boost::make_shared<Light_BRDF>();
+    light->color_tex = mix;
+    auto grid = boost::make_shared<GridTexture>();
+    grid->line_color = bitmap(u"grid_line.png"), grid->fill_color = bitmap(u"grid_fill.png");
+    auto ramp = boost::make_shared<RampTexture>();
+    ramp->colors = bitmap(u"ramp.png");
+    auto noise = boost::make_shared<NoiseTexture>();
+    noise->color2_tex = ramp;
+    auto checker = boost::make_shared<CheckerTexture>();
+    checker->white_color = grid, checker->black_color = noise;
+    auto mirror = boost::make_shared<Mirror_BRDF>();
+    mirror->color_tex = checker;
+    layers->brdfs.insert(layers->brdfs.end(), {glass, phong, light, mirror});
+
+    auto toon = wrap<MaterialToon>(layers);
+    toon->distortTex = bitmap(u"toon_distort.png"), toon->opacityTex = bitmap(u"toon_opacity.png");
+    auto alpha = wrap<MaterialAlphaContribution>(toon);
+    alpha->alpha_tex = bitmap(u"alpha.png");
+    auto displaced = wrap<MaterialDisplaced>(alpha);
+    displaced->displace_tex = bitmap(u"displace.png");
+    auto env = wrap<MaterialOverrideEnvironment>(wrap<MaterialObjectExclusion>(displaced));
+    env->gi_tex = bitmap(u"gi.png"), env->refract_tex = bitmap(u"refract.png");
+    auto bump = wrap<MaterialBump>(env);
+    bump->bump_tex = bitmap(u"bump.png");
+    // The textures of a two-sided material aren't visited, its children are.
+    auto two = sided<Material2Sided>(u"Two", bump, boost::make_shared<MaterialLinked>());
+    two->translucency_tex = bitmap(u"not_visited.png");
+    auto linkedBump = wrap<MaterialBump>(layered(u"Plain"));
+    linkedBump->bump_tex = bitmap(u"linked.png");
+    static_cast<MaterialLinked&>(*two->back).linked_material = linkedBump;
+
+    // The order is that of the walk through the materials: a wrapper's base
+    // before its own textures, except for the bump, whose texture comes first.
+    std::vector<std::u16string> files = {u"already.png"};
+    EXPECT_EQ(collectBitmapFiles(blend(u"Top", two, MaterialPtr()), files), 17u);
+    std::sort(files.begin() + 7, files.begin() + 10);  // the order inside the checker is not fixed
+    EXPECT_EQ(files, (std::vector<std::u16string>{
+                         u"already.png", u"bump.png", u"diffuse.png", u"glass_color.png", u"glass_ior.png",
+                         u"fresnel.png", u"inverted.png", u"grid_fill.png", u"grid_line.png", u"ramp.png",
+                         u"toon_opacity.png", u"toon_distort.png", u"alpha.png", u"displace.png", u"gi.png",
+                         u"refract.png", u"linked.png"}));
+
+    // A reference is followed through the scene table only.
+    auto ref = referenceTo(u"t-1", u"Ref", bump);
+    std::vector<std::u16string> none, fromTable;
+    EXPECT_EQ(collectBitmapFiles(ref, none), 0u);
+    auto inTable = wrap<MaterialBump>(layered(u"T"), u"InTable");
+    inTable->uuid = u"T-1", inTable->bump_tex = bitmap(u"table.png");
+    ASSERT_TRUE(table().addMaterial(inTable));
+    EXPECT_EQ(collectBitmapFiles(ref, fromTable), 1u);
+    EXPECT_EQ(fromTable, std::vector<std::u16string>{u"table.png"});
+    // Single, multi and instance hold nothing that is visited.
+    auto multi = boost::make_shared<MaterialMulti>();
+    multi->materials.push_back(bump);
+    EXPECT_EQ(collectBitmapFiles(multi, none) + collectBitmapFiles(MaterialPtr(new MaterialInstance(bump)), none), 0u);
+    EXPECT_EQ(collectBitmapFiles(MaterialPtr(), none), 0u);
 }
 
 }  // namespace

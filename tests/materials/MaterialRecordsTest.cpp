@@ -1,34 +1,189 @@
-// Records of the material base and of the layered, single and multi materials,
-// and the scene table: naming rules, the table operations with their UUID
-// housekeeping, both versions of the table's record, and damaged data.
+// Records of every material class: each version laid by hand and loaded, the
+// base record's name rules, comparison, copies, resets, damaged data and deep nesting.
+#include <sstream>
+#include <stdexcept>
+
+#include "materials/MaterialAssets.h"
 #include "materials/MaterialTestUtil.h"
+#include "materials/MaterialTree.h"
+#include "materials/WrapperAssets.h"
+#include "persistence/Record.h"
 
 using namespace mattest;
 
 namespace {
 
 typedef TableTest MaterialRecords;
-typedef TableTest SceneTable;
 typedef MaterialLayeredBRDF Layered;
 
-MaterialPtr named(const std::u16string& name, const std::u16string& uuid = u"") {
-    MaterialPtr m(new Layered);
-    m->name = name, m->uuid = uuid;
-    return m;
+// Layered 1: layer count, each layer's tag and record; double_sided,
+// layered_value_a; the name inline. 2: the base record in place of the name.
+// 3: as 2, layered_value_b and layered_value_c behind layered_value_a. 4: as 3,
+// layered_value_d at the end. Only the base record removes control characters.
+RecordBytes layeredRecord(int version) {
+    RecordBytes b;
+    b.version(version).u32(2).diffuse("Base", 0.25f).diffuse("Top", 0.75f).i32(2).i32(7);
+    if (version >= 3) b.i32(8).i32(9);
+    if (version == 1) b.str("Wall\n");
+    else b.base(version == 4 ? "Wall" : "Wall\n", "U");
+    return version >= 4 ? b.i32(10) : b;
 }
 
-// A Diffuse_BRDF with its tag, version 4: colour `grey`, no textures, base
-// record version 4 named `name`, use_color_tex_alpha_as_transparency.
-RecordBytes& diffuseLayer(RecordBytes& b, const std::string& name, float grey) {
-    return b.i32(kDiffuseBrdf).version(4).color(grey, grey, grey).color(0, 0, 0).f32(1).f32(1).b8(false).b8(false)
-        .version(4).str(name).b8(true).b8(false).b8(false).b8(false);
+// Toon 1: base_mtl; lineWidth, lineWidthTexMult, lineWidthTex; opacity,
+// opacityTexMult, opacityTex; distort, distortTexMult, distortTex; lineColor,
+// lineColorTexMult, lineColorTex; zThreshold, traceBias, normalThreshold,
+// lineUnits; doSecondary, divideByDist; base record. 2 adds doSilhouetteMult, silhouetteMult.
+RecordBytes toonRecord(int version) {
+    RecordBytes b;
+    b.version(version).multiMember("Base").f32(2).f32(3).acolor(0.1f).f32(0.5f).f32(4).b8(false).f32(0.25f).f32(5).acolor(0.3f);
+    b.color(0.2f, 0.4f, 0.6f).f32(6).acolor(0.4f).f32(0.9f).f32(0.01f).f32(0.6f).f32(2.5f).b8(false).b8(true).base("Ink");
+    return version == 1 ? b : b.b8(true).f32(3);
 }
 
-// The names of a table, then its pairs of UUID and name.
-std::string state(const SceneMaterials& t) {
-    std::u16string out;
-    t.dump(out);
-    return wideToUtf8(out);
+// Linked 1: the id record (version 1: kind, then a text for kinds 0 and 1, a
+// number for kind 2), the material's tag and record, the base record.
+RecordBytes linkedRecord(std::uint32_t kind, const std::string& text, std::int32_t number) {
+    RecordBytes b;
+    b.version(1).version(1).u32(kind);
+    if (kind == 2) b.i32(number);
+    else b.str(text);
+    return b.multi("Inside").base("Linked");
+}
+
+struct MaterialRecord {
+    std::uint32_t tag;
+    RecordBytes bytes;
+    bool current;  // saves back to the same bytes
+};
+
+const std::vector<MaterialRecord>& records() {
+    static const std::vector<MaterialRecord> all = {
+        {kMaterialLayeredBRDF, layeredRecord(1), false},
+        {kMaterialLayeredBRDF, layeredRecord(2), false},
+        {kMaterialLayeredBRDF, layeredRecord(3), false},
+        {kMaterialLayeredBRDF, layeredRecord(4), true},
+        // Single 1: single_value_a, single_value_b, the name inline, the layer's
+        // tag and record. 2: the two values, the layer, the base record.
+        {kMaterialSingleBRDF, RecordBytes().version(1).i32(3).i32(4).str("").diffuse("Only", 0.5f), false},
+        {kMaterialSingleBRDF, RecordBytes().version(2).i32(5).i32(6).diffuse("Only", 0.5f).base("Single", "S-1"), true},
+        // Multi 1: count, each sub-material's tag and record, the name inline. 2: the base record for the name.
+        {kMaterialMulti, RecordBytes().version(1).u32(1).multi("Inner").str("Outer\t"), false},
+        {kMaterialMulti, RecordBytes().version(2).u32(1).multi("Inner").base("Outer", "M-1"), true},
+        // Two-sided 1: front, back, translucency_tex, translucency, translucency_tex_mult, force_1sided.
+        {kMaterial2Sided, RecordBytes().version(1).multiMember("F").b8(false).acolor(0.25f).color(0.1f, 0.2f, 0.3f).f32(0.5f).b8(true), false},
+        // Two-sided 2: as 1, then transparency_tex, transparency, transparency_tex_mult. 3: as 2, then the base record.
+        {kMaterial2Sided, RecordBytes().version(2).b8(false).b8(false).b8(false).color(0, 0, 0).f32(1).b8(false).acolor(0.75f)
+                              .color(0.4f, 0.5f, 0.6f).f32(2), false},
+        {kMaterial2Sided, RecordBytes().version(3).b8(false).multiMember("B").acolor(0.2f).color(0, 0, 0).f32(1).b8(false).b8(false)
+                              .color(0, 0, 0).f32(1).base("Sheet", "uu"), true},
+        // Skp two-sided 1: base record, front, back, force_1sided.
+        {kMaterialSkp2Sided, RecordBytes().version(1).base("Skp").multiMember("F").multiMember("K").b8(true), true},
+        // Bump 1: name (empty: the default name), path of bump_tex, bump_tex_mult, base_mtl as tag and record.
+        {kMaterialBump, RecordBytes().version(1).str("").str("C:/maps/bump.png").f32(0.5f).multi("Base"), false},
+        // Bump 2: name (an empty one stays empty), bump_tex_mult, bump_tex as member, base_mtl bare.
+        {kMaterialBump, RecordBytes().version(2).str("").f32(3).acolor(0.5f).multi("Base"), false},
+        // Bump 3: bump_tex_mult, bump_tex, base_mtl, base record.
+        {kMaterialBump, RecordBytes().version(3).f32(2).acolor(0.6f).multi("Base").base("Wall", "u-3"), true},
+        // Environment override 1: base record, base_mtl, the textures bg, gi,
+        // reflect, refract, then colours, multipliers and switches in that order.
+        {kMaterialOverrideEnvironment, RecordBytes().version(1).base("Env").b8(true).layered("Base").acolor(0.1f).b8(false).acolor(0.3f)
+                                           .acolor(0.4f).color(1, 0, 0).color(0, 1, 0).color(0, 0, 1).color(1, 1, 0).f32(2).f32(3)
+                                           .f32(4).f32(5).b8(true).b8(false).b8(false).b8(true), true},
+        // Displaced 1: base record, base_mtl, displace_tex, displace_tex_mult.
+        // 2: as 1, then displace_shift, displace_edge_length, the four integers.
+        {kMaterialDisplaced, RecordBytes().version(1).base("D1").b8(true).layered("Base").b8(false).f32(3), false},
+        {kMaterialDisplaced, RecordBytes().version(2).base("D").b8(true).layered("Base").acolor(0.5f).f32(2).f32(0.25f).f32(8)
+                                 .i32(64).i32(0).i32(0).i32(0), true},
+        // Object exclusion 1: mode, base_mtl, the object names; no base record.
+        // 2: as 1, then the base record. 3: as 2, then short_circuit.
+        {kMaterialObjectExclusion, RecordBytes().version(1).i32(1).multiMember("Base").u32(2).str("Chair").str("Table"), false},
+        {kMaterialObjectExclusion, RecordBytes().version(2).i32(0).b8(false).u32(0).base("Ex2"), false},
+        {kMaterialObjectExclusion, RecordBytes().version(3).i32(7).multiMember("Base").u32(1).str("Lamp").base("Ex3").b8(false), true},
+        // Angle blend 1: base record, mtl_one, mtl_two, start_angle, stop_angle.
+        {kMaterialAngleBlend, RecordBytes().version(1).base("Blend").b8(false).multiMember("Two").f32(10).f32(20), true},
+        // Alpha contribution 1: base record, base_mtl, alpha_tex, alpha_tex_mult, alpha.
+        {kMaterialAlphaContribution, RecordBytes().version(1).base("Alpha").multiMember("Base").acolor(0.5f).f32(2).f32(0.25f), true},
+        {kMaterialToon, toonRecord(1), false},
+        {kMaterialToon, toonRecord(2), true},
+        // Reference 1: base record, target_uuid. 2: as 1, then the embedded copy as an optional member.
+        {kMaterialReference, RecordBytes().version(1).base("Ref", "own").str("target"), false},
+        {kMaterialReference, RecordBytes().version(2).base("Ref2").str("t").multiMember("Copy"), false},
+        // Instance 1: the base record alone.
+        {kMaterialInstance, RecordBytes().version(1).base("Wood", "u"), true},
+        {kMaterialLinked, linkedRecord(0, "obj-0", 0), true},
+        {kMaterialLinked, linkedRecord(1, "", 0), true},
+        {kMaterialLinked, linkedRecord(1, "Node", 0), true},
+        {kMaterialLinked, linkedRecord(2, "", 42), true},
+    };
+    return all;
+}
+
+// The hand-laid record of class `tag` and `version`.
+const RecordBytes& recordOf(std::uint32_t tag, int version) {
+    for (const MaterialRecord& r : records())
+        if (r.tag == tag && r.bytes.bytes()[2] == version) return r.bytes;
+    throw std::logic_error("no such record");
+}
+
+std::string nameOf(const MaterialPtr& m) { return m ? wideToUtf8(m->name) : "<none>"; }
+
+// The `skip`+1-th sample of class `type`.
+MaterialPtr sample(const std::vector<MaterialPtr>& all, std::uint32_t type, int skip = 0) {
+    for (const MaterialPtr& m : all)
+        if (m->getType() == type && skip-- == 0) return m;
+    return MaterialPtr();
+}
+
+// A comment line with what the XML doesn't show of a material.
+std::string hidden(const BaseMaterial& m) {
+    std::ostringstream s;
+    s << "<!-- name " << wideToUtf8(m.name) << " uuid " << wideToUtf8(m.uuid);
+    if (auto l = dynamic_cast<const Layered*>(&m))
+        s << " values " << l->layered_value_a << ' ' << l->layered_value_b << ' ' << l->layered_value_c << ' ' << l->layered_value_d;
+    if (auto x = dynamic_cast<const MaterialSingleBRDF*>(&m))
+        s << " values " << x->single_value_a << ' ' << x->single_value_b << " layer " << (x->brdf ? wideToUtf8(x->brdf->name) : "<none>");
+    if (auto x = dynamic_cast<const MaterialMulti*>(&m))
+        for (const MaterialPtr& sub : x->materials) s << " sub " << nameOf(sub);
+    if (auto x = dynamic_cast<const MaterialReference*>(&m)) s << " target " << wideToUtf8(x->target_uuid) << " copy " << nameOf(x->target);
+    if (auto x = dynamic_cast<const MaterialLinked*>(&m))
+        s << " id " << x->id.kind << ' ' << wideToUtf8(x->id.getText()) << ' ' << x->id.getNumber() << " material " << nameOf(x->linked_material);
+    return s.str() + " -->\n";
+}
+
+TEST_F(MaterialRecords, EveryVersionLoads) {
+    // Each record loaded into a new material: a comment line with what no XML
+    // shows, then its own XML under a url that names the record. The
+    // environment override and the displaced material show their fields only
+    // in the conversion, folded into their layered base.
+    std::string xml;
+    for (const MaterialRecord& r : records()) {
+        const std::string what = "record " + std::to_string(&r - &records()[0]);
+        SCOPED_TRACE(what);
+        const MaterialPtr m = createMaterial(r.tag);
+        QuickArchive ar = r.bytes.archive();
+        ASSERT_TRUE(m->load(ar));
+        EXPECT_EQ(ar.getReadPosition(), r.bytes.size());
+        xml += hidden(*m);
+        if (r.tag == kMaterialOverrideEnvironment || r.tag == kMaterialDisplaced) xml += wideToUtf8(materialToXml(m));
+        else xml += ownXml(*m, utf8ToWide("/" + what));
+        if (!r.current) continue;
+        QuickArchive out;
+        ASSERT_TRUE(m->save(out));
+        EXPECT_EQ(savedBytes(out), r.bytes.bytes());
+    }
+    expectGolden("material_records.xml", xml);
+}
+
+// The materials of the current records.
+std::vector<MaterialPtr> samples() {
+    std::vector<MaterialPtr> all;
+    for (const MaterialRecord& r : records()) {
+        if (!r.current) continue;
+        all.push_back(createMaterial(r.tag));
+        QuickArchive ar = r.bytes.archive();
+        EXPECT_TRUE(all.back()->load(ar));
+    }
+    return all;
 }
 
 TEST_F(MaterialRecords, BaseRecordNames) {
@@ -60,38 +215,15 @@ TEST_F(MaterialRecords, BaseRecordNames) {
     EXPECT_EQ(m.name, u"AB");
 }
 
-TEST_F(MaterialRecords, LayeredVersions) {
-    for (int version = 1; version <= 4; ++version) {
-        RecordBytes bytes;
-        diffuseLayer(diffuseLayer(bytes.version(version).u32(2), "Base", 0.25f), "Top", 0.75f);
-        bytes.i32(2).i32(7);                    // double_sided, layered_value_a
-        if (version >= 3) bytes.i32(8).i32(9);  // layered_value_b, layered_value_c
-        if (version == 1) bytes.str("Wall\n");  // inline name
-        else bytes.base("Wall\n", "U");         // base record
-        if (version >= 4) bytes.i32(10);        // layered_value_d
-        const boost::shared_ptr<Layered> m = loaded<Layered>(bytes);
-        ASSERT_EQ(m->brdfs.size(), 2u) << version;
-        EXPECT_EQ(m->brdfs[0]->name, u"Base");
-        EXPECT_EQ(boost::dynamic_pointer_cast<Diffuse_BRDF>(m->brdfs[1])->color.r, 0.75f);
-        const bool v3 = version >= 3;
-        EXPECT_EQ(std::make_tuple(m->double_sided, m->layered_value_a, m->layered_value_b, m->layered_value_c, m->layered_value_d),
-                  std::make_tuple(2, 7, v3 ? 8 : 1, v3 ? 9 : 1, version >= 4 ? 10 : 0)) << version;
-        // Only the base record removes control characters.
-        EXPECT_EQ(std::make_tuple(m->name, m->uuid), version == 1 ? std::make_tuple(u"Wall\n", u"") : std::make_tuple(u"Wall", u"U"));
-    }
-}
-
-TEST_F(MaterialRecords, LayeredLoadStartsFromDefaults) {
+TEST_F(MaterialRecords, LoadsIntoUsedObjects) {
+    // A layered material starts from its defaults, even for a refused tag.
     Layered m;
     m.brdfs.push_back(createBrdf(kGlassBrdf));
     m.layered_value_b = 42, m.uuid = u"old";
     // Version 2: no layers, double_sided, layered_value_a, base record version 1 (name only).
     QuickArchive ar = RecordBytes().version(2).u32(0).i32(0).i32(0).version(1).str("N").archive();
     ASSERT_TRUE(m.load(ar));
-    EXPECT_TRUE(m.brdfs.empty());
-    EXPECT_EQ(m.layered_value_b, 1);
-    EXPECT_EQ(m.uuid, u"");
-    // Even a refused tag leaves the list empty.
+    EXPECT_EQ(std::make_tuple(m.brdfs.size(), m.layered_value_b, m.uuid), std::make_tuple(0u, 1, u""));
     m.brdfs.push_back(createBrdf(kGlassBrdf));
     QuickArchive bad = RecordBytes().version(5).archive();
     EXPECT_FALSE(m.load(bad));
@@ -100,230 +232,295 @@ TEST_F(MaterialRecords, LayeredLoadStartsFromDefaults) {
     QuickArchive d = RecordBytes().version(4).u32(0).i32(1).i32(0).i32(1).i32(1).version(3).i32(5).archive();
     EXPECT_FALSE(m.load(d));
     EXPECT_EQ(m.layered_value_d, 5);
+    // A multi material appends to its list.
+    MaterialMulti multi;
+    QuickArchive first = recordOf(kMaterialMulti, 1).archive(), again = recordOf(kMaterialMulti, 1).archive();
+    ASSERT_TRUE(multi.load(first) && multi.load(again));
+    EXPECT_EQ(multi.materials.size(), 2u);
+    // A displaced material: version 1 over version 2 brings the later fields back to their defaults.
+    const MaterialPtr displaced = createMaterial(kMaterialDisplaced);
+    QuickArchive v2 = recordOf(kMaterialDisplaced, 2).archive(), v1 = recordOf(kMaterialDisplaced, 1).archive();
+    ASSERT_TRUE(displaced->load(v2) && displaced->load(v1));
+    EXPECT_EQ(materialToXml(displaced), materialToXml(loaded<MaterialDisplaced>(recordOf(kMaterialDisplaced, 1))));
 }
 
-TEST_F(MaterialRecords, LayeredRoundTripAndCopies) {
-    Layered m;
-    m.name = u"Wall", m.uuid = u"U-1";
-    m.double_sided = 2, m.layered_value_a = 3, m.layered_value_b = 4, m.layered_value_c = 5, m.layered_value_d = 6;
-    m.brdfs = {BrdfPtr(new Diffuse_BRDF), createBrdf(kMirrorBrdf)};
-    const boost::shared_ptr<Layered> back = roundTrip(m);
-    const MaterialPtr original = m.clone();
-    EXPECT_TRUE(back->isEqual(original));
-    EXPECT_EQ(std::make_tuple(back->name, back->uuid), std::make_tuple(u"Wall", u"U-1"));
-    // clone keeps the name, duplicate takes a unique one; neither keeps the
-    // uuid, and both clone the layers.
-    table().addMaterial(original);
-    const MaterialPtr dup = m.duplicate();
-    EXPECT_EQ(std::make_tuple(original->name, dup->name), std::make_tuple(u"Wall", u"Wall1"));
-    EXPECT_TRUE(original->uuid.empty() && dup->uuid.empty());
-    EXPECT_NE(static_cast<const Layered&>(*dup).brdfs[0], m.brdfs[0]);
-    EXPECT_TRUE(dup->isEqual(original));
-    // Each integer and each layer takes part in the comparison; the name doesn't.
-    for (std::int32_t Layered::*f :
-         {&Layered::double_sided, &Layered::layered_value_a, &Layered::layered_value_b, &Layered::layered_value_c, &Layered::layered_value_d}) {
-        auto other = boost::static_pointer_cast<Layered>(m.clone());
-        (*other).*f += 1;
-        EXPECT_FALSE(other->isEqual(original));
+#define CHANGE(Class, change) {Class().getType(), [](BaseMaterial& m) { static_cast<Class&>(m).change; }}
+
+TEST_F(MaterialRecords, FieldsTakePartInTheComparison) {
+    // One field changed at a time must make a copy differ.
+    const std::pair<std::uint32_t, void (*)(BaseMaterial&)> cases[] = {
+        CHANGE(Layered, double_sided = 99),      CHANGE(Layered, layered_value_a = 99), CHANGE(Layered, layered_value_b = 99),
+        CHANGE(Layered, layered_value_c = 99),   CHANGE(Layered, layered_value_d = 99), CHANGE(Layered, brdfs.pop_back()),
+        CHANGE(Layered, brdfs[0] = createBrdf(kGlassBrdf)), CHANGE(MaterialSingleBRDF, single_value_a = 99),
+        CHANGE(Material2Sided, transparency_tex_mult = 9),   CHANGE(Material2Sided, translucency_tex.reset()),
+        CHANGE(MaterialSkp2Sided, force_1sided = false),     CHANGE(MaterialBump, bump_tex_mult = 9),
+        CHANGE(MaterialOverrideEnvironment, override_refract = false),
+        CHANGE(MaterialOverrideEnvironment, bg_color = Color(0, 0, 1)),
+        CHANGE(MaterialDisplaced, displace_max_subdivs = 1), CHANGE(MaterialObjectExclusion, objects[0] = u"Sofa"),
+        CHANGE(MaterialObjectExclusion, mode = 0),           CHANGE(MaterialAlphaContribution, alpha = 1),
+        CHANGE(MaterialAngleBlend, start_angle = 1),         CHANGE(MaterialToon, lineUnits = 1),
+        CHANGE(MaterialToon, divideByDist = false),          CHANGE(MaterialToon, lineWidthTex.reset()),
+        CHANGE(MaterialLinked, id.kind = 1),                 CHANGE(MaterialLinked, linked_material.reset()),
+    };
+    const std::vector<MaterialPtr> all = samples();
+    for (const auto& c : cases) {
+        const MaterialPtr m = sample(all, c.first);
+        const MaterialPtr copy = m->clone();
+        ASSERT_TRUE(copy->isEqual(m)) << c.first;
+        c.second(*copy);
+        EXPECT_FALSE(copy->isEqual(m)) << c.first << " case " << &c - cases;
     }
-    auto other = boost::static_pointer_cast<Layered>(m.clone());
-    other->name = u"Other";
-    EXPECT_TRUE(other->isEqual(original));
-    static_cast<Diffuse_BRDF&>(*other->brdfs[0]).color.b = 0.4f;
-    EXPECT_FALSE(other->isEqual(original));
-    other->brdfs.pop_back();
-    EXPECT_FALSE(other->isEqual(original));
-    EXPECT_FALSE(original->isEqual(MaterialPtr()) || original->isEqual(MaterialPtr(new MaterialMulti)));
+    // Each child takes part (the sub-materials of a multi material are shared
+    // by its copies); so does the class; the name doesn't.
+    for (const MaterialPtr& m : all) {
+        if (m->getType() == kMaterialInstance) continue;  // equal to nothing, not even itself
+        for (std::size_t i = 0; m->getType() != kMaterialMulti && i < childMaterials(*m).size(); ++i) {
+            const MaterialPtr other = m->clone(), child = childMaterials(*other)[i];
+            if (auto l = boost::dynamic_pointer_cast<Layered>(child)) l->double_sided = 5;
+            else static_cast<MaterialMulti&>(*child).materials.push_back(layered(u"More"));
+            EXPECT_FALSE(other->isEqual(m) || m->isEqual(other)) << nameOf(m) << " child " << i;
+        }
+        const MaterialPtr renamed = m->clone();
+        renamed->name = u"Other";
+        EXPECT_TRUE(renamed->isEqual(m)) << nameOf(m);
+        EXPECT_FALSE(m->isEqual(MaterialPtr()) || m->isEqual(m->getType() == kMaterialMulti ? layered(u"L") : MaterialPtr(new MaterialMulti)));
+    }
+    // Object names and id texts compare without regard to case; a number id ignores the text.
+    const MaterialPtr lamp = sample(all, kMaterialObjectExclusion), node = sample(all, kMaterialLinked, 2);
+    const MaterialPtr upper = lamp->clone(), nodeUpper = node->clone();
+    static_cast<MaterialObjectExclusion&>(*upper).objects[0] = u"LAMP";
+    static_cast<MaterialLinked&>(*nodeUpper).id.text = u"NODE";
+    EXPECT_TRUE(upper->isEqual(lamp) && nodeUpper->isEqual(node));
+    MaterialLinked::IdData a, b;
+    a.number = 5, b.number = 6;
+    EXPECT_FALSE(a.isEqual(b));
+    b.text = u"ignored for numbers", b.number = 5;
+    EXPECT_TRUE(a.isEqual(b));
+    EXPECT_FALSE(sample(all, kMaterialInstance)->isEqual(sample(all, kMaterialInstance)));  // an instance
 }
 
-TEST_F(MaterialRecords, SingleAndMultiVersions) {
-    // Single version 1: single_value_a, single_value_b, inline name, layer tag and record.
-    RecordBytes v1, v2;
-    const boost::shared_ptr<MaterialSingleBRDF> a = loaded<MaterialSingleBRDF>(diffuseLayer(v1.version(1).i32(3).i32(4).str(""), "Only", 0.5f));
-    EXPECT_EQ(std::make_tuple(a->single_value_a, a->single_value_b, a->name), std::make_tuple(3, 4, u"DefaultMaterial"));
-    ASSERT_TRUE(a->brdf);
-    EXPECT_EQ(a->brdf->name, u"Only");
-    // Single version 2 (current): the two values, layer tag and record, base record.
-    diffuseLayer(v2.version(2).i32(5).i32(6), "Only", 0.5f).base("Single", "S-1");
-    const boost::shared_ptr<MaterialSingleBRDF> b = loaded<MaterialSingleBRDF>(v2);
-    EXPECT_EQ(std::make_tuple(b->single_value_b, b->name, b->uuid), std::make_tuple(6, u"Single", u"S-1"));
-    QuickArchive ar;
-    ASSERT_TRUE(b->save(ar));
-    EXPECT_EQ(savedBytes(ar), v2.bytes());
-    // Copies share the layer; without a layer there is nothing to save.
-    const MaterialPtr copy = b->clone();
-    EXPECT_EQ(static_cast<MaterialSingleBRDF&>(*copy).brdf, b->brdf);
-    EXPECT_TRUE(copy->isEqual(b));
-    EXPECT_FALSE(MaterialSingleBRDF().save(ar));
+TEST_F(MaterialRecords, CopiesTakeNamesAndShareAsTheirClassSays) {
+    // Make the names of the samples and their children taken, so that a new
+    // unique name differs from the old one.
+    const std::vector<MaterialPtr> all = samples();
+    for (const MaterialPtr& m : all) {
+        table().addMaterial(m->clone());
+        for (const MaterialPtr& child : childMaterials(*m)) table().addMaterial(child->clone());
+    }
+    for (const MaterialPtr& m : all) {
+        SCOPED_TRACE(nameOf(m));
+        const std::uint32_t type = m->getType();
+        const MaterialPtr dup = m->duplicate(), cl = m->clone();
+        // Only an instance's duplicate keeps the name; no copy keeps the uuid.
+        EXPECT_EQ(std::make_tuple(dup->name == m->name, cl->name, dup->uuid + cl->uuid),
+                  std::make_tuple(type == kMaterialInstance, m->name, u""));
+        if (type != kMaterialInstance) EXPECT_TRUE(dup->isEqual(m) && cl->isEqual(m));
+        const std::vector<MaterialPtr> mine = childMaterials(*m), dupChildren = childMaterials(*dup), clChildren = childMaterials(*cl);
+        ASSERT_EQ(std::make_tuple(dupChildren.size(), clChildren.size()), std::make_tuple(mine.size(), mine.size()));
+        for (std::size_t i = 0; i < mine.size(); ++i) {
+            // A multi material's copies share its sub-materials; the other
+            // copies take their children's duplicate or clone, a toon's clone
+            // its base material's duplicate.
+            const bool shared = type == kMaterialMulti;
+            EXPECT_EQ(std::make_tuple(dupChildren[i] == mine[i], clChildren[i] == mine[i]), std::make_tuple(shared, shared));
+            EXPECT_EQ(dupChildren[i]->name == mine[i]->name, shared);
+            EXPECT_EQ(clChildren[i]->name == mine[i]->name, type != kMaterialToon);
+        }
+    }
+    // The layers are cloned; a single material shares its layer, an instance
+    // its material; two-sided copies share their textures, the others clone them.
+    auto layers = [](const MaterialPtr& m) { return static_cast<const Layered&>(*m).brdfs[0]; };
+    EXPECT_NE(layers(sample(all, kMaterialLayeredBRDF)->duplicate()), layers(sample(all, kMaterialLayeredBRDF)));
+    auto single = [](const MaterialPtr& m) { return static_cast<const MaterialSingleBRDF&>(*m).brdf; };
+    EXPECT_EQ(single(sample(all, kMaterialSingleBRDF)->clone()), single(sample(all, kMaterialSingleBRDF)));
+    boost::shared_ptr<MaterialInstance> inst(new MaterialInstance(layered(u"Wood")));
+    EXPECT_EQ(std::make_tuple(inst->name, static_cast<const MaterialInstance&>(*inst->duplicate()).instance_of),
+              std::make_tuple(u"Wood", inst->instance_of));
+    auto translucency = [](const MaterialPtr& m) { return static_cast<const Material2Sided&>(*m).translucency_tex; };
+    EXPECT_EQ(translucency(sample(all, kMaterial2Sided)->duplicate()), translucency(sample(all, kMaterial2Sided)));
+    auto bumpTex = [](const MaterialPtr& m) { return static_cast<const MaterialBump&>(*m).bump_tex; };
+    EXPECT_NE(bumpTex(sample(all, kMaterialBump)->clone()), bumpTex(sample(all, kMaterialBump)));
+    auto widthTex = [](const MaterialPtr& m) { return static_cast<const MaterialToon&>(*m).lineWidthTex; };
+    EXPECT_NE(widthTex(sample(all, kMaterialToon)->clone()), widthTex(sample(all, kMaterialToon)));
+}
 
-    // Multi version 1: count, per sub-material tag and record, then the inline name.
-    const RecordBytes multi = RecordBytes().version(1).u32(1).multi("Inner").str("Outer\t");
-    MaterialMulti m;
-    QuickArchive first = multi.archive(), again = multi.archive();
-    ASSERT_TRUE(m.load(first));
-    ASSERT_EQ(m.materials.size(), 1u);
-    EXPECT_EQ(std::make_tuple(m.materials[0]->name, m.name), std::make_tuple(u"Inner", u"Outer\t"));
-    ASSERT_TRUE(m.load(again));
-    EXPECT_EQ(m.materials.size(), 2u);  // a second load appends to the list
-    // Copies share the sub-materials.
-    const MaterialPtr dup = m.duplicate();
-    EXPECT_EQ(static_cast<MaterialMulti&>(*dup).materials[0], m.materials[0]);
-    EXPECT_TRUE(dup->isEqual(m.clone()));
+TEST_F(MaterialRecords, Resets) {
+    // The wrapping classes keep name and uuid; the bump, a reference and a
+    // linked material take a new default name and drop the uuid.
+    for (const MaterialPtr& m : samples()) {
+        const std::uint32_t type = m->getType();
+        if (type < kMaterialBump || type == kMaterialInstance) continue;
+        m->name = u"Kept", m->uuid = u"kept-uuid";
+        m->reset();
+        const bool base = type == kMaterialBump || type == kMaterialLinked;
+        EXPECT_EQ(std::make_tuple(m->name, m->uuid), base ? std::make_tuple(std::u16string(u"DefaultMaterial"), std::u16string())
+                                                          : std::make_tuple(std::u16string(u"Kept"), std::u16string(u"kept-uuid"))) << type;
+    }
 }
 
 TEST_F(MaterialRecords, BadAndTruncatedRecordsFail) {
-    RecordBytes good;
-    diffuseLayer(good.version(4).u32(1), "Base", 0.5f).i32(1).i32(0).i32(1).i32(1).base("Wall").i32(0);
-    ASSERT_TRUE(loaded<Layered>(good));
-    // Every cut up to the base record's tag fails: what lies behind the end of
-    // the data reads as zeros, and the base record's tag then has no valid
-    // version. (Behind that tag zeros pass as an empty name.)
-    for (std::size_t cut = 0; cut <= good.size() - 20; ++cut) {
-        Layered m;
-        QuickArchive ar = good.archive(cut);
-        EXPECT_FALSE(m.load(ar)) << "cut at " << cut;
+    // Refused version tags, for every class.
+    const std::pair<std::uint32_t, std::vector<std::uint32_t>> refused[] = {
+        {kMaterialLayeredBRDF, {0, 0x40001, 0x50000}}, {kMaterialMulti, {0x30000}},
+        {kMaterial2Sided, {0, 0x40000, 0x30001}},      {kMaterialSkp2Sided, {0, 0x20000, 0x10001}},
+        {kMaterialBump, {0, 0x40000, 0x10100}},        {kMaterialOverrideEnvironment, {0, 0x20000}},
+        {kMaterialDisplaced, {0, 0x30000, 0x20001}},   {kMaterialObjectExclusion, {0, 0x40000}},
+        {kMaterialAlphaContribution, {0, 0x20000}},    {kMaterialAngleBlend, {0, 0x20000}},
+        {kMaterialToon, {0, 0x30000, 0x10002}},        {kMaterialReference, {0, 0x30000, 0x20001}},
+        {kMaterialInstance, {0, 0x10001, 0x20000}},    {kMaterialLinked, {0x20000}},
+    };
+    for (const auto& c : refused) {
+        for (std::uint32_t tag : c.second) {
+            QuickArchive ar = RecordBytes().u32(tag).base("R").str("t").b8(false).archive();
+            EXPECT_FALSE(createMaterial(c.first)->load(ar)) << c.first << " " << std::hex << tag;
+        }
     }
+    // Tags without a class, refused children, huge counts.
     const std::pair<std::uint32_t, RecordBytes> cases[] = {
-        {kMaterialLayeredBRDF, RecordBytes().version(4).u32(1).i32(3)},      // layer tag 3
-        {kMaterialLayeredBRDF, RecordBytes().version(4).u32(1).i32(0)},      // layer tag 0
-        {kMaterialLayeredBRDF, RecordBytes().u32(0x40001)},                  // low half set
-        {kMaterialLayeredBRDF, RecordBytes().u32(0)},                        // version 0
-        {kMaterialLayeredBRDF, RecordBytes().version(4).u32(0xFFFFFFFF)},    // huge layer count
-        {kMaterialSingleBRDF, RecordBytes().version(2).i32(0).i32(0).i32(64)},  // layer tag 64
-        {kMaterialMulti, RecordBytes().version(2).u32(1).i32(15)},           // material tag 15
-        {kMaterialMulti, RecordBytes().version(3)},
+        {kMaterialLayeredBRDF, RecordBytes().version(4).u32(1).i32(3)},             // layer tag 3
+        {kMaterialLayeredBRDF, RecordBytes().version(4).u32(1).i32(0)},             // layer tag 0
+        {kMaterialLayeredBRDF, RecordBytes().version(4).u32(0xFFFFFFFF)},           // layer count
+        {kMaterialSingleBRDF, RecordBytes().version(2).i32(0).i32(0).i32(64)},      // layer tag 64
+        {kMaterialMulti, RecordBytes().version(2).u32(1).i32(15)},                  // material tag 15
+        {kMaterialObjectExclusion, RecordBytes().version(3).i32(0).b8(false).u32(0x7FFFFFFF)},  // name count
+        {kMaterialBump, RecordBytes().version(3).f32(1).b8(false).u32(15)},         // bare base_mtl, tag 15
+        {kMaterialReference, RecordBytes().version(2).base("R").str("t").b8(true).u32(99)},  // copy, tag 99
+        {kMaterialReference, RecordBytes().version(2).version(3).str("X").str("").str("t").b8(false)},  // base record
+        {kMaterialLinked, RecordBytes().version(1).version(1).u32(2).i32(1).u32(15)},          // material tag 15
+        {kMaterialLinked, RecordBytes().version(1).version(2).u32(2).i32(1).multi("Inside")},  // id tag
+        {kMaterialLinked, RecordBytes().version(1).version(1).u32(3).i32(0).multi("Inside").base("L")},  // id kind 3
     };
     for (const auto& c : cases) {
         QuickArchive ar = c.second.archive();
         EXPECT_FALSE(createMaterial(c.first)->load(ar)) << &c - cases;
+    }
+    // A refused base record ends the load before any child is read.
+    EXPECT_FALSE(loaded<MaterialSkp2Sided>(RecordBytes().version(1).version(3).str("X").multiMember("F"), false)->front);
+    // Without the material it can't leave out, a linked material fails to save,
+    // writing nothing; so do an invalid id kind, a bump and a single material.
+    auto linked = boost::make_shared<MaterialLinked>();
+    QuickArchive out(1);
+    EXPECT_FALSE(linked->save(out));
+    EXPECT_EQ(out.getWritePosition(), 0u);
+    linked->linked_material = layered(u"L"), linked->id.kind = 3;
+    EXPECT_FALSE(linked->save(out) || MaterialBump().save(out) || MaterialSingleBRDF().save(out));
+
+    // Every cut of a layered record up to the base record's tag fails: what
+    // lies behind the end of the data reads as zeros, and the base record's
+    // tag then has no valid version. (Behind that tag zeros pass as an empty name.)
+    const RecordBytes& good = recordOf(kMaterialLayeredBRDF, 4);
+    for (std::size_t cut = 0; cut <= good.size() - 21; ++cut) {
+        Layered m;
+        QuickArchive ar = good.archive(cut);
+        EXPECT_FALSE(m.load(ar)) << "cut at " << cut;
+    }
+    // Every current record, cut anywhere, returns (whatever the result)
+    // without reading outside its bytes; cut to nothing, it is refused.
+    for (const MaterialRecord& r : records()) {
+        for (std::size_t cut = 0; r.current && cut < r.bytes.size(); cut += 7) {
+            QuickArchive ar = r.bytes.archive(cut);
+            createMaterial(r.tag)->load(ar);
+        }
+        QuickArchive empty = r.bytes.archive(0);
+        EXPECT_FALSE(createMaterial(r.tag)->load(empty)) << r.tag;
     }
     // 300 MaterialMulti records, each the only sub-material of the one before:
     // deeper than any real file, and refused instead of overflowing.
     RecordBytes deep;
     for (int i = 0; i < 300; ++i) deep.version(2).u32(1).i32(kMaterialMulti);
     loaded<MaterialMulti>(deep, false);
-    // The factory knows tags 0 to 14 only.
-    for (std::uint32_t tag = 0; tag < kMaterialTagCount; ++tag) EXPECT_EQ(createMaterial(tag)->getType(), tag);
     EXPECT_FALSE(createMaterial(kMaterialTagCount) || createMaterial(0xFFFFFFFFu));
 }
 
-TEST_F(SceneTable, UniqueNames) {
-    const std::tuple<std::vector<std::u16string>, std::u16string, std::u16string> cases[] = {
-        {{}, u"Mat", u"Mat"},
-        {{}, u"Mat7", u"Mat"},
-        {{u"Mat"}, u"Mat", u"Mat1"},
-        {{u"Mat"}, u"Mat7", u"Mat1"},
-        {{u"Mat", u"Mat1", u"Mat2"}, u"Mat", u"Mat3"},
-        {{u"MAT"}, u"mat", u"mat1"},  // keys ignore case
-        {{}, u"3 Wood", u"a3_Wood"},
-        {{}, u"Big Wood 12", u"Big_Wood_"},
-        {{}, u"123", u""},
-        {{}, u"", u""},
-        {{u"a b"}, u"a b", u"a_b1"},  // the blank counts in the lookup
-        {{u"a_b"}, u"a b", u"a_b"},   // the result is not looked up again
-        {{u"x", u"x1", u"x2", u"x3", u"x4", u"x5", u"x6", u"x7", u"x8", u"x9"}, u"x", u"x10"},
+// How one wrapper class lays its record around its (first) child: the bytes in
+// front of the child's tag, whether a present flag stands there, and the bytes
+// behind the child's record.
+struct WrapperLayout {
+    std::uint32_t tag;
+    bool presentFlag;
+    std::function<void(RecordBytes&)> head, tail;
+};
+
+const std::vector<WrapperLayout>& layouts() {
+    typedef RecordBytes& B;
+    static const std::vector<WrapperLayout> all = {
+        // Bump 3: bump_tex_mult, bump_tex | base_mtl bare | base record.
+        {kMaterialBump, false, [](B b) { b.version(3).f32(1).b8(false); }, [](B b) { b.base("N"); }},
+        // Two-sided 1: front | back, translucency_tex, translucency, mult, force.
+        {kMaterial2Sided, true, [](B b) { b.version(1); }, [](B b) { b.b8(false).b8(false).color(0, 0, 0).f32(1).b8(false); }},
+        // Skp two-sided 1: base record | front | back, force.
+        {kMaterialSkp2Sided, true, [](B b) { b.version(1).base("N"); }, [](B b) { b.b8(false).b8(false); }},
+        // Linked 1: id (kind 2) | material bare | base record.
+        {kMaterialLinked, false, [](B b) { b.version(1).version(1).u32(2).i32(7); }, [](B b) { b.base("N"); }},
+        // Environment override 1: base record | base_mtl | four textures, colours, multipliers, switches.
+        {kMaterialOverrideEnvironment, true, [](B b) { b.version(1).base("N"); },
+         [](B b) {
+             b.b8(false).b8(false).b8(false).b8(false).color(0, 0, 0).color(0, 0, 0).color(0, 0, 0).color(0, 0, 0);
+             b.f32(1).f32(1).f32(1).f32(1).b8(false).b8(false).b8(false).b8(false);
+         }},
+        // Displaced 1: base record | base_mtl | displace_tex, mult.
+        {kMaterialDisplaced, true, [](B b) { b.version(1).base("N"); }, [](B b) { b.b8(false).f32(1); }},
+        // Object exclusion 3: mode | base_mtl | names, base record, short_circuit.
+        {kMaterialObjectExclusion, true, [](B b) { b.version(3).i32(0); }, [](B b) { b.u32(0).base("N").b8(true); }},
+        // Alpha contribution 1: base record | base_mtl | alpha_tex, two floats.
+        {kMaterialAlphaContribution, true, [](B b) { b.version(1).base("N"); }, [](B b) { b.b8(false).f32(1).f32(1); }},
+        // Angle blend 1: base record | mtl_one | mtl_two, two angles.
+        {kMaterialAngleBlend, true, [](B b) { b.version(1).base("N"); }, [](B b) { b.b8(false).f32(75).f32(150); }},
+        // Reference 2: base record, target_uuid | embedded copy.
+        {kMaterialReference, true, [](B b) { b.version(2).base("N").str("t"); }, [](B) {}},
+        // Toon 2: base_mtl | the line fields, base record, silhouette fields.
+        {kMaterialToon, true, [](B b) { b.version(2); },
+         [](B b) {
+             b.f32(1.5f).f32(1).b8(false).f32(1).f32(1).b8(false).f32(0).f32(1).b8(false);
+             b.color(0, 0, 0).f32(1).b8(false).f32(0.95f).f32(0.02f).f32(0.7f).f32(1).b8(true).b8(false).base("N").b8(false).f32(1.5f);
+         }},
     };
-    for (const auto& c : cases) {
-        table().clear();
-        for (const std::u16string& t : std::get<0>(c)) ASSERT_TRUE(table().addMaterial(named(t)));
-        EXPECT_EQ(table().getUniqueName(std::get<1>(c)), std::get<2>(c)) << wideToUtf8(std::get<1>(c));
-    }
-    // A new material takes a unique default name but isn't entered.
-    ASSERT_TRUE(table().addMaterial(named(u"DefaultMaterial")));
-    MaterialMulti a, b;
-    EXPECT_EQ(std::make_tuple(a.name, b.name), std::make_tuple(u"DefaultMaterial1", u"DefaultMaterial1"));
-    // Validity, with the message of a refusal.
-    std::u16string message = u"stale";
-    EXPECT_TRUE(table().isNameValid(u"Stone", message));
-    EXPECT_EQ(message, u"");
-    EXPECT_FALSE(table().isNameValid(u"defaultMATERIAL", message));
-    EXPECT_EQ(message, u"The name, \"defaultMATERIAL\", is already in use");
-    EXPECT_FALSE(table().isNameValid(u"", message));
-    EXPECT_EQ(message, u"A name must have at least one character");
-    EXPECT_TRUE(table().isNameUnused(u"Stone") && !table().isNameUnused(u"defaultmaterial"));
+    return all;
 }
 
-TEST_F(SceneTable, AddReplaceCopyRemove) {
-    EXPECT_FALSE(table().addMaterial(MaterialPtr()) || table().addMaterial(named(u"")));
-    ASSERT_TRUE(table().addMaterial(named(u"wood", u"ID-W")));
-    EXPECT_FALSE(table().addMaterial(named(u"WOOD", u"ID-2")));  // one key per name, ignoring case
-    ASSERT_TRUE(table().addMaterial(named(u"Stone", u"ID-S")));
-    EXPECT_EQ(state(table()), "Stone\nwood\nBeginning UUIDs\nID-S Stone\nID-W wood\n");
-    EXPECT_EQ(table().getMaterialByUuid(u"id-w"), table().getMaterial(u"WOOD"));
-    EXPECT_FALSE(table().getMaterialByUuid(u"nothing"));
-    // Replace moves the entry and its UUID: the new name must be free (a change
-    // of case alone is), the old one present.
-    const MaterialPtr wood = table().getMaterial(u"wood");
-    wood->name = u"Stone";
-    EXPECT_FALSE(table().replaceMaterial(u"wood", wood));
-    wood->name = u"Oak";
-    EXPECT_FALSE(table().replaceMaterial(u"Pine", wood));
-    EXPECT_TRUE(table().replaceMaterial(u"WOOD", wood));
-    wood->name = u"OAK";
-    EXPECT_TRUE(table().replaceMaterial(u"Oak", wood));
-    EXPECT_EQ(state(table()), "OAK\nStone\nBeginning UUIDs\nID-S Stone\nID-W OAK\n");
-    // A copy takes a unique name and no uuid.
-    const MaterialPtr copy = table().getMaterialCopy(u"oak");
-    ASSERT_TRUE(copy);
-    EXPECT_EQ(std::make_tuple(copy->name, copy->uuid), std::make_tuple(u"OAK1", u""));
-    EXPECT_FALSE(table().getMaterialCopy(u"Pine") || table().removeMaterial(u"Pine"));
-    EXPECT_TRUE(table().removeMaterial(u"oak"));
-    EXPECT_EQ(state(table()), "Stone\nBeginning UUIDs\nID-S Stone\n");
-    // A material without a uuid gets one in the map only.
-    const MaterialPtr glass = named(u"Glass");
-    ASSERT_TRUE(table().addMaterial(glass));
-    EXPECT_TRUE(glass->uuid.empty());
-    EXPECT_EQ(table().getUuid(u"glass").size(), 36u);
-    EXPECT_EQ(table().getMaterialByUuid(table().getUuid(u"glass")), glass);
-    // An entry without a UUID entry is removed all the same: a version 2 record
-    // with one material and an empty UUID map.
-    QuickArchive ar = RecordBytes().version(2).u32(1).multi("Solo").u32(0).archive();
-    ASSERT_TRUE(table().load(ar));
-    EXPECT_TRUE(table().removeMaterial(u"Solo"));
-    EXPECT_EQ(state(table()), "Beginning UUIDs\n");
+// A chain of `depth` wrappers, level i of the class layouts()[pick(i)], over a
+// layered material: the record of the top, without its tag.
+RecordBytes chain(int depth, const std::function<std::size_t(int)>& pick) {
+    RecordBytes b;
+    for (int i = 0; i < depth; ++i) {
+        const WrapperLayout& w = layouts()[pick(i)];
+        w.head(b);
+        if (w.presentFlag) b.b8(true);
+        if (i + 1 < depth) b.u32(layouts()[pick(i + 1)].tag);
+    }
+    b.layered("N");
+    for (int i = depth; i-- > 0;) layouts()[pick(i)].tail(b);
+    return b;
 }
 
-TEST_F(SceneTable, RecordVersions) {
-    // The current record, round trip.
-    ASSERT_TRUE(table().addMaterial(named(u"Wood", u"ID-W")));
-    ASSERT_TRUE(table().addMaterial(named(u"Stone", u"ID-S")));
-    QuickArchive ar;
-    ASSERT_TRUE(table().save(ar));
-    SceneMaterials t;
-    ASSERT_TRUE(t.load(ar));
-    EXPECT_EQ(state(t), state(table()));
-    EXPECT_TRUE(t.getMaterial(u"Wood")->isEqual(table().getMaterial(u"Wood")));
-    EXPECT_EQ(t.getMaterial(u"Wood")->uuid, u"ID-W");
-    // Version 1: count, then per material its tag and record; no UUID map. The
-    // materials go through addMaterial: one without a uuid gets one, and a name
-    // it refuses ends the load, what came before staying.
-    QuickArchive v1 = RecordBytes().version(1).u32(2).multi("Wood", "ID-W").multi("Stone").archive();
-    ASSERT_TRUE(t.load(v1));
-    EXPECT_EQ(t.getUuid(u"Wood"), u"ID-W");
-    EXPECT_EQ(t.getUuid(u"Stone").size(), 36u);
-    QuickArchive twice = RecordBytes().version(1).u32(2).multi("Wood").multi("WOOD").archive();
-    EXPECT_FALSE(t.load(twice));
-    EXPECT_EQ(t.getMaterials().size(), 1u);
-    // Version 2 takes names and pairs without any test: an empty name (which
-    // became a unique default name) and a UUID of a name that isn't there are kept.
-    QuickArchive v2 = RecordBytes().version(2).u32(1).multi("").u32(2).str("U1").str("Ghost").str("U2").str("Other").archive();
-    ASSERT_TRUE(t.load(v2));
-    EXPECT_EQ(state(t), "DefaultMaterial\nBeginning UUIDs\nU1 Ghost\nU2 Other\n");
-    EXPECT_FALSE(t.getMaterialByUuid(u"U1"));
-    // Bad records fail.
-    const RecordBytes bad[] = {
-        RecordBytes().u32(0x20001).u32(0).u32(0),                        // low half set
-        RecordBytes().version(3).u32(0).u32(0),                          // version 3
-        RecordBytes(),                                                   // empty data
-        RecordBytes().version(2).u32(1).i32(15),                         // material tag 15
-        RecordBytes().version(2).u32(0x7FFFFFFF),                        // count past the data
-        RecordBytes().version(2).u32(1).i32(kMaterialMulti).version(2),  // truncated material
-    };
-    for (const RecordBytes& b : bad) {
-        SceneMaterials fresh;
-        QuickArchive in = b.archive();
-        EXPECT_FALSE(fresh.load(in)) << &b - bad;
+TEST_F(MaterialRecords, EveryWrapperClassStopsAtTheNestingLimit) {
+    for (std::size_t k = 0; k < layouts().size(); ++k) {
+        SCOPED_TRACE(layouts()[k].tag);
+        auto same = [k](int) { return k; };
+        // The top record isn't nested; its child is one level deep, and so on:
+        // the layered material at the bottom stands kMaxNestingDepth deep.
+        for (int depth : {kMaxNestingDepth, kMaxNestingDepth + 1, 1000}) {
+            QuickArchive ar = chain(depth, same).archive();
+            EXPECT_EQ(createMaterial(layouts()[k].tag)->load(ar), depth == kMaxNestingDepth) << depth;
+        }
     }
+}
+
+TEST_F(MaterialRecords, AThousandNestedWrappers) {
+    // All classes mixed, a bump at the top: within the limit the tree converts,
+    // flattened under the top.
+    QuickArchive ar = chain(100, [](int i) { return static_cast<std::size_t>(i) % layouts().size(); }).archive();
+    const MaterialPtr mixed = createMaterial(kMaterialBump);
+    ASSERT_TRUE(mixed->load(ar));
+    const std::string xml = wideToUtf8(materialToXml(mixed));
+    EXPECT_EQ(std::make_tuple(countOf(xml, "layout=\"deflumat\""), countOf(xml, "name=\"bump_on\"")), std::make_tuple(1, 1));
+    // Built in memory: saving works at any depth; loading the result fails at
+    // the limit, while the conversion still finds the layered material.
+    MaterialPtr tree = layered(u"Bottom");
+    for (int i = 0; i < 1000; ++i) tree = wrap<MaterialBump>(tree);
+    QuickArchive saved = savedArchive(*tree);
+    EXPECT_FALSE(MaterialBump().load(saved));
+    EXPECT_EQ(countOf(wideToUtf8(materialToXml(tree)), "layout=\"deflumat\""), 1);
 }
 
 }  // namespace

@@ -55,6 +55,12 @@ public:
     }
     // The same as an optional material member.
     RecordBytes& multiMember(const std::string& name) { return b8(true).multi(name); }
+    // A Diffuse_BRDF with its tag, version 4: colour `grey`, no textures, base
+    // record version 4 named `name`, use_color_tex_alpha_as_transparency.
+    RecordBytes& diffuse(const std::string& name, float grey) {
+        return i32(kDiffuseBrdf).version(4).color(grey, grey, grey).color(0, 0, 0).f32(1).f32(1).b8(false).b8(false)
+            .version(4).str(name).b8(true).b8(false).b8(false).b8(false);
+    }
     // A bare MaterialLayeredBRDF, version 4: no layers, four integers, base record, one integer.
     RecordBytes& layered(const std::string& name) {
         return u32(kMaterialLayeredBRDF).version(4).u32(0).i32(1).i32(0).i32(1).i32(1).base(name).i32(0);
