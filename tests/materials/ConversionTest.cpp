@@ -182,33 +182,6 @@ TEST_F(Conversion, TopLevelTrees) {
     expectGolden("top_level_trees.xml", xml);
 }
 
-TEST_F(Conversion, OwnForms) {
-    // The two-sided material whole, its textures first.
-    auto two = sided<Material2Sided>(u"Two", MaterialPtr(), MaterialPtr());
-    two->transparency_tex = acolor(1, 0.5f, 0), two->translucency_tex_mult = 2;
-    expectGolden("own_two_sided.xml", ownXml(*two, u"/Lib"));
-    // Every class in one tree: a parent writes its children's Assets first,
-    // below its own url, and refers to them there. The environment override
-    // writes only its base, under its own url; the displaced material its base
-    // one step (the name) below. The object list has an empty list type and
-    // string entries, unescaped. The toon's own form uses the lower-case words.
-    auto env = wrap<MaterialOverrideEnvironment>(layered(u"L"), u"Env");
-    env->gi_tex = acolor(1, 1, 1);
-    auto exclusion = wrap<MaterialObjectExclusion>(wrap<MaterialDisplaced>(env, u"Disp"), u"Ex");
-    exclusion->mode = 3, exclusion->objects = {u"Chair", u"Big <Table>"};
-    auto alpha = wrap<MaterialAlphaContribution>(exclusion, u"Al");
-    alpha->alpha_tex = acolor(0, 0, 0);
-    auto toon = wrap<MaterialToon>(alpha, u"Toon");
-    toon->distortTex = acolor(0, 0, 1);
-    auto bump = wrap<MaterialBump>(toon, u"Bump");
-    bump->bump_tex = acolor(1, 0, 0);
-    two->front = bump;
-    two->back = sided<MaterialSkp2Sided>(u"Skp", MaterialPtr(), blend(u"AB", layered(u"One"), MaterialPtr()));
-    expectGolden("own_forms.xml", ownXml(*two, u"/Lib"));
-    // Without a base the environment override writes nothing at all.
-    EXPECT_EQ(ownXml(*wrap<MaterialOverrideEnvironment>(MaterialPtr(), u"Env"), u"/Lib"), "");
-}
-
 TEST_F(Conversion, TreesWithoutALayeredMaterialGiveAnEmptyAssetsElement) {
     auto multi = boost::make_shared<MaterialMulti>();
     multi->materials.push_back(layered(u"Sub"));
@@ -259,46 +232,24 @@ TEST_F(Conversion, SearchGoesThroughEveryWrapperInChildOrder) {
     EXPECT_FALSE(resolveReference(referenceTo(u"x")));
 }
 
-TEST_F(Conversion, FindParentFollowsFirstChildren) {
-    const MaterialPtr leaf = layered(u"Leaf");
-    // Every single-child wrapper and the angle blend's first child.
-    auto linked = boost::make_shared<MaterialLinked>();
-    linked->linked_material = leaf;
-    const MaterialPtr top = blend(u"B", linked, layered(u"Other"));
-    const MaterialPtr root = wrap<MaterialBump>(wrap<MaterialOverrideEnvironment>(
-        wrap<MaterialDisplaced>(wrap<MaterialObjectExclusion>(wrap<MaterialAlphaContribution>(wrap<MaterialToon>(top))))));
-    EXPECT_EQ(findParentMaterial(leaf, root), linked);
-    EXPECT_EQ(findParentMaterial(linked, root), top);
-    EXPECT_EQ(findParentMaterial(top, root)->getType(), kMaterialToon);
-    EXPECT_EQ(findParentMaterial(childMaterials(*root)[0], root), root);
-    EXPECT_FALSE(findParentMaterial(childMaterials(*top)[1], root));  // the second child of an angle blend isn't searched
-    EXPECT_FALSE(findParentMaterial(leaf->clone(), root));              // the same object, not an equal one
-    EXPECT_FALSE(findParentMaterial(leaf, MaterialPtr()) || findParentMaterial(MaterialPtr(), root) || findParentMaterial(root, root));
-    // Two-sided materials and references end the search; an empty first child
-    // of an angle blend isn't skipped over.
-    const MaterialPtr two = sided<Material2Sided>(u"T", leaf, MaterialPtr());
-    EXPECT_FALSE(findParentMaterial(leaf, two) || findParentMaterial(leaf, wrap<MaterialBump>(two)));
-    EXPECT_FALSE(findParentMaterial(leaf, referenceTo(u"x", u"Ref", leaf)));
-    EXPECT_FALSE(findParentMaterial(leaf, blend(u"Gap", MaterialPtr(), leaf)));
-    // Usable: anything but an empty pointer or a reference without a target UUID.
-    EXPECT_FALSE(isUsableMaterial(MaterialPtr()) || isUsableMaterial(referenceTo(u"")));
-    EXPECT_TRUE(isUsableMaterial(MaterialPtr(new MaterialMulti)) && isUsableMaterial(referenceTo(u"x")));
-}
-
-TEST_F(Conversion, BitmapFilesOfEveryClass) {
-    // A layered material whose layers hold bitmaps, directly and below other
-    // textures, procedural ones too.
+// A tree with every wrapping class, each texture a bitmap:
+//   Two, a two-sided material, with a texture of its own
+//     front: Bump > Env > Ex > Disp > Al > Toon > Layers, a layered material
+//            with every layer class, bitmaps directly and below other textures
+//     back:  Skp, whose back is AB, an angle blend of Linked (over Bumped, a
+//            bump over Plain) and Other
+boost::shared_ptr<Material2Sided> everyWrapperTree() {
     auto layers = layered(u"Layers");
     static_cast<Diffuse_BRDF&>(*layers->brdfs[0]).transparency_tex = bitmap(u"diffuse.png");
-    auto glass = boost::make_shared<Glass_BRDF>();
+    auto glass = layer<Glass_BRDF>(u"Glass");
     glass->color_tex = bitmap(u"glass_color.png"), glass->ior_tex = bitmap(u"glass_ior.png");
-    auto phong = boost::make_shared<Phong_BRDF>();
+    auto phong = layer<Phong_BRDF>(u"Phong");
     static_cast<FresnelTexture&>(*phong->transparency_tex).refract_ior_tex = bitmap(u"fresnel.png");
     auto invert = boost::make_shared<InvertTexture>();
     invert->texture = bitmap(u"inverted.png");
     auto mix = boost::make_shared<BlendTexture>();
     mix->color_b = invert;
-    auto light = boost::make_shared<Light_BRDF>();
+    auto light = layer<Light_BRDF>(u"Light");
     light->color_tex = mix;
     auto grid = boost::make_shared<GridTexture>();
     grid->line_color = bitmap(u"grid_line.png"), grid->fill_color = bitmap(u"grid_fill.png");
@@ -308,40 +259,83 @@ TEST_F(Conversion, BitmapFilesOfEveryClass) {
     noise->color2_tex = ramp;
     auto checker = boost::make_shared<CheckerTexture>();
     checker->white_color = grid, checker->black_color = noise;
-    auto mirror = boost::make_shared<Mirror_BRDF>();
+    auto mirror = layer<Mirror_BRDF>(u"Mirror");
     mirror->color_tex = checker;
     layers->brdfs.insert(layers->brdfs.end(), {glass, phong, light, mirror});
 
-    auto toon = wrap<MaterialToon>(layers);
+    auto toon = wrap<MaterialToon>(layers, u"Toon");
     toon->distortTex = bitmap(u"toon_distort.png"), toon->opacityTex = bitmap(u"toon_opacity.png");
-    auto alpha = wrap<MaterialAlphaContribution>(toon);
+    auto alpha = wrap<MaterialAlphaContribution>(toon, u"Al");
     alpha->alpha_tex = bitmap(u"alpha.png");
-    auto displaced = wrap<MaterialDisplaced>(alpha);
+    auto displaced = wrap<MaterialDisplaced>(alpha, u"Disp");
     displaced->displace_tex = bitmap(u"displace.png");
-    auto env = wrap<MaterialOverrideEnvironment>(wrap<MaterialObjectExclusion>(displaced));
+    auto exclusion = wrap<MaterialObjectExclusion>(displaced, u"Ex");
+    exclusion->mode = 3, exclusion->objects = {u"Chair", u"Big <Table>"};
+    auto env = wrap<MaterialOverrideEnvironment>(exclusion, u"Env");
     env->gi_tex = bitmap(u"gi.png"), env->refract_tex = bitmap(u"refract.png");
-    auto bump = wrap<MaterialBump>(env);
+    auto bump = wrap<MaterialBump>(env, u"Bump");
     bump->bump_tex = bitmap(u"bump.png");
-    // The textures of a two-sided material aren't visited, its children are.
-    auto two = sided<Material2Sided>(u"Two", bump, boost::make_shared<MaterialLinked>());
+    auto linked = boost::make_shared<MaterialLinked>();
+    linked->name = u"Linked", linked->linked_material = wrap<MaterialBump>(layered(u"Plain"), u"Bumped");
+    static_cast<MaterialBump&>(*linked->linked_material).bump_tex = bitmap(u"linked.png");
+    auto two = sided<Material2Sided>(u"Two", bump, sided<MaterialSkp2Sided>(u"Skp", MaterialPtr(), blend(u"AB", linked, layered(u"Other"))));
     two->translucency_tex = bitmap(u"not_visited.png");
-    auto linkedBump = wrap<MaterialBump>(layered(u"Plain"));
-    linkedBump->bump_tex = bitmap(u"linked.png");
-    static_cast<MaterialLinked&>(*two->back).linked_material = linkedBump;
+    return two;
+}
 
+TEST_F(Conversion, OwnForms) {
+    // The two-sided material whole, its textures first.
+    auto two = sided<Material2Sided>(u"Two", MaterialPtr(), MaterialPtr());
+    two->transparency_tex = acolor(1, 0.5f, 0), two->translucency_tex_mult = 2;
+    expectGolden("own_two_sided.xml", ownXml(*two, u"/Lib"));
+    // Every class: a parent writes its children's Assets first, below its own
+    // url, and refers to them there. The environment override writes only its
+    // base, under its own url; the displaced material its base one step (the
+    // name) below. The object list has an empty list type and string entries,
+    // unescaped. The toon's own form uses the lower-case words.
+    expectGolden("own_forms.xml", ownXml(*everyWrapperTree(), u"/Lib"));
+    // Without a base the environment override writes nothing at all.
+    EXPECT_EQ(ownXml(*wrap<MaterialOverrideEnvironment>(MaterialPtr(), u"Env"), u"/Lib"), "");
+}
+
+TEST_F(Conversion, FindParentFollowsFirstChildren) {
+    // Every single-child wrapper and the angle blend's first child; two-sided
+    // materials end the search.
+    const auto two = everyWrapperTree();
+    const MaterialPtr front = two->front, blend = childMaterials(*two->back)[0], linked = childMaterials(*blend)[0];
+    MaterialPtr layers = front;
+    for (int i = 0; i < 6; ++i) layers = childMaterials(*layers)[0];
+    EXPECT_EQ(layers->name + findParentMaterial(layers, front)->name, u"LayersToon");
+    EXPECT_EQ(findParentMaterial(childMaterials(*front)[0], front), front);
+    EXPECT_EQ(findParentMaterial(childMaterials(*linked)[0], blend), linked);
+    EXPECT_EQ(findParentMaterial(linked, blend), blend);
+    EXPECT_FALSE(findParentMaterial(childMaterials(*blend)[1], blend));  // the second child of an angle blend isn't searched
+    EXPECT_FALSE(findParentMaterial(layers->clone(), front));              // the same object, not an equal one
+    EXPECT_FALSE(findParentMaterial(layers, MaterialPtr()) || findParentMaterial(MaterialPtr(), front) || findParentMaterial(front, front));
+    EXPECT_FALSE(findParentMaterial(front, two) || findParentMaterial(layers, two) || findParentMaterial(linked, two->back));
+    // References end the search; an empty first child of an angle blend isn't skipped over.
+    EXPECT_FALSE(findParentMaterial(layers, referenceTo(u"x", u"Ref", layers)));
+    EXPECT_FALSE(findParentMaterial(layers, ::mattest::blend(u"Gap", MaterialPtr(), layers)));
+    // Usable: anything but an empty pointer or a reference without a target UUID.
+    EXPECT_FALSE(isUsableMaterial(MaterialPtr()) || isUsableMaterial(referenceTo(u"")));
+    EXPECT_TRUE(isUsableMaterial(MaterialPtr(new MaterialMulti)) && isUsableMaterial(referenceTo(u"x")));
+}
+
+TEST_F(Conversion, BitmapFilesOfEveryClass) {
     // The order is that of the walk through the materials: a wrapper's base
-    // before its own textures, except for the bump, whose texture comes first.
+    // before its own textures, except for the bump, whose texture comes first;
+    // the textures of a two-sided material aren't visited, its children are.
     std::vector<std::u16string> files = {u"already.png"};
-    EXPECT_EQ(collectBitmapFiles(blend(u"Top", two, MaterialPtr()), files), 17u);
+    const auto two = everyWrapperTree();
+    EXPECT_EQ(collectBitmapFiles(two, files), 17u);
     std::sort(files.begin() + 7, files.begin() + 10);  // the order inside the checker is not fixed
     EXPECT_EQ(files, (std::vector<std::u16string>{
                          u"already.png", u"bump.png", u"diffuse.png", u"glass_color.png", u"glass_ior.png",
                          u"fresnel.png", u"inverted.png", u"grid_fill.png", u"grid_line.png", u"ramp.png",
                          u"toon_opacity.png", u"toon_distort.png", u"alpha.png", u"displace.png", u"gi.png",
                          u"refract.png", u"linked.png"}));
-
     // A reference is followed through the scene table only.
-    auto ref = referenceTo(u"t-1", u"Ref", bump);
+    auto ref = referenceTo(u"t-1", u"Ref", two);
     std::vector<std::u16string> none, fromTable;
     EXPECT_EQ(collectBitmapFiles(ref, none), 0u);
     auto inTable = wrap<MaterialBump>(layered(u"T"), u"InTable");
@@ -351,8 +345,8 @@ TEST_F(Conversion, BitmapFilesOfEveryClass) {
     EXPECT_EQ(fromTable, std::vector<std::u16string>{u"table.png"});
     // Single, multi and instance hold nothing that is visited.
     auto multi = boost::make_shared<MaterialMulti>();
-    multi->materials.push_back(bump);
-    EXPECT_EQ(collectBitmapFiles(multi, none) + collectBitmapFiles(MaterialPtr(new MaterialInstance(bump)), none), 0u);
+    multi->materials.push_back(two);
+    EXPECT_EQ(collectBitmapFiles(multi, none) + collectBitmapFiles(MaterialPtr(new MaterialInstance(two)), none), 0u);
     EXPECT_EQ(collectBitmapFiles(MaterialPtr(), none), 0u);
 }
 
