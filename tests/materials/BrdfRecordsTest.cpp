@@ -1,5 +1,4 @@
-// Records of the six BRDF layers: every version laid by hand and loaded, the
-// current record's bytes, the Fresnel pair, comparison, copies and damaged data.
+// Records of the six BRDF layers: every version laid by hand, comparison, copies, damaged data.
 #include "materials/MaterialTestUtil.h"
 
 using namespace mattest;
@@ -143,7 +142,7 @@ TEST(LayerRecords, EveryVersionLoads) {
         EXPECT_TRUE(l->clone()->isEqual(l));  // a clone copies every field
         const BrdfPtr blinn = createBrdf(kBlinnBrdf);
         QuickArchive again = bytes.archive();
-        if (l->getType() == kPhongBrdf) EXPECT_TRUE(blinn->load(again) && ownXml(*blinn, utf8ToWide("/" + what + " " + hidden(*blinn))) == own);
+        EXPECT_TRUE(l->getType() != kPhongBrdf || (blinn->load(again) && ownXml(*blinn, utf8ToWide("/" + what + " " + hidden(*blinn))) == own));
         return own;
     };
     expectGolden("layer_records.xml", loadEach<BrdfPtr>(layerRecords(), createBrdf, show));
@@ -240,10 +239,6 @@ TEST(LayerCopies, CloneSharesNothing) {
 }
 
 TEST(LayerRecords, FactoryAndBadTags) {
-    for (std::uint32_t tag : {kGlassBrdf, kDiffuseBrdf, kBlinnBrdf, kPhongBrdf, kMirrorBrdf, kLightBrdf}) {
-        EXPECT_EQ(createBrdf(tag)->getType(), tag);
-        EXPECT_EQ(createBrdf(tag)->name, createBrdf(tag)->getPluginName());  // the plugin names are in the goldens
-    }
     for (std::uint32_t tag : {0u, 3u, 5u, 6u, 7u, 64u, 0xFFFFFFFFu}) EXPECT_FALSE(createBrdf(tag)) << tag;
     // Refused version tags fail and leave the reset state.
     const std::pair<std::uint32_t, std::uint32_t> cases[] = {
