@@ -494,8 +494,7 @@ TEST_F(MaterialRecords, AThousandNestedWrappers) {
     QuickArchive ar = chain(100, [](int i) { return static_cast<std::size_t>(i) % layouts().size(); }).archive();
     const MaterialPtr mixed = createMaterial(kMaterialBump);
     ASSERT_TRUE(mixed->load(ar));
-    const std::string xml = wideToUtf8(materialToXml(mixed));
-    EXPECT_EQ(std::make_tuple(countOf(xml, "layout=\"deflumat\""), countOf(xml, "name=\"bump_on\"")), std::make_tuple(1, 1));
+    expectGolden("mixed_chain.xml", wideToUtf8(materialToXml(mixed)));
     // Built in memory: saving works at any depth; loading the result fails at
     // the limit, while the conversion still finds the layered material.
     MaterialPtr tree = layered(u"Bottom");
@@ -503,7 +502,7 @@ TEST_F(MaterialRecords, AThousandNestedWrappers) {
     QuickArchive saved;
     EXPECT_TRUE(tree->save(saved));
     EXPECT_FALSE(MaterialBump().load(saved));
-    EXPECT_EQ(countOf(wideToUtf8(materialToXml(tree)), "layout=\"deflumat\""), 1);
+    EXPECT_EQ(materialToXml(tree), materialToXml(wrap<MaterialBump>(layered(u"Bottom"))));
 }
 
 }  // namespace

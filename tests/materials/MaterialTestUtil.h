@@ -3,6 +3,7 @@
 // trips and the golden documents under golden/.
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <boost/make_shared.hpp>
 #include <cstdlib>
 #include <cstring>
@@ -185,34 +186,22 @@ std::string ownXml(T& object, const std::u16string& url = u"") {
     return wideToUtf8(out);
 }
 
-inline int countOf(const std::string& text, const std::string& needle) {
-    int n = 0;
-    for (std::size_t p = text.find(needle); p != std::string::npos; p = text.find(needle, p + 1)) ++n;
-    return n;
-}
-
 // Compares `actual` with tests/materials/golden/<name>, naming the first line
 // that differs. With ORVXML_UPDATE_GOLDEN set the file is written instead.
 inline void expectGolden(const std::string& name, const std::string& actual) {
     const std::string path = ORVXML_SOURCE_DIR "/tests/materials/golden/" + name;
     if (std::getenv("ORVXML_UPDATE_GOLDEN")) std::ofstream(path, std::ios::binary) << actual;
     std::ifstream file(path, std::ios::binary);
-    ASSERT_TRUE(file) << path;
-    std::ostringstream content;
-    content << file.rdbuf();
-    const std::string expected = content.str();
-    std::istringstream e(expected), a(actual);
-    std::string el, al;
-    for (int line = 1;; ++line) {
-        const bool moreE = static_cast<bool>(std::getline(e, el)), moreA = static_cast<bool>(std::getline(a, al));
-        if (!moreE && !moreA) break;
-        if (!moreE || !moreA || el != al) {
-            ADD_FAILURE() << name << " line " << line << "\n expected: " << (moreE ? el : "<end>")
-                          << "\n actual:   " << (moreA ? al : "<end>");
-            return;
-        }
-    }
-    EXPECT_EQ(expected, actual) << name;  // also catches a difference in the last line break
+    ASSERT_TRUE(file.is_open()) << path;
+    const std::string expected((std::istreambuf_iterator<char>(file)), std::istreambuf_iterator<char>());
+    const std::size_t at = std::mismatch(expected.begin(), expected.end(), actual.begin(), actual.end()).first - expected.begin();
+    if (expected == actual) return;
+    auto lineAt = [at](const std::string& text) {
+        const std::size_t start = at == 0 ? 0 : text.rfind('\n', at - 1) + 1;
+        return at >= text.size() ? "<end>" : text.substr(start, text.find('\n', start) - start);
+    };
+    ADD_FAILURE() << name << " line " << std::count(expected.begin(), expected.begin() + at, '\n') + 1
+                  << "\n expected: " << lineAt(expected) << "\n actual:   " << lineAt(actual);
 }
 
 // Tests that use the scene table start and end with an empty one.
