@@ -188,44 +188,6 @@ TEST_F(Conversion, TopLevelTrees) {
     expectGolden("top_level_trees.xml", xml);
 }
 
-std::vector<std::u16string> found(const MaterialPtr& tree, std::uint32_t tag) {
-    std::vector<std::u16string> names;
-    for (const MaterialPtr& m : findMaterialsOfType(tree, tag)) names.push_back(m->name);
-    return names;
-}
-
-TEST_F(Conversion, SearchGoesThroughEveryWrapperInChildOrder) {
-    auto linked = boost::make_shared<MaterialLinked>();
-    linked->linked_material = layered(u"E");
-    auto multi = boost::make_shared<MaterialMulti>();
-    multi->materials.push_back(layered(u"Hidden"));
-    multi->name = u"Multi";
-    const MaterialPtr tree = wrap<MaterialBump>(sided<Material2Sided>(
-        u"Two", blend(u"Blend", layered(u"A"), layered(u"B")),
-        sided<MaterialSkp2Sided>(u"Skp", layered(u"C"), blend(u"Blend2", wrap<MaterialToon>(layered(u"D")), linked))));
-    EXPECT_EQ(found(tree, kMaterialLayeredBRDF), (std::vector<std::u16string>{u"A", u"B", u"C", u"D", u"E"}));
-    // A material of the type ends the search below it.
-    EXPECT_EQ(found(tree, kMaterialAngleBlend), (std::vector<std::u16string>{u"Blend", u"Blend2"}));
-    // A multi material isn't entered (but is found itself); empty children are skipped.
-    EXPECT_TRUE(found(wrap<MaterialBump>(multi), kMaterialLayeredBRDF).empty());
-    EXPECT_EQ(found(wrap<MaterialBump>(multi), kMaterialMulti), std::vector<std::u16string>{u"Multi"});
-    EXPECT_EQ(found(sided<Material2Sided>(u"T", MaterialPtr(), layered(u"Back")), kMaterialLayeredBRDF),
-              std::vector<std::u16string>{u"Back"});
-
-    // Through a reference the search asks the table first, then takes the
-    // embedded copy; the conversion's own resolution takes the copy alone.
-    auto inTable = layered(u"InTable");
-    inTable->uuid = u"aaaa-1";
-    const MaterialPtr ref = referenceTo(u"AAAA-1", u"Ref", layered(u"Embedded"));
-    EXPECT_EQ(found(ref, kMaterialLayeredBRDF), std::vector<std::u16string>{u"Embedded"});
-    ASSERT_TRUE(table().addMaterial(inTable));
-    EXPECT_EQ(found(ref, kMaterialLayeredBRDF), std::vector<std::u16string>{u"InTable"});
-    EXPECT_EQ(resolveReference(ref)->name, u"Embedded");
-    EXPECT_EQ(resolveReference(inTable), inTable);
-    EXPECT_FALSE(resolveReference(MaterialPtr()));
-    EXPECT_FALSE(resolveReference(referenceTo(u"x")));
-}
-
 // A tree with every wrapping class, each texture a bitmap:
 //   Two, a two-sided material, with a texture of its own
 //     front: Bump > Env > Ex > Disp > Al > Toon > Layers, a layered material
@@ -342,6 +304,35 @@ TEST_F(Conversion, BitmapFilesOfEveryClass) {
     multi->materials.push_back(two);
     EXPECT_EQ(collectBitmapFiles(multi, none) + collectBitmapFiles(MaterialPtr(new MaterialInstance(two)), none), 0u);
     EXPECT_EQ(collectBitmapFiles(MaterialPtr(), none), 0u);
+}
+
+std::vector<std::u16string> found(const MaterialPtr& tree, std::uint32_t tag) {
+    std::vector<std::u16string> names;
+    for (const MaterialPtr& m : findMaterialsOfType(tree, tag)) names.push_back(m->name);
+    return names;
+}
+
+TEST_F(Conversion, SearchGoesThroughEveryWrapperInChildOrder) {
+    EXPECT_EQ(found(everyWrapperTree(), kMaterialLayeredBRDF), (std::vector<std::u16string>{u"Layers", u"Plain", u"Other"}));
+    // A material of the type ends the search below it; a multi material isn't
+    // entered, but is found itself.
+    EXPECT_EQ(found(wrap<MaterialBump>(everyWrapperTree(), u"Outer"), kMaterialBump), std::vector<std::u16string>{u"Outer"});
+    auto multi = boost::make_shared<MaterialMulti>();
+    multi->name = u"Multi", multi->materials.push_back(layered(u"Hidden"));
+    EXPECT_TRUE(found(wrap<MaterialBump>(multi), kMaterialLayeredBRDF).empty());
+    EXPECT_EQ(found(wrap<MaterialBump>(multi), kMaterialMulti), std::vector<std::u16string>{u"Multi"});
+    // Through a reference the search asks the table first, then takes the
+    // embedded copy; the conversion's own resolution takes the copy alone.
+    auto inTable = layered(u"InTable");
+    inTable->uuid = u"aaaa-1";
+    const MaterialPtr ref = referenceTo(u"AAAA-1", u"Ref", layered(u"Embedded"));
+    EXPECT_EQ(found(ref, kMaterialLayeredBRDF), std::vector<std::u16string>{u"Embedded"});
+    ASSERT_TRUE(table().addMaterial(inTable));
+    EXPECT_EQ(found(ref, kMaterialLayeredBRDF), std::vector<std::u16string>{u"InTable"});
+    EXPECT_EQ(resolveReference(ref)->name, u"Embedded");
+    EXPECT_EQ(resolveReference(inTable), inTable);
+    EXPECT_FALSE(resolveReference(MaterialPtr()));
+    EXPECT_FALSE(resolveReference(referenceTo(u"x")));
 }
 
 }  // namespace
