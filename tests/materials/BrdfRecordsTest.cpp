@@ -11,25 +11,24 @@ TexturePtr fresnel(float ior) {
     return f;
 }
 
-// Rows 1 to 3 of every Glass_BRDF record: color, fog_color; ior, ior_second,
-// cutoff, fog_color_mult, glossiness; depth_value, subdivs, affect_shadows, affect_alpha.
+// Rows 1 to 3 of every Glass_BRDF record: color, fog_color; ior, ior_second, cutoff, fog_color_mult, glossiness;
+// depth_value, subdivs, affect_shadows, affect_alpha.
 RecordBytes glassHead(int version) {
     return RecordBytes().version(version).color(0.1f, 0.2f, 0.3f).color(0.4f, 0.5f, 0.6f)
         .f32(1.4f).f32(1.6f).f32(0.002f).f32(2).f32(0.7f).i32(3).i32(12).i32(1).i32(4);
 }
-// Rows 5 to 7: translucency_on; thickness, scatter_coeff, scatter_direction,
-// translucency_tex_mult; translucency.
+// Rows 5 to 7: translucency_on; thickness, scatter_coeff, scatter_direction, translucency_tex_mult; translucency.
 RecordBytes& translucency(RecordBytes& b) { return b.i32(1).f32(50).f32(0.5f).f32(0.25f).f32(0.44f).color(0.7f, 0.8f, 0.9f); }
 
-// The head H of old glossy records: color, reflection; hilightGlossiness,
-// reflectionGlossiness; Fresnel f32; cutoff; subdivs; Fresnel i32; back_side, depth_value.
+// The head H of old glossy records: color, reflection; hilightGlossiness, reflectionGlossiness; Fresnel f32; cutoff;
+// subdivs; Fresnel i32; back_side, depth_value.
 RecordBytes glossyHead(int version, float fresnelIor, std::int32_t fresnelSwitch) {
     return RecordBytes().version(version).color(0.9f, 0.8f, 0.7f).color(0.6f, 0.5f, 0.4f).f32(0.3f).f32(0.35f)
         .f32(fresnelIor).f32(0.02f).i32(9).i32(fresnelSwitch).i32(1).i32(6);
 }
 
-// The head of old Mirror_BRDF records: color, reflection;
-// transparency_tex_mult; Fresnel f32; cutoff; Fresnel i32; mirror_value.
+// The head of old Mirror_BRDF records: color, reflection; transparency_tex_mult; Fresnel f32; cutoff; Fresnel i32;
+// mirror_value.
 RecordBytes mirrorHead(int version, float fresnelIor, std::int32_t fresnelSwitch) {
     return RecordBytes().version(version).color(0.2f, 0.3f, 0.4f).color(0.5f, 0.6f, 0.7f).f32(0.8f).f32(fresnelIor)
         .f32(0.03f).i32(fresnelSwitch).i32(4);
@@ -40,8 +39,8 @@ RecordBytes diffuseHead(int version) {
     return RecordBytes().version(version).color(0.1f, 0.2f, 0.3f).color(0.4f, 0.5f, 0.6f).f32(0.7f).f32(0.8f);
 }
 
-// Light_BRDF records from 2 on start with color, transparency; intensity,
-// light_value, color_tex_mult, transparency_tex_mult.
+// Light_BRDF records from 2 on start with color, transparency; intensity, light_value, color_tex_mult,
+// transparency_tex_mult.
 RecordBytes lightHead(int version) {
     return RecordBytes().version(version).color(0.9f, 0.8f, 0.7f).color(0.1f, 0.2f, 0.3f).f32(3).f32(4).f32(0.25f).f32(0.5f);
 }
@@ -50,17 +49,16 @@ const std::vector<Record>& layerRecords() {
     static const std::vector<Record> all = {
         // Glass 1: rows 1 to 3.
         {kGlassBrdf, glassHead(1), false},
-        // Glass 2: rows 1 to 3; transparency_tex_mult, glossiness_tex_mult,
-        // ior_tex_mult; paths of transparency_tex, glossiness_tex, ior_tex (empty: no texture).
+        // Glass 2: rows 1 to 3; transparency_tex_mult, glossiness_tex_mult, ior_tex_mult; paths of transparency_tex,
+        // glossiness_tex, ior_tex (empty: no texture).
         {kGlassBrdf, glassHead(2).f32(0.11f).f32(0.22f).f32(0.33f).str("t.png").str("").str("i.png"), false},
         // Glass 3: as 2; rows 5 to 7; path of translucency_tex.
         {kGlassBrdf, translucency(glassHead(3).f32(0.11f).f32(0.22f).f32(0.33f).str("").str("g.png").str("")).str("tl.png"), false},
-        // Glass 4: the three multipliers of 2; rows 5 to 7; members
-        // transparency_tex, glossiness_tex, ior_tex, translucency_tex.
+        // Glass 4: the three multipliers of 2; rows 5 to 7; members transparency_tex, glossiness_tex, ior_tex,
+        // translucency_tex.
         {kGlassBrdf, translucency(glassHead(4).f32(0.11f).f32(0.22f).f32(0.33f)).acolor(0.1f).b8(false).acolor(0.3f).acolor(0.4f), false},
-        // Glass 5: rows 1 to 3; color_tex_mult, glossiness_tex_mult,
-        // ior_tex_mult; rows 5 to 7; members color_tex, glossiness_tex, ior_tex,
-        // translucency_tex; transparency; transparency_tex_mult; member transparency_tex.
+        // Glass 5: rows 1 to 3; color_tex_mult, glossiness_tex_mult, ior_tex_mult; rows 5 to 7; members color_tex,
+        // glossiness_tex, ior_tex, translucency_tex; transparency; transparency_tex_mult; member transparency_tex.
         {kGlassBrdf, translucency(glassHead(5).f32(0.55f).f32(0.22f).f32(0.33f)).acolor(0.5f).b8(false).b8(false).acolor(0.4f)
                          .color(0.3f, 0.2f, 0.1f).f32(0.66f).acolor(0.6f), false},
         // Glass 6 (current): as 5, then the base record version 4 (name, three flags).
@@ -69,28 +67,24 @@ const std::vector<Record>& layerRecords() {
         // Glossy 1: H, then the Fresnel rule (on, off: the default Fresnel texture is gone).
         {kPhongBrdf, glossyHead(1, 1.8f, 1), false},
         {kPhongBrdf, glossyHead(1, 1.8f, 0), false},
-        // Glossy 2: H; color_tex_mult, hilightGlossiness_tex_mult,
-        // reflectionGlossiness_tex_mult; paths of color_tex,
+        // Glossy 2: H; color_tex_mult, hilightGlossiness_tex_mult, reflectionGlossiness_tex_mult; paths of color_tex,
         // hilightGlossiness_tex, reflectionGlossiness_tex; Fresnel rule (on: any switch but 0).
         {kPhongBrdf, glossyHead(2, 2.0f, -1).f32(0.1f).f32(0.2f).f32(0.3f).str("c.png").str("h.png").str(""), false},
         // Glossy 3: as 2; anisotropy, anisotropy_rotation; Fresnel rule.
         {kPhongBrdf, glossyHead(3, 2.0f, 0).f32(0.1f).f32(0.2f).f32(0.3f).str("").str("").str("r.png").f32(0.75f).f32(45), false},
-        // Glossy 4: H; the three multipliers; members color_tex,
-        // hilightGlossiness_tex, reflectionGlossiness_tex; anisotropy, anisotropy_rotation; Fresnel rule.
+        // Glossy 4: H; the three multipliers; members color_tex, hilightGlossiness_tex, reflectionGlossiness_tex;
+        // anisotropy, anisotropy_rotation; Fresnel rule.
         {kPhongBrdf, glossyHead(4, 1.3f, 1).f32(0.1f).f32(0.2f).f32(0.3f).acolor(0.1f).b8(false).acolor(0.3f).f32(0.75f).f32(45), false},
         // Glossy 5: as 4; base record (here version 2: name, layer_flag_a); Fresnel rule.
         {kPhongBrdf, glossyHead(5, 1.3f, 0).f32(0.1f).f32(0.2f).f32(0.3f).b8(false).b8(false).b8(false).f32(0.75f).f32(45)
                          .version(2).str("Gloss").b8(false), false},
-        // Glossy 6 (current): color, reflection; hilightGlossiness,
-        // reflectionGlossiness, cutoff; subdivs, back_side, depth_value; the four
-        // multipliers (transparency_tex_mult last); members color_tex,
-        // hilightGlossiness_tex, reflectionGlossiness_tex, transparency_tex;
-        // anisotropy, anisotropy_rotation; base record version 4.
+        // Glossy 6 (current): color, reflection; hilightGlossiness, reflectionGlossiness, cutoff; subdivs, back_side,
+        // depth_value; the four multipliers (transparency_tex_mult last); members color_tex, hilightGlossiness_tex,
+        // reflectionGlossiness_tex, transparency_tex; anisotropy, anisotropy_rotation; base record version 4.
         {kPhongBrdf, RecordBytes().version(6).color(0.9f, 0.8f, 0.7f).color(0.6f, 0.5f, 0.4f).f32(0.3f).f32(0.35f).f32(0.02f)
                          .i32(9).i32(1).i32(6).f32(0.1f).f32(0.2f).f32(0.3f).f32(0.4f).b8(false).acolor(0.2f).b8(false).b8(false)
                          .f32(0.75f).f32(45).version(4).str("Gloss").b8(true).b8(false).b8(true), true},
-        // Mirror 1: head; path of transparency_tex; Fresnel rule (on: the Fresnel
-        // texture replaces the path).
+        // Mirror 1: head; path of transparency_tex; Fresnel rule (on: the Fresnel texture replaces the path).
         {kMirrorBrdf, mirrorHead(1, 1.7f, 0).str("m.png"), false},
         {kMirrorBrdf, mirrorHead(1, 1.7f, 3).str("m.png"), false},
         // Mirror 2: head; path of transparency_tex; color_tex_mult; path of color_tex.
@@ -99,21 +93,20 @@ const std::vector<Record>& layerRecords() {
         {kMirrorBrdf, mirrorHead(3, 1.25f, 1).f32(0.9f).acolor(0.1f).acolor(0.2f), false},
         // Mirror 4: as 3; base record version 3 (name, layer_flag_a, layer_flag_b).
         {kMirrorBrdf, mirrorHead(4, 1.25f, 0).f32(0.9f).acolor(0.1f).b8(false).version(3).str("Shiny").b8(true).b8(true), false},
-        // Mirror 5 (current): color, reflection; transparency_tex_mult, cutoff;
-        // mirror_value; color_tex_mult; members transparency_tex, color_tex; base record.
+        // Mirror 5 (current): color, reflection; transparency_tex_mult, cutoff; mirror_value; color_tex_mult; members
+        // transparency_tex, color_tex; base record.
         {kMirrorBrdf, RecordBytes().version(5).color(0.2f, 0.3f, 0.4f).color(0.5f, 0.6f, 0.7f).f32(0.8f).f32(0.03f).i32(4)
                           .f32(0.9f).b8(false).acolor(0.2f).version(4).str("Shiny").b8(true).b8(false).b8(false), true},
-        // Diffuse 1: head; paths of color_tex, transparency_tex. 2: head; members
-        // color_tex, transparency_tex. 3: as 2; base record (version 1: name only).
-        // 4 (current): as 3; use_color_tex_alpha_as_transparency.
+        // Diffuse 1: head; paths of color_tex, transparency_tex. 2: head; members color_tex, transparency_tex. 3: as
+        // 2; base record (version 1: name only). 4 (current): as 3; use_color_tex_alpha_as_transparency.
         {kDiffuseBrdf, diffuseHead(1).str("").str("alpha.png"), false},
         {kDiffuseBrdf, diffuseHead(2).acolor(0.3f).b8(false), false},
         {kDiffuseBrdf, diffuseHead(3).b8(false).acolor(0.4f).version(1).str("Matte"), false},
         {kDiffuseBrdf, diffuseHead(4).b8(false).b8(false).version(4).str("Matte").b8(true).b8(false).b8(false).b8(true), true},
         // Light 1: color; intensity, transparency_tex_mult; path of transparency_tex.
         {kLightBrdf, RecordBytes().version(1).color(0.9f, 0.8f, 0.7f).f32(3).f32(0.5f).str("glow.png"), false},
-        // Light 2: head; paths of color_tex, transparency_tex. 3: head; members
-        // color_tex, transparency_tex. 4: as 3; base record. 5 (current): as 4; doubleSided as i32.
+        // Light 2: head; paths of color_tex, transparency_tex. 3: head; members color_tex, transparency_tex. 4: as 3;
+        // base record. 5 (current): as 4; doubleSided as i32.
         {kLightBrdf, lightHead(2).str("c.png").str("t.png"), false},
         {kLightBrdf, lightHead(3).b8(false).acolor(0.6f), false},
         {kLightBrdf, lightHead(4).acolor(0.6f).b8(false).version(4).str("Lamp").b8(false).b8(false).b8(false), false},
@@ -134,9 +127,8 @@ std::string hidden(const Base_BRDF& l) {
 }
 
 TEST(LayerRecords, EveryVersionLoads) {
-    // Each record loaded into a new layer and written under a url that names
-    // the record and what no XML shows: the golden tells where every value
-    // landed. Blinn_BRDF reads the glossy records as Phong_BRDF does.
+    // Each record loaded into a new layer and written under a url that names the record and what no XML shows: the
+    // golden tells where every value landed. Blinn_BRDF reads the glossy records as Phong_BRDF does.
     auto show = [](const BrdfPtr& l, const std::string& what, const RecordBytes& bytes) {
         const std::string own = ownXml(*l, utf8ToWide("/" + what + " " + hidden(*l)));
         EXPECT_TRUE(l->clone()->isEqual(l));  // a clone copies every field
@@ -254,9 +246,8 @@ TEST(LayerRecords, FactoryAndBadTags) {
 }
 
 TEST(LayerRecords, BadChildrenFail) {
-    // Diffuse_BRDF records whose color_tex names texture tag 13; whose AColor
-    // child has a refused version; that end inside the base record's tag;
-    // whose base record has a version the layer doesn't know.
+    // Diffuse_BRDF records whose color_tex names texture tag 13; whose AColor child has a refused version; that end
+    // inside the base record's tag; whose base record has a version the layer doesn't know.
     EXPECT_FALSE(loaded<Diffuse_BRDF>(diffuseHead(2).b8(true).i32(13), false)->color_tex);
     loaded<Diffuse_BRDF>(diffuseHead(2).b8(true).i32(5).version(2), false);
     loaded<Diffuse_BRDF>(diffuseHead(3).b8(false).b8(false), false);

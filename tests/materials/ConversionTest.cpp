@@ -1,5 +1,5 @@
-// The asset conversion against the golden documents under golden/, and the
-// walks over a tree: the search for the layered material, parents, bitmap files.
+// The asset conversion against the golden documents under golden/, and the walks over a tree: the search for the
+// layered material, parents, bitmap files.
 #include <cstdio>
 
 #include <algorithm>
@@ -38,9 +38,8 @@ std::string throughAFile(const std::vector<MaterialPtr>& materials, bool clearTa
     return wideToUtf8(xml);
 }
 
-// A library of four materials: the first holds all six layers, with textures
-// in some slots and none in others; then a multi material, a layered material
-// without layers whose name needs escapes, and a single material.
+// A library of four materials: the first holds all six layers, with textures in some slots and none in others; then a
+// multi material, a layered material without layers whose name needs escapes, and a single material.
 std::vector<MaterialPtr> goldenLibrary() {
     auto lib = boost::make_shared<MaterialLayeredBRDF>();
     lib->name = u"Lib", lib->uuid = u"never-in-xml", lib->double_sided = 2;
@@ -74,9 +73,8 @@ std::vector<MaterialPtr> goldenLibrary() {
 TEST_F(Conversion, LibraryThroughTheFileDriver) {
     const std::vector<MaterialPtr> library = goldenLibrary();
     expectGolden("library.xml", throughAFile(library));
-    // A layered material's own writeXml gives the layers and the main Asset
-    // with the same urls as the conversion, from an empty url; MaterialMulti
-    // and MaterialSingleBRDF write nothing of their own.
+    // A layered material's own writeXml gives the layers and the main Asset with the same urls as the conversion,
+    // from an empty url; MaterialMulti and MaterialSingleBRDF write nothing of their own.
     std::u16string converted;
     AssetXmlWriter convertedWriter(converted);
     writeLayeredAsset(convertedWriter, library[0]);
@@ -90,8 +88,8 @@ TEST_F(Conversion, WrappedTreesThroughTheFileDriver) {
     sheet->translucency = Color(0.1f, 0.2f, 0.3f);
     auto wall = wrap<MaterialBump>(sheet);
     wall->bump_tex = acolor(0.5f, 0.25f, 1), wall->bump_tex_mult = 0.5f;
-    // Ref: a reference whose embedded copy, taken from the table at the save,
-    // is the layered material Stone; the conversion sees an empty table.
+    // Ref: a reference whose embedded copy, taken from the table at the save, is the layered material Stone; the
+    // conversion sees an empty table.
     auto stone = layered(u"Stone", u"Grain");
     stone->uuid = u"5a1e0000-0000-4000-8000-000000000001";
     ASSERT_TRUE(table().addMaterial(stone));
@@ -128,10 +126,9 @@ MaterialPtr allFiveWrappers(bool bumpOutermost) {
 }
 
 TEST_F(Conversion, TopLevelTrees) {
-    // Folded wrappers: the textures first, then the layer, then one main Asset
-    // under the top's name with the wrappers' parameters behind the layered
-    // material's, in the order bump, displaced, environment, exclusion, alpha,
-    // whatever the order of the chain. No object list.
+    // Folded wrappers: the textures first, then the layer, then one main Asset under the top's name with the
+    // wrappers' parameters behind the layered material's, in the order bump, displaced, environment, exclusion,
+    // alpha, whatever the order of the chain. No object list.
     std::string xml = conversion(allFiveWrappers(true));
     EXPECT_EQ(conversion(allFiveWrappers(false)), xml);
     // Only the first wrapper of a type counts.
@@ -144,21 +141,18 @@ TEST_F(Conversion, TopLevelTrees) {
     auto same = layered(u"M", u"Same");
     same->brdfs.push_back(layer<Diffuse_BRDF>(u"Same"));
     xml += conversion(same);
-    // Below a bump a two-sided material is flattened to its back where the
-    // front holds no layered material (see wrapped_trees.xml for the front);
-    // a toon is passed through.
+    // Below a bump a two-sided material is flattened to its back where the front holds no layered material (see
+    // wrapped_trees.xml for the front); a toon is passed through.
     auto multi = boost::make_shared<MaterialMulti>();
     multi->name = u"Multi";
     xml += conversion(wrap<MaterialBump>(sided<Material2Sided>(u"Two", multi, layered(u"B", u"Back"))));
     auto toon = wrap<MaterialToon>(layered(u"Paper"), u"Toon");
     toon->lineColorTex = acolor(1, 0, 0);
     xml += conversion(wrap<MaterialBump>(toon));
-    // At the top, two-child classes write the flat Assets of their children,
-    // then their own Asset, whose layout names the class. An absent child
-    // leaves its parameter out. A usable child without a layered material gets
-    // no Asset, yet the parent refers to it by name; a child that resolves to a
-    // reference without a target UUID isn't usable: no parameter, while its
-    // flat Asset is written from the inner copy.
+    // At the top, two-child classes write the flat Assets of their children, then their own Asset, whose layout names
+    // the class. An absent child leaves its parameter out. A usable child without a layered material gets no Asset,
+    // yet the parent refers to it by name; a child that resolves to a reference without a target UUID isn't usable:
+    // no parameter, while its flat Asset is written from the inner copy.
     auto two = sided<Material2Sided>(u"Two", layered(u"F", u"FL"), layered(u"B", u"BL"));
     two->translucency = Color(0.25f, 0.5f, 0.75f), two->transparency = Color(1, 1, 1);
     two->translucency_tex = acolor(1, 1, 1), two->force_1sided = true;
@@ -169,9 +163,9 @@ TEST_F(Conversion, TopLevelTrees) {
     xml += conversion(blend(u"Blend", referenceTo(u"u-1", u"Ref", layered(u"Copy")), MaterialPtr()));
     // A reference at the top is searched through a further reference, under that one's name.
     xml += conversion(referenceTo(u"u-1", u"Ref", referenceTo(u"u-2", u"InnerRef", layered(u"Deep", u"Layer"))));
-    // A toon at the top: its base through the flat conversion under its own
-    // name, the textures in slot order, then the toon Asset without lineUnits.
-    // A base without a layered material is still referred to, an unusable one isn't.
+    // A toon at the top: its base through the flat conversion under its own name, the textures in slot order, then
+    // the toon Asset without lineUnits. A base without a layered material is still referred to, an unusable one
+    // isn't.
     toon = wrap<MaterialToon>(wrap<MaterialBump>(layered(u"Paper"), u"Bumped"), u"Ink");
     toon->opacityTex = acolor(0.5f, 0, 0), toon->lineWidthTex = acolor(0.25f, 0, 0), toon->divideByDist = true;
     xml += conversion(toon);
@@ -244,19 +238,17 @@ TEST_F(Conversion, OwnForms) {
     auto two = sided<Material2Sided>(u"Two", MaterialPtr(), MaterialPtr());
     two->transparency_tex = acolor(1, 0.5f, 0), two->translucency_tex_mult = 2;
     expectGolden("own_two_sided.xml", ownXml(*two, u"/Lib"));
-    // Every class: a parent writes its children's Assets first, below its own
-    // url, and refers to them there. The environment override writes only its
-    // base, under its own url; the displaced material its base one step (the
-    // name) below. The object list has an empty list type and string entries,
-    // unescaped. The toon's own form uses the lower-case words.
+    // Every class: a parent writes its children's Assets first, below its own url, and refers to them there. The
+    // environment override writes only its base, under its own url; the displaced material its base one step (the
+    // name) below. The object list has an empty list type and string entries, unescaped. The toon's own form uses the
+    // lower-case words.
     expectGolden("own_forms.xml", ownXml(*everyWrapperTree(), u"/Lib"));
     // Without a base the environment override writes nothing at all.
     EXPECT_EQ(ownXml(*wrap<MaterialOverrideEnvironment>(MaterialPtr(), u"Env"), u"/Lib"), "");
 }
 
 TEST_F(Conversion, FindParentFollowsFirstChildren) {
-    // Every single-child wrapper and the angle blend's first child; two-sided
-    // materials end the search.
+    // Every single-child wrapper and the angle blend's first child; two-sided materials end the search.
     const auto two = everyWrapperTree();
     const MaterialPtr front = two->front, blend = childMaterials(*two->back)[0], linked = childMaterials(*blend)[0];
     MaterialPtr layers = front;
@@ -278,9 +270,8 @@ TEST_F(Conversion, FindParentFollowsFirstChildren) {
 }
 
 TEST_F(Conversion, BitmapFilesOfEveryClass) {
-    // The order is that of the walk through the materials: a wrapper's base
-    // before its own textures, except for the bump, whose texture comes first;
-    // the textures of a two-sided material aren't visited, its children are.
+    // The order is that of the walk through the materials: a wrapper's base before its own textures, except for the
+    // bump, whose texture comes first; the textures of a two-sided material aren't visited, its children are.
     std::vector<std::u16string> files = {u"already.png"};
     const auto two = everyWrapperTree();
     EXPECT_EQ(collectBitmapFiles(two, files), 17u);
@@ -314,15 +305,14 @@ std::vector<std::u16string> found(const MaterialPtr& tree, std::uint32_t tag) {
 
 TEST_F(Conversion, SearchGoesThroughEveryWrapperInChildOrder) {
     EXPECT_EQ(found(everyWrapperTree(), kMaterialLayeredBRDF), (std::vector<std::u16string>{u"Layers", u"Plain", u"Other"}));
-    // A material of the type ends the search below it; a multi material isn't
-    // entered, but is found itself.
+    // A material of the type ends the search below it; a multi material isn't entered, but is found itself.
     EXPECT_EQ(found(wrap<MaterialBump>(everyWrapperTree(), u"Outer"), kMaterialBump), std::vector<std::u16string>{u"Outer"});
     auto multi = boost::make_shared<MaterialMulti>();
     multi->name = u"Multi", multi->materials.push_back(layered(u"Hidden"));
     EXPECT_TRUE(found(wrap<MaterialBump>(multi), kMaterialLayeredBRDF).empty());
     EXPECT_EQ(found(wrap<MaterialBump>(multi), kMaterialMulti), std::vector<std::u16string>{u"Multi"});
-    // Through a reference the search asks the table first, then takes the
-    // embedded copy; the conversion's own resolution takes the copy alone.
+    // Through a reference the search asks the table first, then takes the embedded copy; the conversion's own
+    // resolution takes the copy alone.
     auto inTable = layered(u"InTable");
     inTable->uuid = u"aaaa-1";
     const MaterialPtr ref = referenceTo(u"AAAA-1", u"Ref", layered(u"Embedded"));

@@ -1,5 +1,5 @@
-// Records of every material class: each version laid by hand, the name rules,
-// comparison, copies, resets, damaged data and deep nesting.
+// Records of every material class: each version laid by hand, the name rules, comparison, copies, resets, damaged
+// data and deep nesting.
 #include <sstream>
 #include <stdexcept>
 
@@ -16,9 +16,8 @@ namespace {
 typedef TableTest MaterialRecords;
 typedef MaterialLayeredBRDF Layered;
 
-// Layered 1: layer count, each layer's tag and record; double_sided,
-// layered_value_a; the name inline. 2: the base record in place of the name.
-// 3: as 2, layered_value_b and layered_value_c behind layered_value_a. 4: as 3,
+// Layered 1: layer count, each layer's tag and record; double_sided, layered_value_a; the name inline. 2: the base
+// record in place of the name. 3: as 2, layered_value_b and layered_value_c behind layered_value_a. 4: as 3,
 // layered_value_d at the end. Only the base record removes control characters.
 RecordBytes layeredRecord(int version) {
     RecordBytes b;
@@ -28,9 +27,8 @@ RecordBytes layeredRecord(int version) {
     return version >= 4 ? b.i32(10) : b;
 }
 
-// Toon 1: base_mtl; lineWidth, lineWidthTexMult, lineWidthTex; opacity,
-// opacityTexMult, opacityTex; distort, distortTexMult, distortTex; lineColor,
-// lineColorTexMult, lineColorTex; zThreshold, traceBias, normalThreshold,
+// Toon 1: base_mtl; lineWidth, lineWidthTexMult, lineWidthTex; opacity, opacityTexMult, opacityTex; distort,
+// distortTexMult, distortTex; lineColor, lineColorTexMult, lineColorTex; zThreshold, traceBias, normalThreshold,
 // lineUnits; doSecondary, divideByDist; base record. 2 adds doSilhouetteMult, silhouetteMult.
 RecordBytes toonRecord(int version) {
     RecordBytes b;
@@ -39,8 +37,8 @@ RecordBytes toonRecord(int version) {
     return version == 1 ? b : b.b8(true).f32(3);
 }
 
-// Linked 1: the id record (version 1: kind, then a text for kinds 0 and 1, a
-// number for kind 2), the material's tag and record, the base record.
+// Linked 1: the id record (version 1: kind, then a text for kinds 0 and 1, a number for kind 2), the material's tag
+// and record, the base record.
 RecordBytes linkedRecord(std::uint32_t kind, const std::string& text, std::int32_t number) {
     RecordBytes b;
     b.version(1).version(1).u32(kind);
@@ -51,8 +49,8 @@ const std::vector<Record>& records() {
     static const std::vector<Record> all = {
         {kMaterialLayeredBRDF, layeredRecord(1), false}, {kMaterialLayeredBRDF, layeredRecord(2), false},
         {kMaterialLayeredBRDF, layeredRecord(3), false}, {kMaterialLayeredBRDF, layeredRecord(4), true},
-        // Single 1: single_value_a, single_value_b, the name inline, the layer's
-        // tag and record. 2: the two values, the layer, the base record.
+        // Single 1: single_value_a, single_value_b, the name inline, the layer's tag and record. 2: the two values,
+        // the layer, the base record.
         {kMaterialSingleBRDF, RecordBytes().version(1).i32(3).i32(4).str("").diffuse("Only", 0.5f), false},
         {kMaterialSingleBRDF, RecordBytes().version(2).i32(5).i32(6).diffuse("Only", 0.5f).base("Single", "S-1"), true},
         // Multi 1: count, each sub-material's tag and record, the name inline. 2: the base record for the name.
@@ -73,18 +71,18 @@ const std::vector<Record>& records() {
         {kMaterialBump, RecordBytes().version(2).str("").f32(3).acolor(0.5f).multi("Base"), false},
         // Bump 3: bump_tex_mult, bump_tex, base_mtl, base record.
         {kMaterialBump, RecordBytes().version(3).f32(2).acolor(0.6f).multi("Base").base("Wall", "u-3"), true},
-        // Environment override 1: base record, base_mtl, the textures bg, gi,
-        // reflect, refract, then colours, multipliers and switches in that order.
+        // Environment override 1: base record, base_mtl, the textures bg, gi, reflect, refract, then colours,
+        // multipliers and switches in that order.
         {kMaterialOverrideEnvironment, RecordBytes().version(1).base("Env").b8(true).layered("Base").acolor(0.1f).b8(false).acolor(0.3f)
                                            .acolor(0.4f).color(1, 0, 0).color(0, 1, 0).color(0, 0, 1).color(1, 1, 0).f32(2).f32(3)
                                            .f32(4).f32(5).b8(true).b8(false).b8(false).b8(true), true},
-        // Displaced 1: base record, base_mtl, displace_tex, displace_tex_mult.
-        // 2: as 1, then displace_shift, displace_edge_length, the four integers.
+        // Displaced 1: base record, base_mtl, displace_tex, displace_tex_mult. 2: as 1, then displace_shift,
+        // displace_edge_length, the four integers.
         {kMaterialDisplaced, RecordBytes().version(1).base("D1").b8(true).layered("Base").b8(false).f32(3), false},
         {kMaterialDisplaced, RecordBytes().version(2).base("D").b8(true).layered("Base").acolor(0.5f).f32(2).f32(0.25f).f32(8)
                                  .i32(64).i32(0).i32(0).i32(0), true},
-        // Object exclusion 1: mode, base_mtl, the object names; no base record.
-        // 2: as 1, then the base record. 3: as 2, then short_circuit.
+        // Object exclusion 1: mode, base_mtl, the object names; no base record. 2: as 1, then the base record. 3: as
+        // 2, then short_circuit.
         {kMaterialObjectExclusion, RecordBytes().version(1).i32(1).multiMember("Base").u32(2).str("Chair").str("Table"), false},
         {kMaterialObjectExclusion, RecordBytes().version(2).i32(0).b8(false).u32(0).base("Ex2"), false},
         {kMaterialObjectExclusion, RecordBytes().version(3).i32(7).multiMember("Base").u32(1).str("Lamp").base("Ex3").b8(false), true},
@@ -137,10 +135,9 @@ std::string hidden(const BaseMaterial& m) {
 }
 
 TEST_F(MaterialRecords, EveryVersionLoads) {
-    // Each record loaded into a new material: a comment line with what no XML
-    // shows, then its own XML under a url that names the record. The
-    // environment override and the displaced material show their fields only
-    // in the conversion, folded into their layered base.
+    // Each record loaded into a new material: a comment line with what no XML shows, then its own XML under a url
+    // that names the record. The environment override and the displaced material show their fields only in the
+    // conversion, folded into their layered base.
     auto show = [](const MaterialPtr& m, const std::string& what, const RecordBytes&) {
         const bool folded = m->getType() == kMaterialOverrideEnvironment || m->getType() == kMaterialDisplaced;
         return hidden(*m) + (folded ? wideToUtf8(materialToXml(m)) : ownXml(*m, utf8ToWide("/" + what)));
@@ -222,8 +219,8 @@ TEST_F(MaterialRecords, LoadsIntoUsedObjects) {
 #define KEEP(Class, change) {Class().getType(), [](BaseMaterial& m) { static_cast<Class&>(m).change; }, true}
 
 TEST_F(MaterialRecords, FieldsTakePartInTheComparison) {
-    // One field changed at a time must make a copy differ, except for names,
-    // object names and id texts in another case.
+    // One field changed at a time must make a copy differ, except for names, object names and id texts in another
+    // case.
     const std::tuple<std::uint32_t, void (*)(BaseMaterial&), bool> cases[] = {
         CHANGE(Layered, double_sided = 99),      CHANGE(Layered, layered_value_a = 99), CHANGE(Layered, layered_value_b = 99),
         CHANGE(Layered, layered_value_c = 99),   CHANGE(Layered, layered_value_d = 99), CHANGE(Layered, brdfs.pop_back()),
@@ -247,8 +244,7 @@ TEST_F(MaterialRecords, FieldsTakePartInTheComparison) {
         std::get<1>(c)(*copy);
         EXPECT_EQ(copy->isEqual(m), std::get<2>(c)) << std::get<0>(c) << " case " << &c - cases;
     }
-    // Each child takes part (the sub-materials of a multi material are shared
-    // by its copies); so does the class.
+    // Each child takes part (the sub-materials of a multi material are shared by its copies); so does the class.
     for (const MaterialPtr& m : all) {
         if (m->getType() == kMaterialInstance) continue;  // equal to nothing, not even itself
         for (std::size_t i = 0; m->getType() != kMaterialMulti && i < childMaterials(*m).size(); ++i) {
@@ -269,8 +265,7 @@ TEST_F(MaterialRecords, FieldsTakePartInTheComparison) {
 }
 
 TEST_F(MaterialRecords, CopiesTakeNamesAndShareAsTheirClassSays) {
-    // Make the names of the samples and their children taken, so that a new
-    // unique name differs from the old one.
+    // Make the names of the samples and their children taken, so that a new unique name differs from the old one.
     const std::vector<MaterialPtr> all = samples();
     for (const MaterialPtr& m : all) {
         table().addMaterial(m->clone());
@@ -287,17 +282,16 @@ TEST_F(MaterialRecords, CopiesTakeNamesAndShareAsTheirClassSays) {
         const std::vector<MaterialPtr> mine = childMaterials(*m), dupChildren = childMaterials(*dup), clChildren = childMaterials(*cl);
         ASSERT_EQ(std::make_tuple(dupChildren.size(), clChildren.size()), std::make_tuple(mine.size(), mine.size()));
         for (std::size_t i = 0; i < mine.size(); ++i) {
-            // A multi material's copies share its sub-materials; the other
-            // copies take their children's duplicate or clone, a toon's clone
-            // its base material's duplicate.
+            // A multi material's copies share its sub-materials; the other copies take their children's duplicate or
+            // clone, a toon's clone its base material's duplicate.
             const bool shared = type == kMaterialMulti;
             EXPECT_EQ(std::make_tuple(dupChildren[i] == mine[i], clChildren[i] == mine[i]), std::make_tuple(shared, shared));
             EXPECT_EQ(dupChildren[i]->name == mine[i]->name, shared);
             EXPECT_EQ(clChildren[i]->name == mine[i]->name, type != kMaterialToon);
         }
     }
-    // The layers are cloned; a single material shares its layer, an instance
-    // its material; two-sided copies share their textures, the others clone them.
+    // The layers are cloned; a single material shares its layer, an instance its material; two-sided copies share
+    // their textures, the others clone them.
     auto layers = [](const MaterialPtr& m) { return static_cast<const Layered&>(*m).brdfs[0]; };
     EXPECT_NE(layers(sample(all, kMaterialLayeredBRDF)->duplicate()), layers(sample(all, kMaterialLayeredBRDF)));
     auto single = [](const MaterialPtr& m) { return static_cast<const MaterialSingleBRDF&>(*m).brdf; };
@@ -314,8 +308,8 @@ TEST_F(MaterialRecords, CopiesTakeNamesAndShareAsTheirClassSays) {
 }
 
 TEST_F(MaterialRecords, Resets) {
-    // The wrapping classes keep name and uuid; the bump, a reference and a
-    // linked material take a new default name and drop the uuid.
+    // The wrapping classes keep name and uuid; the bump, a reference and a linked material take a new default name
+    // and drop the uuid.
     for (const MaterialPtr& m : samples()) {
         const std::uint32_t type = m->getType();
         if (type < kMaterialBump || type == kMaterialInstance) continue;
@@ -365,8 +359,8 @@ TEST_F(MaterialRecords, BadAndTruncatedRecordsFail) {
     }
     // A refused base record ends the load before any child is read.
     EXPECT_FALSE(loaded<MaterialSkp2Sided>(RecordBytes().version(1).version(3).str("X").multiMember("F"), false)->front);
-    // Without the material it can't leave out, a linked material fails to save,
-    // writing nothing; so do an invalid id kind, a bump and a single material.
+    // Without the material it can't leave out, a linked material fails to save, writing nothing; so do an invalid id
+    // kind, a bump and a single material.
     auto linked = boost::make_shared<MaterialLinked>();
     QuickArchive out(1);
     EXPECT_FALSE(linked->save(out));
@@ -374,17 +368,16 @@ TEST_F(MaterialRecords, BadAndTruncatedRecordsFail) {
     linked->linked_material = layered(u"L"), linked->id.kind = 3;
     EXPECT_FALSE(linked->save(out) || MaterialBump().save(out) || MaterialSingleBRDF().save(out));
 
-    // Every cut of a layered record up to the base record's tag fails: what
-    // lies behind the end of the data reads as zeros, and the base record's
-    // tag then has no valid version. (Behind that tag zeros pass as an empty name.)
+    // Every cut of a layered record up to the base record's tag fails: what lies behind the end of the data reads as
+    // zeros, and the base record's tag then has no valid version. (Behind that tag zeros pass as an empty name.)
     const RecordBytes& good = recordOf(kMaterialLayeredBRDF, 4);
     for (std::size_t cut = 0; cut <= good.size() - 21; ++cut) {
         Layered m;
         QuickArchive ar = good.archive(cut);
         EXPECT_FALSE(m.load(ar)) << "cut at " << cut;
     }
-    // Every current record, cut anywhere, returns (whatever the result)
-    // without reading outside its bytes; cut to nothing, it is refused.
+    // Every current record, cut anywhere, returns (whatever the result) without reading outside its bytes; cut to
+    // nothing, it is refused.
     for (const Record& r : records()) {
         for (std::size_t cut = 0; r.current && cut < r.bytes.size(); cut += 7) {
             QuickArchive ar = r.bytes.archive(cut);
@@ -393,17 +386,16 @@ TEST_F(MaterialRecords, BadAndTruncatedRecordsFail) {
         QuickArchive empty = r.bytes.archive(0);
         EXPECT_FALSE(createMaterial(r.tag)->load(empty)) << r.tag;
     }
-    // 300 MaterialMulti records, each the only sub-material of the one before:
-    // deeper than any real file, and refused instead of overflowing.
+    // 300 MaterialMulti records, each the only sub-material of the one before: deeper than any real file, and refused
+    // instead of overflowing.
     RecordBytes deep;
     for (int i = 0; i < 300; ++i) deep.version(2).u32(1).i32(kMaterialMulti);
     loaded<MaterialMulti>(deep, false);
     EXPECT_FALSE(createMaterial(kMaterialTagCount) || createMaterial(0xFFFFFFFFu));
 }
 
-// How one wrapper class lays its record around its (first) child: the bytes in
-// front of the child's tag, whether a present flag stands there, and the bytes
-// behind the child's record.
+// How one wrapper class lays its record around its (first) child: the bytes in front of the child's tag, whether a
+// present flag stands there, and the bytes behind the child's record.
 struct WrapperLayout {
     std::uint32_t tag;
     bool presentFlag;
@@ -447,8 +439,8 @@ const std::vector<WrapperLayout>& layouts() {
     return all;
 }
 
-// A chain of `depth` wrappers, level i of the class layouts()[pick(i)], over a
-// layered material: the record of the top, without its tag.
+// A chain of `depth` wrappers, level i of the class layouts()[pick(i)], over a layered material: the record of the
+// top, without its tag.
 RecordBytes chain(int depth, const std::function<std::size_t(int)>& pick) {
     RecordBytes b;
     for (int i = 0; i < depth; ++i) {
@@ -466,8 +458,8 @@ TEST_F(MaterialRecords, EveryWrapperClassStopsAtTheNestingLimit) {
     for (std::size_t k = 0; k < layouts().size(); ++k) {
         SCOPED_TRACE(layouts()[k].tag);
         auto same = [k](int) { return k; };
-        // The top record isn't nested; its child is one level deep, and so on:
-        // the layered material at the bottom stands kMaxNestingDepth deep.
+        // The top record isn't nested; its child is one level deep, and so on: the layered material at the bottom
+        // stands kMaxNestingDepth deep.
         for (int depth : {kMaxNestingDepth, kMaxNestingDepth + 1, 1000}) {
             QuickArchive ar = chain(depth, same).archive();
             EXPECT_EQ(createMaterial(layouts()[k].tag)->load(ar), depth == kMaxNestingDepth) << depth;
@@ -476,14 +468,13 @@ TEST_F(MaterialRecords, EveryWrapperClassStopsAtTheNestingLimit) {
 }
 
 TEST_F(MaterialRecords, AThousandNestedWrappers) {
-    // All classes mixed, a bump at the top: within the limit the tree converts,
-    // flattened under the top.
+    // All classes mixed, a bump at the top: within the limit the tree converts, flattened under the top.
     QuickArchive ar = chain(100, [](int i) { return static_cast<std::size_t>(i) % layouts().size(); }).archive();
     const MaterialPtr mixed = createMaterial(kMaterialBump);
     ASSERT_TRUE(mixed->load(ar));
     expectGolden("mixed_chain.xml", wideToUtf8(materialToXml(mixed)));
-    // Built in memory: saving works at any depth; loading the result fails at
-    // the limit, while the conversion still finds the layered material.
+    // Built in memory: saving works at any depth; loading the result fails at the limit, while the conversion still
+    // finds the layered material.
     MaterialPtr tree = layered(u"Bottom");
     for (int i = 0; i < 1000; ++i) tree = wrap<MaterialBump>(tree);
     QuickArchive saved;

@@ -1,6 +1,6 @@
 #pragma once
-// Shared by the material tests: hand-laid record bytes, small builders, round
-// trips and the golden documents under golden/.
+// Shared by the material tests: hand-laid record bytes, small builders, round trips and the golden documents under
+// golden/.
 #include <gtest/gtest.h>
 
 #include <algorithm>
@@ -54,8 +54,8 @@ public:
     }
     // The same as an optional material member.
     RecordBytes& multiMember(const std::string& name) { return b8(true).multi(name); }
-    // A Diffuse_BRDF with its tag, version 4: colour `grey`, no textures, base
-    // record version 4 named `name`, use_color_tex_alpha_as_transparency.
+    // A Diffuse_BRDF with its tag, version 4: colour `grey`, no textures, base record version 4 named `name`,
+    // use_color_tex_alpha_as_transparency.
     RecordBytes& diffuse(const std::string& name, float grey) {
         return i32(kDiffuseBrdf).version(4).color(grey, grey, grey).color(0, 0, 0).f32(1).f32(1).b8(false).b8(false)
             .version(4).str(name).b8(true).b8(false).b8(false).b8(false);
@@ -104,9 +104,8 @@ struct Record {
     bool current;
 };
 
-// Loads each record into a new object of its class, which must read it to its
-// end; a current one must save back the same bytes. Returns what `show` writes
-// of each, given its label and bytes.
+// Loads each record into a new object of its class, which must read it to its end; a current one must save back the
+// same bytes. Returns what `show` writes of each, given its label and bytes.
 template <class Ptr>
 std::string loadEach(const std::vector<Record>& records, Ptr (*make)(std::uint32_t),
                      const std::function<std::string(const Ptr&, const std::string&, const RecordBytes&)>& show) {
@@ -186,8 +185,8 @@ std::string ownXml(T& object, const std::u16string& url = u"") {
     return wideToUtf8(out);
 }
 
-// Compares `actual` with tests/materials/golden/<name>, naming the first line
-// that differs. With ORVXML_UPDATE_GOLDEN set the file is written instead.
+// Compares `actual` with tests/materials/golden/<name>, naming the first line that differs. With ORVXML_UPDATE_GOLDEN
+// set the file is written instead.
 inline void expectGolden(const std::string& name, const std::string& actual) {
     const std::string path = ORVXML_SOURCE_DIR "/tests/materials/golden/" + name;
     if (std::getenv("ORVXML_UPDATE_GOLDEN")) std::ofstream(path, std::ios::binary) << actual;

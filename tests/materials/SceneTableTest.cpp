@@ -66,8 +66,8 @@ TEST_F(SceneTable, AddReplaceCopyRemove) {
     EXPECT_EQ(state(table()), "Stone\nwood\nBeginning UUIDs\nID-S Stone\nID-W wood\n");
     EXPECT_EQ(table().getMaterialByUuid(u"id-w"), table().getMaterial(u"WOOD"));
     EXPECT_FALSE(table().getMaterialByUuid(u"nothing"));
-    // Replace moves the entry and its UUID: the new name must be free (a change
-    // of case alone is), the old one present.
+    // Replace moves the entry and its UUID: the new name must be free (a change of case alone is), the old one
+    // present.
     const MaterialPtr wood = table().getMaterial(u"wood");
     wood->name = u"Stone";
     EXPECT_FALSE(table().replaceMaterial(u"wood", wood));
@@ -90,8 +90,8 @@ TEST_F(SceneTable, AddReplaceCopyRemove) {
     EXPECT_TRUE(glass->uuid.empty());
     EXPECT_EQ(table().getUuid(u"glass").size(), 36u);
     EXPECT_EQ(table().getMaterialByUuid(table().getUuid(u"glass")), glass);
-    // An entry without a UUID entry is removed all the same: a version 2 record
-    // with one material and an empty UUID map.
+    // An entry without a UUID entry is removed all the same: a version 2 record with one material and an empty UUID
+    // map.
     QuickArchive ar = RecordBytes().version(2).u32(1).multi("Solo").u32(0).archive();
     ASSERT_TRUE(table().load(ar));
     EXPECT_TRUE(table().removeMaterial(u"Solo"));
@@ -109,9 +109,8 @@ TEST_F(SceneTable, RecordVersions) {
     EXPECT_EQ(state(t), state(table()));
     EXPECT_TRUE(t.getMaterial(u"Wood")->isEqual(table().getMaterial(u"Wood")));
     EXPECT_EQ(t.getMaterial(u"Wood")->uuid, u"ID-W");
-    // Version 1: count, then per material its tag and record; no UUID map. The
-    // materials go through addMaterial: one without a uuid gets one, and a name
-    // it refuses ends the load, what came before staying.
+    // Version 1: count, then per material its tag and record; no UUID map. The materials go through addMaterial: one
+    // without a uuid gets one, and a name it refuses ends the load, what came before staying.
     QuickArchive v1 = RecordBytes().version(1).u32(2).multi("Wood", "ID-W").multi("Stone").archive();
     ASSERT_TRUE(t.load(v1));
     EXPECT_EQ(t.getUuid(u"Wood"), u"ID-W");
@@ -119,8 +118,8 @@ TEST_F(SceneTable, RecordVersions) {
     QuickArchive twice = RecordBytes().version(1).u32(2).multi("Wood").multi("WOOD").archive();
     EXPECT_FALSE(t.load(twice));
     EXPECT_EQ(t.getMaterials().size(), 1u);
-    // Version 2 takes names and pairs without any test: an empty name (which
-    // became a unique default name) and a UUID of a name that isn't there are kept.
+    // Version 2 takes names and pairs without any test: an empty name (which became a unique default name) and a UUID
+    // of a name that isn't there are kept.
     QuickArchive v2 = RecordBytes().version(2).u32(1).multi("").u32(2).str("U1").str("Ghost").str("U2").str("Other").archive();
     ASSERT_TRUE(t.load(v2));
     EXPECT_EQ(state(t), "DefaultMaterial\nBeginning UUIDs\nU1 Ghost\nU2 Other\n");
@@ -206,9 +205,8 @@ TEST_F(SceneTable, CreateReferenceAndDefaultMaterial) {
     EXPECT_EQ(std::make_tuple(table().getDefaultMaterial(), table().getMaterials().size()), std::make_tuple(m, 1u));
 }
 
-// A version 2 table record: the layered material Wood, the bump Wrap over a
-// reference to "A-1", the layered material Other; then six UUID pairs, two of
-// them for Wood, two for the missing Ghost.
+// A version 2 table record: the layered material Wood, the bump Wrap over a reference to "A-1", the layered material
+// Other; then six UUID pairs, two of them for Wood, two for the missing Ghost.
 QuickArchive tableWithDuplicates() {
     RecordBytes b;
     b.version(2).u32(3).layered("Wood");
@@ -224,8 +222,7 @@ TEST_F(SceneTable, FindReferencesLooksInsideEveryMaterial) {
     ASSERT_TRUE(table().load(ar));
     ASSERT_EQ(table().findReferences(u"a-1").size(), 1u);
     EXPECT_TRUE(table().findReferences(u"b-2").empty());
-    // A reference at the top, one in a two-sided back, and one inside an
-    // embedded copy, which isn't entered.
+    // A reference at the top, one in a two-sided back, and one inside an embedded copy, which isn't entered.
     table().addMaterial(referenceTo(u"A-1", u"Top", referenceTo(u"a-1", u"InCopy")));
     table().addMaterial(sided<Material2Sided>(u"Two", MaterialPtr(), referenceTo(u"a-1", u"Back")));
     std::vector<std::u16string> names;
