@@ -230,7 +230,7 @@ TEST(LayerCopies, CloneSharesNothing) {
     EXPECT_TRUE(back->isEqual(BrdfPtr(new G(g))));
 }
 
-TEST(LayerRecords, FactoryAndBadTags) {
+TEST(LayerRecords, BadTagsAndChildrenFail) {
     for (std::uint32_t tag : {0u, 3u, 5u, 6u, 7u, 64u, 0xFFFFFFFFu}) EXPECT_FALSE(createBrdf(tag)) << tag;
     // Refused version tags fail and leave the reset state.
     const std::pair<std::uint32_t, std::uint32_t> cases[] = {
@@ -243,9 +243,6 @@ TEST(LayerRecords, FactoryAndBadTags) {
         EXPECT_FALSE(l->load(ar)) << c.first << " " << std::hex << c.second;
         EXPECT_EQ(l->name, l->getPluginName());
     }
-}
-
-TEST(LayerRecords, BadChildrenFail) {
     // Diffuse_BRDF records whose color_tex names texture tag 13; whose AColor child has a refused version; that end
     // inside the base record's tag; whose base record has a version the layer doesn't know.
     EXPECT_FALSE(loaded<Diffuse_BRDF>(diffuseHead(2).b8(true).i32(13), false)->color_tex);

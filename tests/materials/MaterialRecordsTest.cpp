@@ -264,7 +264,7 @@ TEST_F(MaterialRecords, FieldsTakePartInTheComparison) {
     EXPECT_FALSE(sample(all, kMaterialInstance)->isEqual(sample(all, kMaterialInstance)));  // an instance
 }
 
-TEST_F(MaterialRecords, CopiesTakeNamesAndShareAsTheirClassSays) {
+TEST_F(MaterialRecords, CopiesAndResets) {
     // Make the names of the samples and their children taken, so that a new unique name differs from the old one.
     const std::vector<MaterialPtr> all = samples();
     for (const MaterialPtr& m : all) {
@@ -305,9 +305,6 @@ TEST_F(MaterialRecords, CopiesTakeNamesAndShareAsTheirClassSays) {
     EXPECT_NE(bumpTex(sample(all, kMaterialBump)->clone()), bumpTex(sample(all, kMaterialBump)));
     auto widthTex = [](const MaterialPtr& m) { return static_cast<const MaterialToon&>(*m).lineWidthTex; };
     EXPECT_NE(widthTex(sample(all, kMaterialToon)->clone()), widthTex(sample(all, kMaterialToon)));
-}
-
-TEST_F(MaterialRecords, Resets) {
     // The wrapping classes keep name and uuid; the bump, a reference and a linked material take a new default name
     // and drop the uuid.
     for (const MaterialPtr& m : samples()) {

@@ -140,7 +140,7 @@ TEST_F(SceneTable, RecordVersions) {
     }
 }
 
-TEST_F(SceneTable, SaveEmbedsTheTablesMaterialAndDropsTheOldCopy) {
+TEST_F(SceneTable, ReferencesSaveCopyAndCompareThroughTheTable) {
     auto ref = referenceTo(u"WOOD-1", u"Ref", layered(u"Stale"));
     // Not in the table: saved without a copy, and the old copy is gone.
     auto back = roundTrip(*ref);
@@ -152,12 +152,11 @@ TEST_F(SceneTable, SaveEmbedsTheTablesMaterialAndDropsTheOldCopy) {
     EXPECT_EQ(ref->target, wood);
     ASSERT_TRUE(back->target && back->target->isEqual(wood));
     EXPECT_EQ(back->target->name, u"Wood");
-}
-
-TEST_F(SceneTable, ReferenceCopiesAndComparisons) {
-    auto ref = referenceTo(u"abc", u"Ref", layered(u"Copy"));
+    // Copies keep the name, although it is taken, and the target UUID, but no copy or uuid.
+    table().clear();
+    ref = referenceTo(u"abc", u"Ref", layered(u"Copy"));
     ref->uuid = u"own";
-    table().addMaterial(layered(u"Ref"));  // the name is taken: copies keep it all the same
+    table().addMaterial(layered(u"Ref"));
     for (const MaterialPtr& copy : {ref->duplicate(), ref->clone()}) {
         const MaterialReference& c = static_cast<const MaterialReference&>(*copy);
         EXPECT_EQ(std::make_tuple(c.name, c.target_uuid, c.uuid, !c.target), std::make_tuple(u"Ref", u"abc", u"", true));
@@ -217,9 +216,10 @@ QuickArchive tableWithDuplicates() {
     return b.str("x-1").str("Ghost").str("y-2").str("Ghost").str("z-9").str("Other").archive();
 }
 
-TEST_F(SceneTable, FindReferencesLooksInsideEveryMaterial) {
+TEST_F(SceneTable, FindAndMergeReferences) {
     QuickArchive ar = tableWithDuplicates();
     ASSERT_TRUE(table().load(ar));
+    ASSERT_EQ(table().getUuids().size(), 6u);
     ASSERT_EQ(table().findReferences(u"a-1").size(), 1u);
     EXPECT_TRUE(table().findReferences(u"b-2").empty());
     // A reference at the top, one in a two-sided back, and one inside an embedded copy, which isn't entered.
@@ -228,12 +228,7 @@ TEST_F(SceneTable, FindReferencesLooksInsideEveryMaterial) {
     std::vector<std::u16string> names;
     for (const auto& r : table().findReferences(u"A-1")) names.push_back(r->name);
     EXPECT_EQ(names, (std::vector<std::u16string>{u"Top", u"Back", u"Ref"}));  // key order: Top, Two, Wrap
-}
-
-TEST_F(SceneTable, MergeDuplicateUuidsKeepsTheLastAndMovesTheReferences) {
-    QuickArchive ar = tableWithDuplicates();
-    ASSERT_TRUE(table().load(ar));
-    ASSERT_EQ(table().getUuids().size(), 6u);
+    // Merging keeps the last of each material's UUIDs and moves the references to it.
     table().mergeDuplicateUuids();
     const SceneMaterials::UuidMap& uuids = table().getUuids();
     EXPECT_EQ(uuids.count(u"a-1"), 0u);
@@ -244,5 +239,6 @@ TEST_F(SceneTable, MergeDuplicateUuidsKeepsTheLastAndMovesTheReferences) {
     EXPECT_EQ(ref.target_uuid, u"b-2");
     EXPECT_EQ(ref.target, table().getMaterial(u"Wood"));
 }
+
 
 }  // namespace
