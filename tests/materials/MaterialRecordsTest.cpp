@@ -159,12 +159,10 @@ std::vector<MaterialPtr> samples() {
 
 TEST_F(MaterialRecords, BaseRecordNames) {
     const std::tuple<int, std::string, std::u16string> cases[] = {
-        {2, "Wood", u"Wood"},
-        {2, "Wo\nod\x7f\t", u"Wood"},  // control characters removed
-        {2, "A\xc2\x85" "B", u"AB"},   // C1 controls too
-        {2, "", u"DefaultMaterial"},  // an empty name takes the default
-        {2, "\r\n", u""},             // one of controls only stays empty
-        {1, "Old", u"Old"},           // version 1: name only
+        // Control characters removed, C1 controls too; an empty name takes the default, one of controls only
+        // stays empty; version 1: name only.
+        {2, "Wood", u"Wood"}, {2, "Wo\nod\x7f\t", u"Wood"}, {2, "A\xc2\x85" "B", u"AB"},
+        {2, "", u"DefaultMaterial"}, {2, "\r\n", u""}, {1, "Old", u"Old"},
     };
     for (const auto& c : cases) {
         // MaterialMulti version 2: count 0, then the base record.
