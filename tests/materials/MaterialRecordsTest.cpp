@@ -1,7 +1,6 @@
 // Records of every material class: each version laid by hand, the name rules, comparison, copies, resets, damaged
 // data and deep nesting.
 #include <sstream>
-#include <stdexcept>
 
 #include "materials/MaterialAssets.h"
 #include "materials/MaterialTestUtil.h"
@@ -57,12 +56,13 @@ const std::vector<Record>& records() {
         {kMaterialMulti, RecordBytes().version(1).u32(1).multi("Inner").str("Outer\t"), false},
         {kMaterialMulti, RecordBytes().version(2).u32(1).multi("Inner").base("Outer", "M-1"), true},
         // Two-sided 1: front, back, translucency_tex, translucency, translucency_tex_mult, force_1sided.
-        {kMaterial2Sided, RecordBytes().version(1).multiMember("F").b8(false).acolor(0.25f).color(0.1f, 0.2f, 0.3f).f32(0.5f).b8(true), false},
+        {kMaterial2Sided, RecordBytes().version(1).multiMember("F").b8(false).acolor(0.25f).color(0.1f, 0.2f, 0.3f)
+                              .f32(0.5f).b8(true), false},
         // Two-sided 2: as 1, then transparency_tex, transparency, transparency_tex_mult. 3: as 2, then the base record.
         {kMaterial2Sided, RecordBytes().version(2).b8(false).b8(false).b8(false).color(0, 0, 0).f32(1).b8(false).acolor(0.75f)
                               .color(0.4f, 0.5f, 0.6f).f32(2), false},
-        {kMaterial2Sided, RecordBytes().version(3).b8(false).multiMember("B").acolor(0.2f).color(0, 0, 0).f32(1).b8(false).b8(false)
-                              .color(0, 0, 0).f32(1).base("Sheet", "uu"), true},
+        {kMaterial2Sided, RecordBytes().version(3).b8(false).multiMember("B").acolor(0.2f).color(0, 0, 0).f32(1)
+                              .b8(false).b8(false).color(0, 0, 0).f32(1).base("Sheet", "uu"), true},
         // Skp two-sided 1: base record, front, back, force_1sided.
         {kMaterialSkp2Sided, RecordBytes().version(1).base("Skp").multiMember("F").multiMember("K").b8(true), true},
         // Bump 1: name (empty: the default name), path of bump_tex, bump_tex_mult, base_mtl as tag and record.
@@ -73,9 +73,10 @@ const std::vector<Record>& records() {
         {kMaterialBump, RecordBytes().version(3).f32(2).acolor(0.6f).multi("Base").base("Wall", "u-3"), true},
         // Environment override 1: base record, base_mtl, the textures bg, gi, reflect, refract, then colours,
         // multipliers and switches in that order.
-        {kMaterialOverrideEnvironment, RecordBytes().version(1).base("Env").b8(true).layered("Base").acolor(0.1f).b8(false).acolor(0.3f)
-                                           .acolor(0.4f).color(1, 0, 0).color(0, 1, 0).color(0, 0, 1).color(1, 1, 0).f32(2).f32(3)
-                                           .f32(4).f32(5).b8(true).b8(false).b8(false).b8(true), true},
+        {kMaterialOverrideEnvironment, RecordBytes().version(1).base("Env").b8(true).layered("Base").acolor(0.1f)
+                                           .b8(false).acolor(0.3f).acolor(0.4f).color(1, 0, 0).color(0, 1, 0)
+                                           .color(0, 0, 1).color(1, 1, 0).f32(2).f32(3).f32(4).f32(5).b8(true).b8(false)
+                                           .b8(false).b8(true), true},
         // Displaced 1: base record, base_mtl, displace_tex, displace_tex_mult. 2: as 1, then displace_shift,
         // displace_edge_length, the four integers.
         {kMaterialDisplaced, RecordBytes().version(1).base("D1").b8(true).layered("Base").b8(false).f32(3), false},
@@ -85,11 +86,13 @@ const std::vector<Record>& records() {
         // 2, then short_circuit.
         {kMaterialObjectExclusion, RecordBytes().version(1).i32(1).multiMember("Base").u32(2).str("Chair").str("Table"), false},
         {kMaterialObjectExclusion, RecordBytes().version(2).i32(0).b8(false).u32(0).base("Ex2"), false},
-        {kMaterialObjectExclusion, RecordBytes().version(3).i32(7).multiMember("Base").u32(1).str("Lamp").base("Ex3").b8(false), true},
+        {kMaterialObjectExclusion, RecordBytes().version(3).i32(7).multiMember("Base").u32(1).str("Lamp").base("Ex3")
+                                       .b8(false), true},
         // Angle blend 1: base record, mtl_one, mtl_two, start_angle, stop_angle.
         {kMaterialAngleBlend, RecordBytes().version(1).base("Blend").b8(false).multiMember("Two").f32(10).f32(20), true},
         // Alpha contribution 1: base record, base_mtl, alpha_tex, alpha_tex_mult, alpha.
-        {kMaterialAlphaContribution, RecordBytes().version(1).base("Alpha").multiMember("Base").acolor(0.5f).f32(2).f32(0.25f), true},
+        {kMaterialAlphaContribution, RecordBytes().version(1).base("Alpha").multiMember("Base").acolor(0.5f).f32(2)
+                                         .f32(0.25f), true},
         {kMaterialToon, toonRecord(1), false}, {kMaterialToon, toonRecord(2), true},
         // Reference 1: base record, target_uuid. 2: as 1, then the embedded copy as an optional member.
         {kMaterialReference, RecordBytes().version(1).base("Ref", "own").str("target"), false},
@@ -104,12 +107,12 @@ const std::vector<Record>& records() {
 
 // The hand-laid record of class `tag` and `version`.
 const RecordBytes& recordOf(std::uint32_t tag, int version) {
-    for (const Record& r : records())
-        if (r.tag == tag && r.bytes.bytes()[2] == version) return r.bytes;
-    throw std::logic_error("no such record");
+    auto is = [=](const Record& r) { return r.tag == tag && r.bytes.bytes()[2] == version; };
+    return std::find_if(records().begin(), records().end(), is)->bytes;
 }
 
-std::string nameOf(const MaterialPtr& m) { return m ? wideToUtf8(m->name) : "<none>"; }
+std::string u8(const std::u16string& text) { return wideToUtf8(text); }
+std::string nameOf(const MaterialPtr& m) { return m ? u8(m->name) : "<none>"; }
 
 // The `skip`+1-th sample of class `type`.
 MaterialPtr sample(const std::vector<MaterialPtr>& all, std::uint32_t type, int skip = 0) {
@@ -121,16 +124,19 @@ MaterialPtr sample(const std::vector<MaterialPtr>& all, std::uint32_t type, int 
 // A comment line with what the XML doesn't show of a material.
 std::string hidden(const BaseMaterial& m) {
     std::ostringstream s;
-    s << "<!-- name " << wideToUtf8(m.name) << " uuid " << wideToUtf8(m.uuid);
+    s << "<!-- name " << u8(m.name) << " uuid " << u8(m.uuid);
     if (auto l = dynamic_cast<const Layered*>(&m))
-        s << " values " << l->layered_value_a << ' ' << l->layered_value_b << ' ' << l->layered_value_c << ' ' << l->layered_value_d;
+        s << " values " << l->layered_value_a << ' ' << l->layered_value_b << ' ' << l->layered_value_c << ' '
+          << l->layered_value_d;
     if (auto x = dynamic_cast<const MaterialSingleBRDF*>(&m))
-        s << " values " << x->single_value_a << ' ' << x->single_value_b << " layer " << (x->brdf ? wideToUtf8(x->brdf->name) : "<none>");
+        s << " values " << x->single_value_a << ' ' << x->single_value_b << " layer " << (x->brdf ? u8(x->brdf->name) : "-");
     if (auto x = dynamic_cast<const MaterialMulti*>(&m))
         for (const MaterialPtr& sub : x->materials) s << " sub " << nameOf(sub);
-    if (auto x = dynamic_cast<const MaterialReference*>(&m)) s << " target " << wideToUtf8(x->target_uuid) << " copy " << nameOf(x->target);
+    if (auto x = dynamic_cast<const MaterialReference*>(&m))
+        s << " target " << u8(x->target_uuid) << " copy " << nameOf(x->target);
     if (auto x = dynamic_cast<const MaterialLinked*>(&m))
-        s << " id " << x->id.kind << ' ' << wideToUtf8(x->id.getText()) << ' ' << x->id.getNumber() << " material " << nameOf(x->linked_material);
+        s << " id " << x->id.kind << ' ' << u8(x->id.getText()) << ' ' << x->id.getNumber() << " material "
+          << nameOf(x->linked_material);
     return s.str() + " -->\n";
 }
 
@@ -145,7 +151,6 @@ TEST_F(MaterialRecords, EveryVersionLoads) {
     expectGolden("material_records.xml", loadEach<MaterialPtr>(records(), createMaterial, show));
 }
 
-// The materials of the current records.
 std::vector<MaterialPtr> samples() {
     std::vector<MaterialPtr> all;
     for (const Record& r : records()) {
@@ -157,7 +162,7 @@ std::vector<MaterialPtr> samples() {
     return all;
 }
 
-TEST_F(MaterialRecords, BaseRecordNames) {
+TEST_F(MaterialRecords, NamesAndLoadsIntoUsedObjects) {
     const std::tuple<int, std::string, std::u16string> cases[] = {
         // Control characters removed, C1 controls too; an empty name takes the default, one of controls only
         // stays empty; version 1: name only.
@@ -182,25 +187,22 @@ TEST_F(MaterialRecords, BaseRecordNames) {
     QuickArchive ar = RecordBytes().version(2).u32(0).u32(0x20001).str("X").str("").archive();
     EXPECT_FALSE(m.load(ar));
     EXPECT_EQ(m.name, u"AB");
-}
-
-TEST_F(MaterialRecords, LoadsIntoUsedObjects) {
     // A layered material starts from its defaults, even for a refused tag.
-    Layered m;
-    m.brdfs.push_back(createBrdf(kGlassBrdf));
-    m.layered_value_b = 42, m.uuid = u"old";
+    Layered l;
+    l.brdfs.push_back(createBrdf(kGlassBrdf));
+    l.layered_value_b = 42, l.uuid = u"old";
     // Version 2: no layers, double_sided, layered_value_a, base record version 1 (name only).
-    QuickArchive ar = RecordBytes().version(2).u32(0).i32(0).i32(0).version(1).str("N").archive();
-    ASSERT_TRUE(m.load(ar));
-    EXPECT_EQ(std::make_tuple(m.brdfs.size(), m.layered_value_b, m.uuid), std::make_tuple(0u, 1, u""));
-    m.brdfs.push_back(createBrdf(kGlassBrdf));
+    QuickArchive v2 = RecordBytes().version(2).u32(0).i32(0).i32(0).version(1).str("N").archive();
+    ASSERT_TRUE(l.load(v2));
+    EXPECT_EQ(std::make_tuple(l.brdfs.size(), l.layered_value_b, l.uuid), std::make_tuple(0u, 1, u""));
+    l.brdfs.push_back(createBrdf(kGlassBrdf));
     QuickArchive bad = RecordBytes().version(5).archive();
-    EXPECT_FALSE(m.load(bad));
-    EXPECT_TRUE(m.brdfs.empty());
+    EXPECT_FALSE(l.load(bad));
+    EXPECT_TRUE(l.brdfs.empty());
     // Version 4 reads layered_value_d behind a base record of a refused version.
     QuickArchive d = RecordBytes().version(4).u32(0).i32(1).i32(0).i32(1).i32(1).version(3).i32(5).archive();
-    EXPECT_FALSE(m.load(d));
-    EXPECT_EQ(m.layered_value_d, 5);
+    EXPECT_FALSE(l.load(d));
+    EXPECT_EQ(l.layered_value_d, 5);
     // A multi material appends to its list.
     MaterialMulti multi;
     QuickArchive first = recordOf(kMaterialMulti, 1).archive(), again = recordOf(kMaterialMulti, 1).archive();
@@ -208,8 +210,8 @@ TEST_F(MaterialRecords, LoadsIntoUsedObjects) {
     EXPECT_EQ(multi.materials.size(), 2u);
     // A displaced material: version 1 over version 2 brings the later fields back to their defaults.
     const MaterialPtr displaced = createMaterial(kMaterialDisplaced);
-    QuickArchive v2 = recordOf(kMaterialDisplaced, 2).archive(), v1 = recordOf(kMaterialDisplaced, 1).archive();
-    ASSERT_TRUE(displaced->load(v2) && displaced->load(v1));
+    QuickArchive d2 = recordOf(kMaterialDisplaced, 2).archive(), d1 = recordOf(kMaterialDisplaced, 1).archive();
+    ASSERT_TRUE(displaced->load(d2) && displaced->load(d1));
     EXPECT_EQ(materialToXml(displaced), materialToXml(loaded<MaterialDisplaced>(recordOf(kMaterialDisplaced, 1))));
 }
 
@@ -251,7 +253,8 @@ TEST_F(MaterialRecords, FieldsTakePartInTheComparison) {
             else static_cast<MaterialMulti&>(*child).materials.push_back(layered(u"More"));
             EXPECT_FALSE(other->isEqual(m) || m->isEqual(other)) << nameOf(m) << " child " << i;
         }
-        EXPECT_FALSE(m->isEqual(MaterialPtr()) || m->isEqual(m->getType() == kMaterialMulti ? layered(u"L") : MaterialPtr(new MaterialMulti)));
+        const MaterialPtr otherClass = m->getType() == kMaterialMulti ? layered(u"L") : MaterialPtr(new MaterialMulti);
+        EXPECT_FALSE(m->isEqual(MaterialPtr()) || m->isEqual(otherClass));
     }
     // A number id ignores the text.
     MaterialLinked::IdData a, b;
@@ -277,15 +280,15 @@ TEST_F(MaterialRecords, CopiesAndResets) {
         EXPECT_EQ(std::make_tuple(dup->name == m->name, cl->name, dup->uuid + cl->uuid),
                   std::make_tuple(type == kMaterialInstance, m->name, u""));
         EXPECT_TRUE(type == kMaterialInstance || (dup->isEqual(m) && cl->isEqual(m)));
-        const std::vector<MaterialPtr> mine = childMaterials(*m), dupChildren = childMaterials(*dup), clChildren = childMaterials(*cl);
-        ASSERT_EQ(std::make_tuple(dupChildren.size(), clChildren.size()), std::make_tuple(mine.size(), mine.size()));
+        const std::vector<MaterialPtr> mine = childMaterials(*m), dupKids = childMaterials(*dup), clKids = childMaterials(*cl);
+        ASSERT_EQ(std::make_tuple(dupKids.size(), clKids.size()), std::make_tuple(mine.size(), mine.size()));
         for (std::size_t i = 0; i < mine.size(); ++i) {
             // A multi material's copies share its sub-materials; the other copies take their children's duplicate or
             // clone, a toon's clone its base material's duplicate.
             const bool shared = type == kMaterialMulti;
-            EXPECT_EQ(std::make_tuple(dupChildren[i] == mine[i], clChildren[i] == mine[i]), std::make_tuple(shared, shared));
-            EXPECT_EQ(dupChildren[i]->name == mine[i]->name, shared);
-            EXPECT_EQ(clChildren[i]->name == mine[i]->name, type != kMaterialToon);
+            EXPECT_EQ(std::make_tuple(dupKids[i] == mine[i], clKids[i] == mine[i]), std::make_tuple(shared, shared));
+            EXPECT_EQ(dupKids[i]->name == mine[i]->name, shared);
+            EXPECT_EQ(clKids[i]->name == mine[i]->name, type != kMaterialToon);
         }
     }
     // The layers are cloned; a single material shares its layer, an instance its material; two-sided copies share
@@ -311,8 +314,7 @@ TEST_F(MaterialRecords, CopiesAndResets) {
         m->name = u"Kept", m->uuid = u"kept-uuid";
         m->reset();
         const bool base = type == kMaterialBump || type == kMaterialLinked;
-        EXPECT_EQ(std::make_tuple(m->name, m->uuid), base ? std::make_tuple(std::u16string(u"DefaultMaterial"), std::u16string())
-                                                          : std::make_tuple(std::u16string(u"Kept"), std::u16string(u"kept-uuid"))) << type;
+        EXPECT_EQ(m->name + u"|" + m->uuid, base ? u"DefaultMaterial|" : u"Kept|kept-uuid") << type;
     }
 }
 
@@ -428,7 +430,8 @@ const std::vector<WrapperLayout>& layouts() {
         {kMaterialToon, true, [](B b) { b.version(2); },
          [](B b) {
              b.f32(1.5f).f32(1).b8(false).f32(1).f32(1).b8(false).f32(0).f32(1).b8(false);
-             b.color(0, 0, 0).f32(1).b8(false).f32(0.95f).f32(0.02f).f32(0.7f).f32(1).b8(true).b8(false).base("N").b8(false).f32(1.5f);
+             b.color(0, 0, 0).f32(1).b8(false).f32(0.95f).f32(0.02f).f32(0.7f).f32(1).b8(true).b8(false);
+             b.base("N").b8(false).f32(1.5f);
          }},
     };
     return all;

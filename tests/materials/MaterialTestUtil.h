@@ -174,7 +174,6 @@ inline TexturePtr acolor(float r, float g, float b, float a = 1) {
 }
 inline TexturePtr bitmap(const std::u16string& path) { return makeBitmapTextureFromPath(path); }
 
-// The XML of an object's own writeXml, as UTF-8.
 template <class T>
 std::string ownXml(T& object, const std::u16string& url = u"") {
     std::u16string out;
@@ -201,11 +200,10 @@ inline void expectGolden(const std::string& name, const std::string& actual) {
                   << "\n expected: " << lineAt(expected) << "\n actual:   " << lineAt(actual);
 }
 
-// Tests that use the scene table start and end with an empty one.
+// Tests that use the scene table start with an empty one.
 class TableTest : public ::testing::Test {
 protected:
     void SetUp() override { table().clear(); }
-    void TearDown() override { table().clear(); }
     static SceneMaterials& table() { return *SceneMaterials::instance(); }
 };
 
