@@ -5,10 +5,13 @@
 
 #include <algorithm>
 #include <initializer_list>
+#include <optional>
+#include <variant>
 #include <vector>
 
 #include <boost/any.hpp>
 
+#include "persistence/FieldRows.h"
 #include "persistence/QuickArchive.h"
 #include "persistence/Record.h"
 #include "platform/WideChar.h"
@@ -23,10 +26,7 @@ namespace {
 // ---- record rows -----------------------------------------------------------------
 
 enum class RowKind : std::uint8_t {
-    Color,          // `color`
-    Float,          // `f32`
-    Int,            // `i32`
-    Bool,           // `bool8`
+    Field,          // a plain field, in the encoding of its type
     Texture,        // optional texture member
     Path,           // `wstring` path of old records, made into a bitmap texture
     FresnelIor,     // `f32` index of refraction of the old Fresnel pair
@@ -35,22 +35,18 @@ enum class RowKind : std::uint8_t {
     BaseRecord      // the base record of Base_BRDF
 };
 
-// One field of a record. A row is made from a pointer to the field; the
-// kinds without a field of their own are made from the kind (and, for a
-// path, the texture it fills).
+// One field of a record. A row is made from a pointer to the field: a plain
+// field becomes a FieldRef, which reads, writes and compares it; the kinds
+// without a field of their own are made from the kind (and, for a path, the
+// texture it fills).
 template <class L>
 struct Row {
     RowKind kind;
-    Color L::*color = nullptr;
-    float L::*number = nullptr;
-    std::int32_t L::*integer = nullptr;
-    bool L::*flag = nullptr;
+    std::optional<FieldRef<L>> field;
     TexturePtr L::*texture = nullptr;
 
-    Row(Color L::*p) : kind(RowKind::Color), color(p) {}
-    Row(float L::*p) : kind(RowKind::Float), number(p) {}
-    Row(std::int32_t L::*p) : kind(RowKind::Int), integer(p) {}
-    Row(bool L::*p) : kind(RowKind::Bool), flag(p) {}
+    template <class T>
+    Row(T L::*p) : kind(RowKind::Field), field(FieldRef<L>(p)) {}
     Row(TexturePtr L::*p) : kind(RowKind::Texture), texture(p) {}
     Row(RowKind k, TexturePtr L::*p = nullptr) : kind(k), texture(p) {}
 };
@@ -72,21 +68,30 @@ Row<L> path(TexturePtr L::*texture) { return Row<L>(RowKind::Path, texture); }
 
 // ---- XML parameters --------------------------------------------------------------
 
-enum class Form : std::uint8_t {
-    Color,
-    ColorFromReflection,  // 1 - reflection per component, 0 where negative
-    Float,
-    Integer,
-    Bool,
-    BoolFromInt,  // an integer field tested against 0
-    Plugin        // a texture, referred to by its slot url
+// 1 - reflection per component, 0 where negative.
+template <class L>
+struct FromReflection {
+    Color L::*reflection;
+};
+
+// An integer field tested against 0.
+template <class L>
+struct BoolFromInt {
+    std::int32_t L::*integer;
 };
 
 template <class L>
+FromReflection<L> fromReflection(Color L::*p) { return {p}; }
+
+template <class L>
+BoolFromInt<L> boolFromInt(std::int32_t L::*p) { return {p}; }
+
+// A parameter: a plain field in the form of its type, a texture referred to
+// by its slot url, or one of the two derived forms.
+template <class L>
 struct Param {
     const char* name;
-    Form form;
-    Row<L> field;
+    std::variant<FieldRef<L>, TexturePtr L::*, FromReflection<L>, BoolFromInt<L>> field;
 };
 
 // A texture slot: the field and the word of its url.
@@ -124,10 +129,7 @@ bool saveRows(const L& layer, QuickArchive& ar, const LayerTable<L>& table) {
     writeVersion(ar, table.currentVersion);
     for (const Row<L>& row : table.records[table.currentVersion]) {
         switch (row.kind) {
-        case RowKind::Color: ar.writeColor(layer.*row.color); break;
-        case RowKind::Float: ar.writeFloat(layer.*row.number); break;
-        case RowKind::Int: ar.writeInt(layer.*row.integer); break;
-        case RowKind::Bool: ar.writeByte(layer.*row.flag); break;
+        case RowKind::Field: row.field->write(ar, layer); break;
         case RowKind::Texture:
             if (!saveOptionalMember(ar, layer.*row.texture)) return false;
             break;
@@ -152,10 +154,7 @@ bool loadRows(L& layer, QuickArchive& ar, const LayerTable<L>& table, bool empty
     FresnelPair fresnel;
     for (const Row<L>& row : table.records[version]) {
         switch (row.kind) {
-        case RowKind::Color: ar.readColor(layer.*row.color); break;
-        case RowKind::Float: ar.readFloat(layer.*row.number); break;
-        case RowKind::Int: ar.readInt(layer.*row.integer); break;
-        case RowKind::Bool: ar.readByte(layer.*row.flag); break;
+        case RowKind::Field: row.field->read(ar, layer); break;
         case RowKind::Texture:
             if (!loadOptionalMember(ar, layer.*row.texture, &createTexture)) return false;
             break;
@@ -188,10 +187,7 @@ bool fieldsEqual(const L& a, const BrdfPtr& other, const LayerTable<L>& table) {
     for (const Row<L>& row : table.records[table.currentVersion]) {
         bool same = true;
         switch (row.kind) {
-        case RowKind::Color: same = a.*row.color == b->*row.color; break;
-        case RowKind::Float: same = a.*row.number == b->*row.number; break;
-        case RowKind::Int: same = a.*row.integer == b->*row.integer; break;
-        case RowKind::Bool: same = a.*row.flag == b->*row.flag; break;
+        case RowKind::Field: same = row.field->equal(a, *b); break;
         case RowKind::Texture: same = childrenEqual(a.*row.texture, b->*row.texture); break;
         default: break;
         }
@@ -232,20 +228,14 @@ void writeLayer(const L& layer, AssetXmlWriter& writer, std::u16string url,
     writer.openPlugin(layer.getPluginName(), layer.getAssetType());
     writer.openParameters();
     for (const Param<L>& p : table.params) {
-        const Row<L>& f = p.field;
-        switch (p.form) {
-        case Form::Color: writer.writeColor(p.name, layer.*f.color); break;
-        case Form::ColorFromReflection:
-            writer.writeColor(p.name, colorFromReflection(layer.*f.color));
-            break;
-        case Form::Float: writer.writeFloat(p.name, layer.*f.number); break;
-        case Form::Integer: writer.writeInteger(p.name, layer.*f.integer); break;
-        case Form::Bool: writer.writeBool(p.name, layer.*f.flag); break;
-        case Form::BoolFromInt: writer.writeBool(p.name, layer.*f.integer != 0); break;
-        case Form::Plugin:
-            writer.writePluginRef(p.name, boost::any(layer.*f.texture),
-                                  slotPrefix + slotWord(f.texture, table));
-            break;
+        if (auto f = std::get_if<FieldRef<L>>(&p.field)) {
+            f->writeParam(writer, p.name, "", false, layer);
+        } else if (auto t = std::get_if<TexturePtr L::*>(&p.field)) {
+            writer.writePluginRef(p.name, boost::any(layer.**t), slotPrefix + slotWord(*t, table));
+        } else if (auto r = std::get_if<FromReflection<L>>(&p.field)) {
+            writer.writeColor(p.name, colorFromReflection(layer.*r->reflection));
+        } else if (auto i = std::get_if<BoolFromInt<L>>(&p.field)) {
+            writer.writeBool(p.name, layer.*i->integer != 0);
         }
     }
     writer.closeParameters();
@@ -303,31 +293,31 @@ const LayerTable<Glass_BRDF>& glassTable() {
             {&G::translucency_tex, u"translucency_texture"},
         };
         s.params = {
-            {"color", Form::Color, &G::color},
-            {"transparency", Form::Color, &G::transparency},
-            {"fog_color", Form::Color, &G::fog_color},
-            {"translucency", Form::Color, &G::translucency},
-            {"affect_shadows", Form::BoolFromInt, &G::affect_shadows},
-            {"affect_alpha", Form::BoolFromInt, &G::affect_alpha},
-            {"translucency_on", Form::BoolFromInt, &G::translucency_on},
-            {"ior", Form::Float, &G::ior},
-            {"fog_color_mult", Form::Float, &G::fog_color_mult},
-            {"glossiness", Form::Float, &G::glossiness},
-            {"glossiness_tex_mult", Form::Float, &G::glossiness_tex_mult},
-            {"ior_tex_mult", Form::Float, &G::ior_tex_mult},
-            {"translucency_tex_mult", Form::Float, &G::translucency_tex_mult},
-            {"scatter_coeff", Form::Float, &G::scatter_coeff},
-            {"scatter_direction", Form::Float, &G::scatter_direction},
-            {"thickness", Form::Float, &G::thickness},
-            {"transparency_tex_mult", Form::Float, &G::transparency_tex_mult},
-            {"cutoff", Form::Float, &G::cutoff},
-            {"color_tex_mult", Form::Float, &G::color_tex_mult},
-            {"subdivs", Form::Integer, &G::subdivs},
-            {"transparency_tex", Form::Plugin, &G::transparency_tex},
-            {"color_tex", Form::Plugin, &G::color_tex},
-            {"glossiness_tex", Form::Plugin, &G::glossiness_tex},
-            {"ior_texture", Form::Plugin, &G::ior_tex},
-            {"translucency_tex", Form::Plugin, &G::translucency_tex},
+            {"color", &G::color},
+            {"transparency", &G::transparency},
+            {"fog_color", &G::fog_color},
+            {"translucency", &G::translucency},
+            {"affect_shadows", boolFromInt(&G::affect_shadows)},
+            {"affect_alpha", boolFromInt(&G::affect_alpha)},
+            {"translucency_on", boolFromInt(&G::translucency_on)},
+            {"ior", &G::ior},
+            {"fog_color_mult", &G::fog_color_mult},
+            {"glossiness", &G::glossiness},
+            {"glossiness_tex_mult", &G::glossiness_tex_mult},
+            {"ior_tex_mult", &G::ior_tex_mult},
+            {"translucency_tex_mult", &G::translucency_tex_mult},
+            {"scatter_coeff", &G::scatter_coeff},
+            {"scatter_direction", &G::scatter_direction},
+            {"thickness", &G::thickness},
+            {"transparency_tex_mult", &G::transparency_tex_mult},
+            {"cutoff", &G::cutoff},
+            {"color_tex_mult", &G::color_tex_mult},
+            {"subdivs", &G::subdivs},
+            {"transparency_tex", &G::transparency_tex},
+            {"color_tex", &G::color_tex},
+            {"glossiness_tex", &G::glossiness_tex},
+            {"ior_texture", &G::ior_tex},
+            {"translucency_tex", &G::translucency_tex},
         };
         s.fresnelTarget = &G::transparency_tex;
         return s;
@@ -378,23 +368,23 @@ const LayerTable<BaseGlossy_BRDF>& glossyTable() {
             {&P::transparency_tex, u"transparency_texture"},
         };
         s.params = {
-            {"color", Form::Color, &P::color},
-            {"transparency", Form::ColorFromReflection, &P::reflection},
-            {"hilightGlossiness", Form::Float, &P::hilightGlossiness},
-            {"reflectionGlossiness", Form::Float, &P::reflectionGlossiness},
-            {"cutoff", Form::Float, &P::cutoff},
-            {"subdivs", Form::Integer, &P::subdivs},
-            {"back_side", Form::Integer, &P::back_side},
-            {"color_tex_mult", Form::Float, &P::color_tex_mult},
-            {"hilightGlossiness_tex_mult", Form::Float, &P::hilightGlossiness_tex_mult},
-            {"reflectionGlossiness_tex_mult", Form::Float, &P::reflectionGlossiness_tex_mult},
-            {"transparency_tex_mult", Form::Float, &P::transparency_tex_mult},
-            {"anisotropy", Form::Float, &P::anisotropy},
-            {"anisotropy_rotation", Form::Float, &P::anisotropy_rotation},
-            {"color_tex", Form::Plugin, &P::color_tex},
-            {"hilightGlossiness_tex", Form::Plugin, &P::hilightGlossiness_tex},
-            {"reflectionGlossiness_tex", Form::Plugin, &P::reflectionGlossiness_tex},
-            {"transparency_tex", Form::Plugin, &P::transparency_tex},
+            {"color", &P::color},
+            {"transparency", fromReflection(&P::reflection)},
+            {"hilightGlossiness", &P::hilightGlossiness},
+            {"reflectionGlossiness", &P::reflectionGlossiness},
+            {"cutoff", &P::cutoff},
+            {"subdivs", &P::subdivs},
+            {"back_side", &P::back_side},
+            {"color_tex_mult", &P::color_tex_mult},
+            {"hilightGlossiness_tex_mult", &P::hilightGlossiness_tex_mult},
+            {"reflectionGlossiness_tex_mult", &P::reflectionGlossiness_tex_mult},
+            {"transparency_tex_mult", &P::transparency_tex_mult},
+            {"anisotropy", &P::anisotropy},
+            {"anisotropy_rotation", &P::anisotropy_rotation},
+            {"color_tex", &P::color_tex},
+            {"hilightGlossiness_tex", &P::hilightGlossiness_tex},
+            {"reflectionGlossiness_tex", &P::reflectionGlossiness_tex},
+            {"transparency_tex", &P::transparency_tex},
         };
         s.fresnelTarget = &P::transparency_tex;
         return s;
@@ -429,13 +419,13 @@ const LayerTable<Mirror_BRDF>& mirrorTable() {
             {&M::color_tex, u"color_texture"},
         };
         s.params = {
-            {"color", Form::Color, &M::color},
-            {"transparency", Form::ColorFromReflection, &M::reflection},
-            {"color_tex_mult", Form::Float, &M::color_tex_mult},
-            {"transparency_tex_mult", Form::Float, &M::transparency_tex_mult},
-            {"cutoff", Form::Float, &M::cutoff},
-            {"transparency_tex", Form::Plugin, &M::transparency_tex},
-            {"color_tex", Form::Plugin, &M::color_tex},
+            {"color", &M::color},
+            {"transparency", fromReflection(&M::reflection)},
+            {"color_tex_mult", &M::color_tex_mult},
+            {"transparency_tex_mult", &M::transparency_tex_mult},
+            {"cutoff", &M::cutoff},
+            {"transparency_tex", &M::transparency_tex},
+            {"color_tex", &M::color_tex},
         };
         s.fresnelTarget = &M::transparency_tex;
         return s;
@@ -466,14 +456,13 @@ const LayerTable<Diffuse_BRDF>& diffuseTable() {
             {&D::transparency_tex, u"transparency_texture"},
         };
         s.params = {
-            {"color", Form::Color, &D::color},
-            {"transparency", Form::Color, &D::transparency},
-            {"color_tex_mult", Form::Float, &D::color_tex_mult},
-            {"transparency_tex_mult", Form::Float, &D::transparency_tex_mult},
-            {"color_tex", Form::Plugin, &D::color_tex},
-            {"transparency_tex", Form::Plugin, &D::transparency_tex},
-            {"use_color_tex_alpha_as_transparency", Form::Bool,
-             &D::use_color_tex_alpha_as_transparency},
+            {"color", &D::color},
+            {"transparency", &D::transparency},
+            {"color_tex_mult", &D::color_tex_mult},
+            {"transparency_tex_mult", &D::transparency_tex_mult},
+            {"color_tex", &D::color_tex},
+            {"transparency_tex", &D::transparency_tex},
+            {"use_color_tex_alpha_as_transparency", &D::use_color_tex_alpha_as_transparency},
         };
         s.fresnelTarget = &D::transparency_tex;
         return s;
@@ -505,14 +494,14 @@ const LayerTable<Light_BRDF>& lightTable() {
             {&E::transparency_tex, u"transp_texture"},
         };
         s.params = {
-            {"color", Form::Color, &E::color},
-            {"transparency", Form::Color, &E::transparency},
-            {"intensity", Form::Float, &E::intensity},
-            {"transparency_tex_mult", Form::Float, &E::transparency_tex_mult},
-            {"color_tex_mult", Form::Float, &E::color_tex_mult},
-            {"doubleSided", Form::BoolFromInt, &E::doubleSided},
-            {"color_tex", Form::Plugin, &E::color_tex},
-            {"transparency_tex", Form::Plugin, &E::transparency_tex},
+            {"color", &E::color},
+            {"transparency", &E::transparency},
+            {"intensity", &E::intensity},
+            {"transparency_tex_mult", &E::transparency_tex_mult},
+            {"color_tex_mult", &E::color_tex_mult},
+            {"doubleSided", boolFromInt(&E::doubleSided)},
+            {"color_tex", &E::color_tex},
+            {"transparency_tex", &E::transparency_tex},
         };
         s.fresnelTarget = &E::transparency_tex;
         return s;
