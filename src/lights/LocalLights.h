@@ -34,7 +34,33 @@ public:
     bool shadows = true;
 };
 
-class OmniLight : public LightOf<OmniLight, 2> {
+// Fields that the omni, spot and rectangle lights share, with the same
+// defaults in all three.
+struct PlacedLightFields {
+    Color color{1, 1, 1};
+    Color shadowColor{0, 0, 0};
+    Transform transform;
+    float shadowBias = 0.0f;
+    float cutoffThreshold = 0.005f;
+    float storedFactor = 1.0f;
+    std::int32_t units = 0;
+    std::int32_t photonSubdivs = 500;
+    std::int32_t causticSubdivs = 1000;
+    std::int32_t storedMode = 3;
+    bool enabled = true;
+    bool shadows = true;
+    bool affectDiffuse = true;
+    bool affectSpecular = true;
+};
+
+// The further fields of the omni and spot lights.
+struct PointLightFields : PlacedLightFields {
+    float shadowRadius = 0.0f;
+    float decay = 0.0f;
+    std::int32_t shadowSubdivs = 8;
+};
+
+class OmniLight : public LightOf<OmniLight, 2>, public PointLightFields {
 public:
     bool save(QuickArchive& ar) const override;
     bool load(QuickArchive& ar) override;
@@ -42,27 +68,10 @@ public:
     void writeXml(AssetXmlWriter& writer, std::u16string url) override;
     std::u16string getPluginName() const override { return u"LightOmni"; }
 
-    Color color{1, 1, 1};
-    Color shadowColor{0, 0, 0};
-    Transform transform;
     float intensity = 30.0f;
-    float shadowBias = 0.0f;
-    float shadowRadius = 0.0f;
-    float cutoffThreshold = 0.005f;
-    float decay = 0.0f;
-    float storedFactor = 1.0f;
-    std::int32_t units = 0;
-    std::int32_t photonSubdivs = 500;
-    std::int32_t causticSubdivs = 1000;
-    std::int32_t shadowSubdivs = 8;
-    std::int32_t storedMode = 3;
-    bool enabled = true;
-    bool shadows = true;
-    bool affectDiffuse = true;
-    bool affectSpecular = true;
 };
 
-class SpotLight : public LightOf<SpotLight, 4> {
+class SpotLight : public LightOf<SpotLight, 4>, public PointLightFields {
 public:
     bool save(QuickArchive& ar) const override;
     bool load(QuickArchive& ar) override;
@@ -70,34 +79,17 @@ public:
     void writeXml(AssetXmlWriter& writer, std::u16string url) override;
     std::u16string getPluginName() const override { return u"LightSpot"; }
 
-    Color color{1, 1, 1};
-    Color shadowColor{0, 0, 0};
-    Transform transform;
     float intensity = 50.0f;
-    float shadowBias = 0.0f;
-    float shadowRadius = 0.0f;
-    float cutoffThreshold = 0.005f;
-    float decay = 0.0f;
-    float storedFactor = 1.0f;
     float barnDoorLeft = 20.0f;
     float barnDoorRight = 20.0f;
     float barnDoorTop = 20.0f;
     float barnDoorBottom = 20.0f;
     float coneAngle = 1.0f;
     float penumbraAngle = 0.0f;
-    std::int32_t units = 0;
-    std::int32_t photonSubdivs = 500;
-    std::int32_t causticSubdivs = 1000;
-    std::int32_t shadowSubdivs = 8;
-    std::int32_t storedMode = 3;
-    bool enabled = true;
-    bool shadows = true;
-    bool affectDiffuse = true;
-    bool affectSpecular = true;
     bool barnDoor = false;
 };
 
-class RectangleLight : public LightOf<RectangleLight, 3> {
+class RectangleLight : public LightOf<RectangleLight, 3>, public PlacedLightFields {
 public:
     bool save(QuickArchive& ar) const override;
     bool load(QuickArchive& ar) override;
@@ -105,24 +97,10 @@ public:
     void writeXml(AssetXmlWriter& writer, std::u16string url) override;
     std::u16string getPluginName() const override { return u"LightRectangle"; }
 
-    Color color{1, 1, 1};
-    Color shadowColor{0, 0, 0};
-    Transform transform;
     float intensity = 30.0f;
-    float shadowBias = 0.0f;
-    float cutoffThreshold = 0.005f;
-    float storedFactor = 1.0f;
     float u_size = 1.0f;
     float v_size = 1.0f;
-    std::int32_t units = 0;
-    std::int32_t photonSubdivs = 500;
-    std::int32_t causticSubdivs = 1000;
     std::int32_t subdivs = 8;
-    std::int32_t storedMode = 3;
-    bool enabled = true;
-    bool shadows = true;
-    bool affectDiffuse = true;
-    bool affectSpecular = true;
     bool doubleSided = false;
     bool invisible = false;
     bool lightPortal = false;
