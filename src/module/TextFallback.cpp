@@ -1,7 +1,7 @@
 #include "module/TextFallback.h"
 
-#include <fstream>
-#include <vector>
+#include <cstring>
+#include <string>
 
 #include "persistence/QuickArchive.h"
 #include "platform/File.h"
@@ -9,17 +9,20 @@
 namespace OrvaneLumoCore {
 
 std::u16string readFileAsText(const std::u16string& path) {
-    std::ifstream file;
-    platform::openForReading(file, path);
-    if (!file.is_open()) return std::u16string();
-    file.seekg(0, std::ios::end);
-    const std::streamoff size = file.tellg();
-    file.seekg(0, std::ios::beg);
-    if (size <= 0) return std::u16string();
-    std::vector<char> buffer(static_cast<std::size_t>(size));
-    file.read(buffer.data(), size);
-    // utf8ToWide ends the text at the first zero byte.
-    return utf8ToWide(buffer.data(), static_cast<std::size_t>(file.gcount()));
+    platform::RegularFile file;
+    if (!file.open(path)) return std::u16string();
+    // The text ends at the first zero byte: read in chunks up to it and no
+    // further, so a large file costs what its text holds.
+    constexpr std::size_t kChunk = 64 * 1024;
+    std::string text;
+    for (std::uint64_t offset = 0;; offset += kChunk) {
+        const std::size_t start = text.size();
+        text.resize(start + kChunk);
+        const std::size_t got = file.readAt(offset, &text[start], kChunk);
+        text.resize(start + got);
+        if (std::memchr(text.data() + start, 0, got) || got < kChunk) break;
+    }
+    return utf8ToWide(text);
 }
 
 }  // namespace OrvaneLumoCore

@@ -1,10 +1,14 @@
 #include "persistence/OrvMatFile.h"
 
+#include <algorithm>
 #include <cstdint>
-#include <fstream>
+#include <cstring>
 #include <istream>
+#include <iterator>
+#include <memory>
 #include <ostream>
 
+#include "persistence/FileBlocks.h"
 #include "persistence/QuickArchive.h"
 #include "platform/File.h"
 
@@ -12,65 +16,126 @@ namespace OrvaneLumoCore {
 
 namespace {
 
-// Versions 1 and 2: the stream is everything behind the header.
-std::string readRest(std::istream& in) {
-    const std::streampos start = in.tellg();
-    in.seekg(0, std::ios::end);
-    const std::streampos end = in.tellg();
-    in.seekg(start);
-    std::string body;
-    if (start < 0 || end <= start) return body;
-    body.resize(static_cast<std::size_t>(end - start));
-    in.read(&body[0], static_cast<std::streamsize>(body.size()));
-    body.resize(static_cast<std::size_t>(in.gcount()));
-    return body;
+constexpr std::size_t kBlockSize = QuickArchive::kBlockSize;
+
+// Turns each CR LF pair of raw[0, size) into LF, from left to right, writing
+// at most `room` bytes to `out`. With `more`, raw bytes follow `size`, and a
+// CR at the end waits for them. Sets `used` to the raw bytes taken; returns
+// the bytes written.
+std::size_t undoTextModeStep(const char* raw, std::size_t size, bool more, char* out,
+                             std::size_t room, std::size_t& used) {
+    std::size_t i = 0;
+    std::size_t o = 0;
+    while (i < size && o < room) {
+        if (raw[i] == '\r') {
+            if (i + 1 == size && more) break;
+            if (i + 1 < size && raw[i + 1] == '\n') {
+                out[o++] = '\n';
+                i += 2;
+                continue;
+            }
+        }
+        out[o++] = raw[i++];
+    }
+    used = i;
+    return o;
 }
+
+// The body of a version 1 file, bytes [begin, end) of the file, with the CR
+// LF pairs undone, as blocks. One pass over the body finds its length and
+// where in the file each block starts; a block is converted again when a
+// read reaches it.
+class TextModeBlocks : public QuickArchive::BlockSource {
+public:
+    TextModeBlocks(const platform::ByteSource& bytes, std::uint64_t begin, std::uint64_t end)
+        : bytes_(bytes), end_(end) {
+        std::unique_ptr<char[]> block(new char[kBlockSize]);
+        for (std::uint64_t raw = begin; raw < end_;) {
+            std::size_t produced = 0;
+            const std::uint64_t next = convert(raw, block.get(), produced);
+            if (produced == 0) break;
+            starts_.push_back(raw);
+            raw = next;
+        }
+    }
+
+    std::uint64_t blockCount() const override { return starts_.size(); }
+
+    void fill(std::uint64_t index, char* block) const override {
+        std::size_t produced = 0;
+        convert(starts_[index], block, produced);
+        std::memset(block + produced, 0, kBlockSize - produced);
+    }
+
+private:
+    // Converts from file offset `raw` until the block is full or the body
+    // ends; returns the offset reached.
+    std::uint64_t convert(std::uint64_t raw, char* block, std::size_t& produced) const {
+        char buffer[kBlockSize + 1];
+        produced = 0;
+        while (produced < kBlockSize && raw < end_) {
+            const std::size_t want =
+                static_cast<std::size_t>(std::min<std::uint64_t>(sizeof buffer, end_ - raw));
+            const std::size_t got = bytes_.readAt(raw, buffer, want);
+            std::size_t used = 0;
+            produced += undoTextModeStep(buffer, got, raw + got < end_, block + produced,
+                                         kBlockSize - produced, used);
+            if (used == 0) break;
+            raw += used;
+        }
+        return raw;
+    }
+
+    const platform::ByteSource& bytes_;
+    std::uint64_t end_;
+    std::vector<std::uint64_t> starts_;
+};
 
 }  // namespace
 
 // Version 1 files went through a text-mode write: each CR LF pair becomes LF,
 // in one pass from left to right (CR CR LF turns into CR LF).
 std::string undoTextMode(const std::string& body) {
-    std::string out;
-    out.reserve(body.size());
-    for (std::size_t i = 0; i < body.size(); ++i) {
-        if (body[i] == '\r' && i + 1 < body.size() && body[i + 1] == '\n') {
-            out.push_back('\n');
-            ++i;
-        } else {
-            out.push_back(body[i]);
-        }
-    }
+    std::string out(body.size(), '\0');
+    std::size_t used = 0;
+    out.resize(undoTextModeStep(body.data(), body.size(), false, &out[0], out.size(), used));
     return out;
 }
 
-bool OrvMatFile::load(std::istream& in) {
+bool OrvMatFile::load(const platform::ByteSource& bytes) {
     std::uint32_t header[2] = {0, 0};
-    in.read(reinterpret_cast<char*>(header), 8);
-    if (in.gcount() != 8) return false;
+    if (bytes.readAt(0, header, 8) != 8) return false;
     const std::uint32_t tag = header[0];
     const std::uint32_t count = header[1];
     if (count == 0) return false;
     if ((tag & 0xFFFF) != 0) return false;
 
-    QuickArchive ar(static_cast<std::size_t>(1));
+    // The material stream behind the header, read block by block as the
+    // materials reach it.
+    const std::uint64_t size = std::max<std::uint64_t>(bytes.size(), 8);
+    std::unique_ptr<QuickArchive::BlockSource> stream;
     switch (tag >> 16) {
-        case 3:
-            if (!ar.loadBlocks(in)) return false;
-            break;
-        case 2: {
-            const std::string body = readRest(in);
-            ar = QuickArchive(body.data(), body.size());
-            break;
-        }
-        case 1: {
-            const std::string body = undoTextMode(readRest(in));
-            ar = QuickArchive(body.data(), body.size());
+        case 3: {
+            // A block count and the blocks. A file that ends early ends the
+            // list with the block it ends in, short or empty, zero-padded.
+            std::uint32_t blockCount = 0;
+            if (bytes.readAt(8, &blockCount, 4) != 4 || blockCount == 0) return false;
+            const std::uint64_t body = size > 12 ? size - 12 : 0;
+            stream.reset(new RangeBlocks(bytes, 12, body,
+                                         std::min<std::uint64_t>(blockCount, body / kBlockSize + 1)));
             break;
         }
+        case 2:
+            // Everything behind the header.
+            stream.reset(new RangeBlocks(bytes, 8, size - 8, RangeBlocks::blocksFor(size - 8)));
+            break;
+        case 1:
+            stream.reset(new TextModeBlocks(bytes, 8, size));
+            break;
         default:
             return false;
     }
+    QuickArchive ar(*stream);
 
     // Every material takes at least its four-byte tag: a larger count can't
     // be real.
@@ -88,6 +153,15 @@ bool OrvMatFile::load(std::istream& in) {
     return true;
 }
 
+bool OrvMatFile::load(const void* data, std::size_t size) {
+    return load(platform::MemoryBytes(data, size));
+}
+
+bool OrvMatFile::load(std::istream& in) {
+    const std::string bytes((std::istreambuf_iterator<char>(in)), std::istreambuf_iterator<char>());
+    return load(bytes.data(), bytes.size());
+}
+
 bool OrvMatFile::save(std::ostream& out) {
     if (materials.empty()) return false;
     QuickArchive ar(static_cast<std::size_t>(1));
@@ -102,10 +176,8 @@ bool OrvMatFile::save(std::ostream& out) {
 }
 
 bool OrvMatFile::load(const std::u16string& path) {
-    std::ifstream file;
-    platform::openForReading(file, path);
-    if (!file.is_open()) return false;
-    return load(static_cast<std::istream&>(file));
+    platform::RegularFile file;
+    return file.open(path) && load(file);
 }
 
 bool OrvMatFile::save(const std::u16string& path) {

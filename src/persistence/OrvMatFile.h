@@ -9,6 +9,10 @@
 
 #include "materials/BaseMaterial.h"
 
+namespace platform {
+class ByteSource;
+}
+
 namespace OrvaneLumoCore {
 
 // The body of a version 1 file with each CR LF pair turned back into LF.
@@ -20,7 +24,12 @@ public:
     virtual ~OrvMatFile() = default;
 
     virtual bool save(std::ostream& out);
+    // Loads the bytes from the stream's position to its end.
     virtual bool load(std::istream& in);
+    // The header is read first; the material stream's blocks are read as the
+    // materials reach them.
+    bool load(const platform::ByteSource& bytes);
+    bool load(const void* data, std::size_t size);
 
     bool load(const std::u16string& path);
     bool save(const std::u16string& path);

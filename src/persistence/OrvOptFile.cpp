@@ -1,26 +1,25 @@
 #include "persistence/OrvOptFile.h"
 
 #include <fstream>
-#include <vector>
 
 #include "options/AllOptions.h"
+#include "persistence/FileBlocks.h"
 #include "persistence/QuickArchive.h"
 #include "platform/File.h"
 
 namespace OrvaneLumoCore {
 
 bool OrvOptFile::load(AllOptions& options, const std::u16string& path) {
-    std::ifstream file;
-    platform::openForReading(file, path);
-    if (!file.is_open()) return false;
-    file.seekg(0, std::ios::end);
-    const std::streamoff size = file.tellg();
-    file.seekg(0, std::ios::beg);
-    if (size < 1) return false;
-    std::vector<char> buffer(static_cast<std::size_t>(size));
-    file.read(buffer.data(), size);
-    if (file.gcount() != size) return false;
-    QuickArchive ar(buffer.data(), buffer.size());
+    platform::RegularFile file;
+    return file.open(path) && load(options, file);
+}
+
+bool OrvOptFile::load(AllOptions& options, const platform::ByteSource& bytes) {
+    if (bytes.size() < 1) return false;
+    // The whole file is the archive; its blocks are read as the record
+    // reaches them.
+    const RangeBlocks blocks(bytes, 0, bytes.size(), RangeBlocks::blocksFor(bytes.size()));
+    QuickArchive ar(blocks);
     return options.load(ar);
 }
 

@@ -3,6 +3,10 @@
 // no header of its own.
 #include <string>
 
+namespace platform {
+class ByteSource;
+}
+
 namespace OrvaneLumoCore {
 
 class AllOptions;
@@ -14,8 +18,10 @@ public:
 
     // Writes the record in whole blocks of 4096 bytes.
     virtual bool save(AllOptions& options, const std::u16string& path);
-    // Reads a file of any size of at least one byte.
+    // Reads a file of any size of at least one byte, block by block as the
+    // record reaches them.
     virtual bool load(AllOptions& options, const std::u16string& path);
+    bool load(AllOptions& options, const platform::ByteSource& bytes);
 
     // The file at `path` as an "orvopt" document, or, if it doesn't load,
     // its text; the empty string if it can't be opened.

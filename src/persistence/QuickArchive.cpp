@@ -40,6 +40,8 @@ QuickArchive::QuickArchive(const void* data, std::size_t size) {
     writeFrom(data, size);
 }
 
+QuickArchive::QuickArchive(const BlockSource& source) : source(&source) {}
+
 QuickArchive::~QuickArchive() = default;
 
 void QuickArchive::appendBlock() {
@@ -51,6 +53,7 @@ void QuickArchive::appendBlock() {
 // ---- byte movement ---------------------------------------------------------
 
 void QuickArchive::writeFrom(const void* src, std::size_t n) {
+    if (source) return;
     const char* p = static_cast<const char*>(src);
     while (n > 0) {
         const std::uint64_t index = writePosition >> 12;
@@ -64,14 +67,28 @@ void QuickArchive::writeFrom(const void* src, std::size_t n) {
     }
 }
 
+const char* QuickArchive::blockData(std::uint64_t index) {
+    if (!source) return index < blocks.size() ? blocks[index]->data() : nullptr;
+    if (lastPulled && lastPulledIndex == index) return lastPulled;
+    if (index >= source->blockCount()) return nullptr;
+    boost::shared_ptr<Block>& block = pulled[index];
+    if (!block) {
+        block.reset(new Block);
+        source->fill(index, block->data());
+    }
+    lastPulledIndex = index;
+    lastPulled = block->data();
+    return lastPulled;
+}
+
 void QuickArchive::readInto(void* dst, std::size_t n) {
     char* p = static_cast<char*>(dst);
     while (n > 0) {
         const std::uint64_t index = readPosition >> 12;
         const std::size_t offset = static_cast<std::size_t>(readPosition & 0xFFF);
         const std::size_t chunk = std::min(n, kBlockSize - offset);
-        if (index < blocks.size()) {
-            std::memcpy(p, blocks[index]->data() + offset, chunk);
+        if (const char* block = blockData(index)) {
+            std::memcpy(p, block + offset, chunk);
         } else {
             // Behind the last block: the cursor moves on, the destination
             // keeps what it held.
@@ -91,7 +108,7 @@ static_assert(sizeof(float) == 4 && sizeof(double) == 8, "IEEE 754 types expecte
 void QuickArchive::writeByte(std::uint8_t b) { writeFrom(&b, 1); }
 
 bool QuickArchive::readByte(std::uint8_t& b) {
-    const bool exists = (readPosition >> 12) < blocks.size();
+    const bool exists = (readPosition >> 12) < blockTotal();
     readInto(&b, 1);
     return exists;
 }
@@ -223,6 +240,9 @@ void QuickArchive::getRaw(void* buffer, std::size_t length) { readInto(buffer, l
 
 void QuickArchive::clear() {
     blocks.clear();
+    source = nullptr;
+    pulled.clear();
+    lastPulled = nullptr;
     readPosition = 0;
     writePosition = 0;
 }

@@ -4,9 +4,14 @@
 // every reader and writer goes byte by byte, so a value may cross a block
 // border. A read behind the last block advances the cursor and leaves its
 // destination untouched.
+//
+// An archive may also stand on a block source (a file): its blocks are then
+// pulled from the source when a read first reaches them, so loading costs
+// what the records use, not what the file holds.
 #include <cstddef>
 #include <cstdint>
 #include <iosfwd>
+#include <map>
 #include <string>
 #include <vector>
 
@@ -26,8 +31,20 @@ public:
     static constexpr std::size_t kBlockSize = 4096;
     typedef boost::array<char, kBlockSize> Block;
 
+    // Where the blocks of a read-only archive come from.
+    class BlockSource {
+    public:
+        virtual ~BlockSource() = default;
+        virtual std::uint64_t blockCount() const = 0;
+        // Fills `block` (kBlockSize bytes) with block `index` < blockCount().
+        virtual void fill(std::uint64_t index, char* block) const = 0;
+    };
+
     explicit QuickArchive(std::size_t blockCount = 1);
     QuickArchive(const void* data, std::size_t size);
+    // Reads the blocks of `source`, which outlives the archive and its
+    // copies. Such an archive is read-only: writes leave it unchanged.
+    explicit QuickArchive(const BlockSource& source);
     QuickArchive(const QuickArchive&) = default;
     QuickArchive& operator=(const QuickArchive&) = default;
     virtual ~QuickArchive();
@@ -72,7 +89,8 @@ public:
     void putRaw(const void* data, std::size_t length);
     void getRaw(void* buffer, std::size_t length);
 
-    // Whole store.
+    // Whole store; the block list holds the blocks written or loaded, not
+    // those of a block source.
     void clear();
     std::size_t getBlockCount() const { return blocks.size(); }
     boost::shared_ptr<Block> getBlock(std::size_t index) const { return blocks[index]; }
@@ -90,7 +108,7 @@ public:
     // Bytes from the read cursor to the end of the last block: an upper
     // bound for anything a record can still hold.
     std::uint64_t bytesLeft() const {
-        const std::uint64_t total = static_cast<std::uint64_t>(blocks.size()) * kBlockSize;
+        const std::uint64_t total = blockTotal() * kBlockSize;
         return readPosition < total ? total - readPosition : 0;
     }
 
@@ -101,10 +119,23 @@ private:
     void appendBlock();
     void readInto(void* dst, std::size_t n);
     void writeFrom(const void* src, std::size_t n);
+    std::uint64_t blockTotal() const {
+        return source ? source->blockCount() : static_cast<std::uint64_t>(blocks.size());
+    }
+    // The bytes of block `index`, pulled from the source if needed; null
+    // behind the last block.
+    const char* blockData(std::uint64_t index);
 
     std::vector<boost::shared_ptr<Block>> blocks;
     std::uint64_t readPosition = 0;
     std::uint64_t writePosition = 0;
+
+    // Set for an archive on a block source, with the blocks pulled so far
+    // and the last one used.
+    const BlockSource* source = nullptr;
+    std::map<std::uint64_t, boost::shared_ptr<Block>> pulled;
+    std::uint64_t lastPulledIndex = 0;
+    const char* lastPulled = nullptr;
 };
 
 }  // namespace OrvaneLumoCore
