@@ -45,9 +45,13 @@ Matrix composeMatrix(const TransformComponents& c) {
     const float x = degreesToRadians(c.rotation.x);
     const float y = degreesToRadians(c.rotation.y);
     const float z = degreesToRadians(c.rotation.z);
-    const float cx = std::cos(x), sx = std::sin(x);
-    const float cy = std::cos(y), sy = std::sin(y);
-    const float cz = std::cos(z), sz = std::sin(z);
+    // Cosine and sine in double, rounded once: the C library's
+    // single-precision functions differ in the last bit between versions.
+    const auto cosine = [](float a) { return static_cast<float>(std::cos(static_cast<double>(a))); };
+    const auto sine = [](float a) { return static_cast<float>(std::sin(static_cast<double>(a))); };
+    const float cx = cosine(x), sx = sine(x);
+    const float cy = cosine(y), sy = sine(y);
+    const float cz = cosine(z), sz = sine(z);
     const float fx = axisFactor(c, 0), fy = axisFactor(c, 1), fz = axisFactor(c, 2);
     const Matrix a(Vector(fx, 0, 0), Vector(0, cx, sx), Vector(0, -sx, cx));
     const Matrix b(Vector(cy, 0, -sy), Vector(0, fy, 0), Vector(sy, 0, cy));
