@@ -9,39 +9,41 @@
 
 namespace OrvaneLumoCore {
 
-std::u16string OrvMatFile::getXml(std::u16string path) {
+std::u16string OrvMatFile::documentXml() const {
     std::u16string result;
-    OrvMatFile file;
-    if (file.load(path)) {
-        result.reserve(4096);
-        AssetXmlWriter writer(result);
-        writer.openRoot(u"orvmat");
-        for (std::size_t i = 0; i < file.getMaterialCount(); ++i) {
-            MaterialPtr material;
-            file.getMaterial(i, material);
-            writeMaterialAssets(writer, material);
-        }
-        writer.closeRoot();
-    } else {
-        result = readFileAsText(path);
+    result.reserve(4096);
+    AssetXmlWriter writer(result);
+    writer.openRoot(u"orvmat");
+    for (std::size_t i = 0; i < getMaterialCount(); ++i) {
+        MaterialPtr material;
+        getMaterial(i, material);
+        writeMaterialAssets(writer, material);
     }
+    writer.closeRoot();
+    return result;
+}
+
+std::u16string OrvMatFile::getXml(std::u16string path) {
+    OrvMatFile file;
+    if (file.load(path)) return file.documentXml();
+    return readFileAsText(path);
+}
+
+std::u16string OrvOptFile::documentXml(AllOptions& options) {
+    std::u16string result;
+    result.reserve(1 << 16);
+    AssetXmlWriter writer(result);
+    writer.openRoot(u"orvopt");
+    options.writeXml(writer, std::u16string());
+    writer.closeRoot();
     return result;
 }
 
 std::u16string OrvOptFile::getXml(std::u16string path) {
-    std::u16string result;
     OrvOptFile file;
     AllOptions options;
-    if (file.load(options, path)) {
-        result.reserve(1 << 16);
-        AssetXmlWriter writer(result);
-        writer.openRoot(u"orvopt");
-        options.writeXml(writer, std::u16string());
-        writer.closeRoot();
-    } else {
-        result = readFileAsText(path);
-    }
-    return result;
+    if (file.load(options, path)) return documentXml(options);
+    return readFileAsText(path);
 }
 
 }  // namespace OrvaneLumoCore

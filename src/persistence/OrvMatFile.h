@@ -37,6 +37,8 @@ public:
     std::size_t getMaterialCount() const { return materials.size(); }
     bool getMaterial(std::size_t index, MaterialPtr& material) const;
 
+    // The loaded materials as an "orvmat" document.
+    std::u16string documentXml() const;
     // The file at `path` as an "orvmat" document, or, if it doesn't load,
     // its text; the empty string if it can't be opened.
     std::u16string getXml(std::u16string path);

@@ -23,6 +23,8 @@ public:
     virtual bool load(AllOptions& options, const std::u16string& path);
     bool load(AllOptions& options, const platform::ByteSource& bytes);
 
+    // `options` as an "orvopt" document.
+    static std::u16string documentXml(AllOptions& options);
     // The file at `path` as an "orvopt" document, or, if it doesn't load,
     // its text; the empty string if it can't be opened.
     std::u16string getXml(std::u16string path);
