@@ -1,8 +1,20 @@
 #!/usr/bin/env bash
-# Sets up, builds, and runs every test (C++ unit tests and the Python module tests).
+# Sets up, builds, and runs every test (C++ unit tests and the Python module
+# tests), then the C++ unit tests again under AddressSanitizer and
+# UndefinedBehaviorSanitizer in build-asan/.
 set -euo pipefail
 cd "$(dirname "$0")/.."
 tools/setup.sh
 tools/build.sh
-cd build
-ctest --output-on-failure -j"$(nproc)"
+(cd build && ctest --output-on-failure -j"$(nproc)")
+
+mkdir -p build-asan
+if ! { cmake -S . -B build-asan -DCMAKE_BUILD_TYPE=Debug -DORVXML_SANITIZE=ON \
+         -DORVXML_BUILD_MODULE=OFF -DORVXML_BUILD_BENCH=OFF &&
+       cmake --build build-asan -j"$(nproc)"; } > build-asan/build.log 2>&1; then
+  cat build-asan/build.log
+  echo "sanitizer build failed" >&2
+  exit 1
+fi
+echo "built into build-asan/"
+(cd build-asan && ctest --output-on-failure -j"$(nproc)")

@@ -1,0 +1,62 @@
+// The text road: a file's text up to its first zero byte, read in chunks up
+// to that byte and no further.
+#include <gtest/gtest.h>
+
+#include <string>
+
+#include "module/TextFallback.h"
+#include "persistence/QuickArchive.h"
+#include "platform/TempFiles.h"
+
+using namespace OrvaneLumoCore;
+using namespace tempfiles;
+
+namespace {
+
+TEST(TextFallback, TextEndsAtTheFirstZeroByte) {
+    TempDir dir;
+    // Lengths around the reading chunk of 64 KiB.
+    const std::string longText(200000, 'a');
+    const struct {
+        std::string bytes;
+        std::string text;
+    } cases[] = {
+        {"", ""},
+        {std::string("\0after", 6), ""},
+        {"plain text", "plain text"},
+        {std::string("before\0after", 12), "before"},
+        {std::string(65536, 'b'), std::string(65536, 'b')},
+        {std::string(65536, 'b') + std::string("\0c", 2), std::string(65536, 'b')},
+        {std::string(65535, 'b') + std::string("\0c", 2), std::string(65535, 'b')},
+        {longText + std::string("\0", 1) + longText, longText},
+        {"caf\xC3\xA9", "caf\xC3\xA9"},
+        {"caf\xE9", "caf\xC3\xA9"},  // not UTF-8: the ANSI code page
+    };
+    for (const auto& c : cases) {
+        ASSERT_TRUE(writeFile(dir.file("t.orvmat"), c.bytes));
+        EXPECT_EQ(c.text, wideToUtf8(readFileAsText(wide(dir.file("t.orvmat"))))) << c.bytes.size();
+    }
+}
+
+TEST(TextFallback, ALargeFileCostsItsText) {
+    TempDir dir;
+    const std::string path = dir.file("large.orvmat");
+    ASSERT_TRUE(writeSparse(path, "short text", 1ull << 30));
+    bool right = false;
+    const long extra = extraMiBOfChild([&] { return readFileAsText(wide(path)) == u"short text"; }, right);
+    EXPECT_TRUE(right);
+    EXPECT_GE(extra, 0);
+    EXPECT_LT(extra, 100);
+}
+
+TEST(TextFallback, OnlyRegularFilesHaveText) {
+    TempDir dir;
+    std::filesystem::create_directory(dir.file("folder.orvmat"));
+    ASSERT_EQ(0, ::mkfifo(dir.file("fifo.orvmat").c_str(), 0600));
+    for (const std::string& path : {dir.file("folder.orvmat"), dir.file("fifo.orvmat"), dir.file("missing.orvmat"),
+                                    std::string("/dev/zero"), std::string("/dev/null")}) {
+        EXPECT_EQ(u"", readFileAsText(wide(path))) << path;
+    }
+}
+
+}  // namespace

@@ -1,0 +1,174 @@
+// The two containers on real files: only regular files are read, and a file
+// costs the blocks its records use, not its size.
+#include <gtest/gtest.h>
+
+#include <sstream>
+#include <string>
+
+#include "options/AllOptions.h"
+#include "persistence/OrvMatFile.h"
+#include "persistence/OrvOptFile.h"
+#include "platform/File.h"
+#include "platform/TempFiles.h"
+
+using namespace OrvaneLumoCore;
+using namespace tempfiles;
+
+namespace {
+
+const std::uint64_t kGiB = 1ull << 30;
+
+std::string example(const std::string& name) {
+    return readFile(std::string(ORVXML_SOURCE_DIR) + "/examples/" + name);
+}
+
+std::string le32(std::uint32_t v) {
+    std::string s(4, '\0');
+    for (int i = 0; i < 4; ++i) s[i] = static_cast<char>(v >> (8 * i));
+    return s;
+}
+
+std::u16string convert(const std::string& path) {
+    const bool options = path.compare(path.size() - 3, 3, "opt") == 0;
+    return options ? OrvOptFile().getXml(wide(path)) : OrvMatFile().getXml(wide(path));
+}
+
+// Remembers how many bytes were asked of the source.
+class CountingBytes : public platform::ByteSource {
+public:
+    explicit CountingBytes(const std::string& bytes) : bytes_(bytes.data(), bytes.size()) {}
+    std::uint64_t size() const override { return bytes_.size(); }
+    std::size_t readAt(std::uint64_t offset, void* dst, std::size_t n) const override {
+        const std::size_t got = bytes_.readAt(offset, dst, n);
+        read += got;
+        return got;
+    }
+    mutable std::uint64_t read = 0;
+
+private:
+    platform::MemoryBytes bytes_;
+};
+
+TEST(FileContainers, ANonRegularFileIsAFileThatCantBeOpened) {
+    TempDir dir;
+    std::filesystem::create_directory(dir.file("folder.orvmat"));
+    std::filesystem::create_directory(dir.file("folder.orvopt"));
+    ASSERT_EQ(0, ::mkfifo(dir.file("fifo.orvmat").c_str(), 0600));
+    ASSERT_EQ(0, ::mkfifo(dir.file("fifo.orvopt").c_str(), 0600));
+    ASSERT_TRUE(makeSocket(dir.file("socket.orvopt")));
+    for (const std::string& path : {dir.file("folder.orvmat"), dir.file("folder.orvopt"), dir.file("fifo.orvmat"),
+                                    dir.file("fifo.orvopt"), dir.file("socket.orvopt"), std::string("/dev/null"),
+                                    std::string("/dev/zero")}) {
+        OrvMatFile materials;
+        AllOptions options;
+        EXPECT_FALSE(materials.load(wide(path))) << path;
+        EXPECT_FALSE(OrvOptFile().load(options, wide(path))) << path;
+        EXPECT_EQ(u"", OrvMatFile().getXml(wide(path))) << path;
+        EXPECT_EQ(u"", OrvOptFile().getXml(wide(path))) << path;
+    }
+}
+
+TEST(FileContainers, LargeSparseFilesCostWhatTheirRecordsUse) {
+    TempDir dir;
+    // v3 library whose block count claims far more than the file holds.
+    std::string claimsMore = example("materials_all_layers.orvmat");
+    claimsMore.replace(8, 4, le32(0xFFFFFFFFu));
+    const struct {
+        const char* name;
+        std::string head;  // then zeros up to 1 GiB
+    } cases[] = {
+        {"zeros.orvmat", ""},
+        {"zeros.orvopt", ""},
+        {"text.orvmat", "text up to the first zero byte"},
+        {"library.orvmat", example("materials_all_layers.orvmat")},
+        {"old_library.orvmat", example("materials_old_records_v2.orvmat")},
+        {"claims_more.orvmat", claimsMore},
+        {"settings.orvopt", example("render_settings.orvopt")},
+    };
+    for (const auto& c : cases) {
+        // What the head alone converts to: trailing zeros change nothing.
+        const std::string head = dir.file(std::string("head_") + c.name);
+        ASSERT_TRUE(writeFile(head, c.head));
+        const std::u16string expected = convert(head);
+        EXPECT_EQ(c.head.empty(), expected.empty()) << c.name;
+
+        const std::string path = dir.file(c.name);
+        ASSERT_TRUE(writeSparse(path, c.head, kGiB));
+        bool same = false;
+        const long extra = extraMiBOfChild([&] { return convert(path) == expected; }, same);
+        EXPECT_TRUE(same) << c.name;
+        EXPECT_GE(extra, 0) << c.name;
+        EXPECT_LT(extra, 100) << c.name;
+    }
+}
+
+TEST(FileContainers, ALoaderReadsTheHeaderAndTheBlocksItUses) {
+    const std::string garbage(1 << 20, '\x5A');
+    std::string claimsMore = example("materials_all_layers.orvmat");
+    claimsMore.replace(8, 4, le32(0xFFFFFFFFu));
+    const struct {
+        std::string bytes;
+        bool options;
+        bool loads;
+    } cases[] = {
+        {example("materials_all_layers.orvmat") + garbage, false, true},
+        {claimsMore + garbage, false, true},
+        {example("materials_old_records_v2.orvmat") + garbage, false, true},
+        {example("render_settings.orvopt") + garbage, true, true},
+        {std::string(8, '\0') + garbage, false, false},
+        {std::string(8, '\0') + garbage, true, false},
+    };
+    for (const auto& c : cases) {
+        CountingBytes bytes(c.bytes);
+        AllOptions options;
+        OrvMatFile materials;
+        EXPECT_EQ(c.loads, c.options ? OrvOptFile().load(options, bytes) : materials.load(bytes));
+        EXPECT_LE(bytes.read, 3 * QuickArchive::kBlockSize) << c.bytes.size();
+    }
+}
+
+// Text mode undone across block borders: the same stream as a version 1, 2
+// and 3 library gives the same materials.
+TEST(FileContainers, AllContainerVersionsReadTheSameStream) {
+    OrvMatFile source;
+    ASSERT_TRUE(source.load(wide(std::string(ORVXML_SOURCE_DIR) + "/examples/materials_all_layers.orvmat")));
+    std::vector<MaterialPtr> many;
+    for (int i = 0; i < 40; ++i) {
+        // Names full of line feeds put CR LF pairs at many offsets.
+        MaterialPtr m = source.materials[0]->clone();
+        m->name = std::u16string(static_cast<std::size_t>(i * 7 % 61), u'\n') + u"\r" + std::u16string(i, u'\n');
+        many.push_back(m);
+    }
+    OrvMatFile file;
+    file.materials = many;
+    std::ostringstream out;
+    ASSERT_TRUE(file.save(out));
+    const std::string v3 = out.str();
+    const std::string stream = v3.substr(12);
+    ASSERT_GT(stream.size(), 4 * QuickArchive::kBlockSize);
+    std::string crlf;
+    for (char ch : stream) {
+        if (ch == '\n') crlf += '\r';
+        crlf += ch;
+    }
+    const std::string count = le32(static_cast<std::uint32_t>(many.size()));
+    const std::string v2 = le32(0x20000) + count + stream;
+    const std::string v1 = le32(0x10000) + count + crlf;
+
+    TempDir dir;
+    std::u16string expected;
+    for (const std::string& bytes : {v3, v2, v1}) {
+        OrvMatFile fromMemory;
+        ASSERT_TRUE(fromMemory.load(bytes.data(), bytes.size()));
+        if (expected.empty()) expected = fromMemory.documentXml();
+        EXPECT_EQ(expected, fromMemory.documentXml());
+        ASSERT_TRUE(writeFile(dir.file("lib.orvmat"), bytes));
+        EXPECT_EQ(expected, OrvMatFile().getXml(wide(dir.file("lib.orvmat"))));
+        std::istringstream in(bytes);
+        OrvMatFile fromStream;
+        ASSERT_TRUE(fromStream.load(in));
+        EXPECT_EQ(many.size(), fromStream.getMaterialCount());
+    }
+}
+
+}  // namespace

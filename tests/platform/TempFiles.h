@@ -1,0 +1,103 @@
+#pragma once
+// Scratch files for tests that need real paths: a private folder, large
+// sparse files, special files, and the peak memory of work done in a child.
+#include <sys/resource.h>
+#include <sys/socket.h>
+#include <sys/stat.h>
+#include <sys/un.h>
+#include <sys/wait.h>
+#include <fcntl.h>
+#include <unistd.h>
+
+#include <cstdint>
+#include <cstdlib>
+#include <cstring>
+#include <filesystem>
+#include <fstream>
+#include <functional>
+#include <string>
+
+#include "persistence/QuickArchive.h"
+
+namespace tempfiles {
+
+// A fresh folder, removed with everything in it at the end of the scope.
+class TempDir {
+public:
+    TempDir() {
+        std::string pattern = (std::filesystem::temp_directory_path() / "orvxml-XXXXXX").string();
+        if (::mkdtemp(&pattern[0])) path_ = pattern;
+    }
+    ~TempDir() {
+        std::error_code ec;
+        if (!path_.empty()) std::filesystem::remove_all(path_, ec);
+    }
+    TempDir(const TempDir&) = delete;
+    TempDir& operator=(const TempDir&) = delete;
+
+    std::string file(const std::string& name) const { return path_ + "/" + name; }
+
+private:
+    std::string path_;
+};
+
+inline std::u16string wide(const std::string& path) { return OrvaneLumoCore::utf8ToWide(path); }
+
+// Writes `head` and extends the file with a hole to `size` bytes, if larger.
+inline bool writeSparse(const std::string& path, const std::string& head, std::uint64_t size) {
+    {
+        std::ofstream out(path, std::ios::binary | std::ios::trunc);
+        out.write(head.data(), static_cast<std::streamsize>(head.size()));
+        if (!out) return false;
+    }
+    return size <= head.size() || ::truncate(path.c_str(), static_cast<off_t>(size)) == 0;
+}
+
+inline bool writeFile(const std::string& path, const std::string& bytes) {
+    return writeSparse(path, bytes, 0);
+}
+
+inline std::string readFile(const std::string& path) {
+    std::ifstream in(path, std::ios::binary);
+    return std::string((std::istreambuf_iterator<char>(in)), std::istreambuf_iterator<char>());
+}
+
+// A socket file at `path`; it stays behind when the socket is closed.
+inline bool makeSocket(const std::string& path) {
+    const int fd = ::socket(AF_UNIX, SOCK_STREAM, 0);
+    if (fd < 0) return false;
+    sockaddr_un address = {};
+    address.sun_family = AF_UNIX;
+    bool bound = false;
+    if (path.size() < sizeof address.sun_path) {
+        std::memcpy(address.sun_path, path.c_str(), path.size() + 1);
+        bound = ::bind(fd, reinterpret_cast<sockaddr*>(&address), sizeof address) == 0;
+    }
+    ::close(fd);
+    return bound;
+}
+
+// Runs `work` in a forked child. Returns the child's peak resident memory
+// in MiB, or -1 if the child didn't exit normally; `passed` is what `work`
+// returned.
+inline long peakMiBOfChild(const std::function<bool()>& work, bool& passed) {
+    passed = false;
+    const pid_t pid = ::fork();
+    if (pid < 0) return -1;
+    if (pid == 0) _exit(work() ? 0 : 1);
+    int status = 0;
+    rusage usage = {};
+    if (::wait4(pid, &status, 0, &usage) != pid || !WIFEXITED(status)) return -1;
+    passed = WEXITSTATUS(status) == 0;
+    return usage.ru_maxrss / 1024;
+}
+
+// The child's peak above that of a child that does nothing.
+inline long extraMiBOfChild(const std::function<bool()>& work, bool& passed) {
+    bool idle = false;
+    const long base = peakMiBOfChild([] { return true; }, idle);
+    const long peak = peakMiBOfChild(work, passed);
+    return peak < 0 || base < 0 ? -1 : peak - base;
+}
+
+}  // namespace tempfiles
