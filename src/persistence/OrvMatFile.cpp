@@ -6,6 +6,7 @@
 #include <ostream>
 
 #include "persistence/QuickArchive.h"
+#include "persistence/Record.h"
 #include "platform/File.h"
 
 namespace OrvaneLumoCore {
@@ -24,6 +25,19 @@ std::string readRest(std::istream& in) {
     in.read(&body[0], static_cast<std::streamsize>(body.size()));
     body.resize(static_cast<std::size_t>(in.gcount()));
     return body;
+}
+
+// The file offset of byte `at` of the material stream: behind the header,
+// and behind the block count in version 3. In version 1 each CR LF pair of
+// the body stands for one byte of the stream.
+std::uint64_t fileOffset(std::uint64_t at, int version, const std::string& textModeBody) {
+    if (version == 3) return 12 + at;
+    if (version != 1) return 8 + at;
+    const std::uint64_t n = textModeBody.size();
+    std::uint64_t raw = 0, seen = 0;
+    for (; seen < at && raw < n; ++seen)
+        raw += (textModeBody[raw] == '\r' && raw + 1 < n && textModeBody[raw + 1] == '\n') ? 2 : 1;
+    return 8 + raw + (at - seen);
 }
 
 }  // namespace
@@ -45,18 +59,22 @@ std::string undoTextMode(const std::string& body) {
 }
 
 bool OrvMatFile::load(std::istream& in) {
+    loadNote = LoadNote();
     std::uint32_t header[2] = {0, 0};
     in.read(reinterpret_cast<char*>(header), 8);
-    if (in.gcount() != 8) return false;
+    if (in.gcount() != 8)
+        return loadNote.fail(LoadRule::BadHeader, 0, 0, "file shorter than its 8-byte header");
     const std::uint32_t tag = header[0];
     const std::uint32_t count = header[1];
-    if (count == 0) return false;
-    if ((tag & 0xFFFF) != 0) return false;
+    if (count == 0) return loadNote.fail(LoadRule::BadHeader, 4, 0, "material count is 0");
+    if ((tag & 0xFFFF) != 0)
+        return loadNote.fail(LoadRule::BadHeader, 0, tag, "version tag with a low half");
 
     QuickArchive ar(static_cast<std::size_t>(1));
+    std::string textModeBody;  // version 1 only
     switch (tag >> 16) {
         case 3:
-            if (!ar.loadBlocks(in)) return false;
+            if (!ar.loadBlocks(in)) return loadNote.fail(LoadRule::BadHeader, 8, 0, "no blocks");
             break;
         case 2: {
             const std::string body = readRest(in);
@@ -64,24 +82,30 @@ bool OrvMatFile::load(std::istream& in) {
             break;
         }
         case 1: {
-            const std::string body = undoTextMode(readRest(in));
+            textModeBody = readRest(in);
+            const std::string body = undoTextMode(textModeBody);
             ar = QuickArchive(body.data(), body.size());
             break;
         }
         default:
-            return false;
+            return loadNote.fail(LoadRule::BadHeader, 0, tag, "unknown container version tag");
     }
 
     // Every material takes at least its four-byte tag: a larger count can't
     // be real.
-    if (count > ar.bytesLeft()) return false;
+    if (count > ar.bytesLeft()) return loadNote.fail(LoadRule::CountTooLarge, 4, count);
     std::vector<MaterialPtr> loaded;
     for (std::uint32_t i = 0; i < count; ++i) {
+        const std::uint64_t at = ar.getReadPosition();
         std::uint32_t type = 0xFFFFFFFFu;
         ar.readUInt(type);
-        MaterialPtr material = createMaterial(type);
-        if (!material) return false;
-        if (!material->load(ar)) return false;
+        MaterialPtr material = createMember(ar, at, type, &createMaterial);
+        if (!material || !loadRecord(ar, *material, type)) {
+            loadNote = ar.trace.note;
+            loadNote.offset = fileOffset(loadNote.offset, tag >> 16, textModeBody);
+            loadNote.record.start = fileOffset(loadNote.record.start, tag >> 16, textModeBody);
+            return false;
+        }
         loaded.push_back(material);
     }
     materials.swap(loaded);
@@ -104,7 +128,10 @@ bool OrvMatFile::save(std::ostream& out) {
 bool OrvMatFile::load(const std::u16string& path) {
     std::ifstream file;
     platform::openForReading(file, path);
-    if (!file.is_open()) return false;
+    if (!file.is_open()) {
+        loadNote = LoadNote();
+        return loadNote.fail(LoadRule::CannotOpen, 0);
+    }
     return load(static_cast<std::istream&>(file));
 }
 

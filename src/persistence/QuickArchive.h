@@ -13,6 +13,7 @@
 #include <boost/array.hpp>
 #include <boost/shared_ptr.hpp>
 
+#include "persistence/LoadNote.h"
 #include "persistence/Types.h"
 
 namespace OrvaneLumoCore {
@@ -96,6 +97,9 @@ public:
 
     // Depth of nested member records being loaded; see persistence/Record.h.
     int nestingDepth = 0;
+    // Why a load from this archive failed, and the records being read; see
+    // persistence/LoadNote.h.
+    LoadTrace trace;
 
 private:
     void appendBlock();

@@ -1,0 +1,140 @@
+#include "module/Outcome.h"
+
+#include <cerrno>
+
+#include <fcntl.h>
+#include <sys/stat.h>
+#include <unistd.h>
+
+#include "lights/SunIesDome.h"
+#include "materials/MaterialAssets.h"
+#include "module/Extension.h"
+#include "module/TextFallback.h"
+#include "options/AllOptions.h"
+#include "persistence/OrvMatFile.h"
+#include "persistence/OrvOptFile.h"
+#include "platform/File.h"
+#include "xml/AssetXmlWriter.h"
+
+namespace OrvaneLumoCore {
+
+bool kindOfPath(const std::u16string& path, FileKind& kind) {
+    if (hasExtension(path, u"orvmat", u"lumat")) {
+        kind = FileKind::Materials;
+        return true;
+    }
+    if (hasExtension(path, u"orvopt", u"luopt")) {
+        kind = FileKind::Options;
+        return true;
+    }
+    return false;
+}
+
+namespace {
+
+// The two documents as the drivers of the module write them.
+std::u16string materialDocument(const OrvMatFile& file) {
+    std::u16string result;
+    result.reserve(4096);
+    AssetXmlWriter writer(result);
+    writer.openRoot(u"orvmat");
+    for (std::size_t i = 0; i < file.getMaterialCount(); ++i) {
+        MaterialPtr material;
+        file.getMaterial(i, material);
+        writeMaterialAssets(writer, material);
+    }
+    writer.closeRoot();
+    return result;
+}
+
+std::u16string optionsDocument(AllOptions& options) {
+    std::u16string result;
+    result.reserve(1 << 16);
+    AssetXmlWriter writer(result);
+    writer.openRoot(u"orvopt");
+    options.writeXml(writer, std::u16string());
+    writer.closeRoot();
+    return result;
+}
+
+// The settings blocks of an options document: its Assets elements at the
+// first level of indentation.
+std::size_t countBlocks(const std::u16string& document) {
+    static const std::u16string kBlockStart = u"\n  <Assets>\n";
+    std::size_t n = 0;
+    for (std::size_t at = document.find(kBlockStart); at != std::u16string::npos;
+         at = document.find(kBlockStart, at + 1))
+        ++n;
+    return n;
+}
+
+// A path the loaders must not open: one that isn't there, can't be read, or
+// isn't a regular file (a folder, a pipe that would block, a device).
+bool refusePath(const std::string& native, ConversionOutcome& out) {
+    struct stat st;
+    if (::stat(native.c_str(), &st) != 0) return !out.note.fail(LoadRule::CannotOpen, 0, errno);
+    if (!S_ISREG(st.st_mode)) return !out.note.fail(LoadRule::NotRegularFile, 0);
+    const int fd = ::open(native.c_str(), O_RDONLY | O_NONBLOCK | O_CLOEXEC);
+    if (fd < 0) return !out.note.fail(LoadRule::CannotOpen, 0, errno);
+    ::close(fd);
+    out.fileSize = static_cast<std::uint64_t>(st.st_size);
+    return false;
+}
+
+}  // namespace
+
+ConversionOutcome convertFile(const std::u16string& path, FileKind kind) {
+    ConversionOutcome out;
+    resetDocumentSun();
+    if (refusePath(platform::pathToNative(path), out)) return out;
+    bool loaded = false;
+    if (kind == FileKind::Materials) {
+        OrvMatFile file;
+        loaded = file.load(path);
+        if (loaded) {
+            out.text = materialDocument(file);
+            out.items = file.getMaterialCount();
+        } else {
+            out.note = file.loadNote;
+        }
+    } else {
+        OrvOptFile file;
+        AllOptions options;
+        loaded = file.load(options, path);
+        if (loaded) {
+            out.text = optionsDocument(options);
+            out.items = countBlocks(out.text);
+        } else {
+            out.note = file.loadNote;
+        }
+    }
+    if (loaded) {
+        out.status = FileStatus::Document;
+        return out;
+    }
+    out.status = FileStatus::Text;
+    out.text = readFileAsText(path);
+    // A version 3 body is read in whole blocks; what was read behind the
+    // file's end came from the zeros of a block the file didn't fill.
+    if (out.note.offset >= out.fileSize && out.note.rule != LoadRule::BadHeader) {
+        out.note.rule = LoadRule::DataEndsEarly;
+        out.note.offset = out.fileSize;
+    }
+    return out;
+}
+
+std::string explainOutcome(const ConversionOutcome& outcome, FileKind kind) {
+    switch (outcome.status) {
+    case FileStatus::Document: {
+        const char* what = kind == FileKind::Materials ? (outcome.items == 1 ? " material" : " materials")
+                                                       : (outcome.items == 1 ? " block" : " blocks");
+        return "document, " + std::to_string(outcome.items) + what + ", " +
+               std::to_string(outcome.fileSize) + " bytes";
+    }
+    case FileStatus::Text: return "text: " + describe(outcome.note);
+    case FileStatus::Unreadable: break;
+    }
+    return "unreadable: " + describe(outcome.note);
+}
+
+}  // namespace OrvaneLumoCore
