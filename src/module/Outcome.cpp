@@ -116,7 +116,7 @@ ConversionOutcome convertFile(const std::u16string& path, FileKind kind) {
     out.text = readFileAsText(path);
     // A version 3 body is read in whole blocks; what was read behind the
     // file's end came from the zeros of a block the file didn't fill.
-    if (out.note.offset >= out.fileSize && out.note.rule != LoadRule::BadHeader) {
+    if (out.note.reached > out.fileSize) {
         out.note.rule = LoadRule::DataEndsEarly;
         out.note.offset = out.fileSize;
     }

@@ -15,6 +15,7 @@ bool LoadNote::fail(LoadRule rule_, std::uint64_t offset_, std::uint64_t value_,
     if (!isSet()) {
         rule = rule_;
         offset = offset_;
+        reached = offset_;
         value = value_;
         detail = detail_;
     }
@@ -107,6 +108,7 @@ void noteFailure(QuickArchive& ar, LoadRule rule, std::uint64_t offset, std::uin
         offset = end;
     }
     note.fail(rule, offset, value);
+    note.reached = ar.getReadPosition();
     note.member = member;
     if (!ar.trace.open.empty()) note.record = ar.trace.open.back();
 }

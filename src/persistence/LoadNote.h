@@ -38,7 +38,8 @@ struct RecordFrame {
 
 struct LoadNote {
     LoadRule rule = LoadRule::None;
-    std::uint64_t offset = 0;  // the byte where reading stopped
+    std::uint64_t offset = 0;   // the byte where reading stopped
+    std::uint64_t reached = 0;  // the read position then, behind the refused value
     // The refused value: the header word, the type tag, the version tag, the
     // count or the nesting depth.
     std::uint64_t value = 0;
@@ -49,7 +50,8 @@ struct LoadNote {
     RecordFrame record;            // the record being read
 
     bool isSet() const { return rule != LoadRule::None; }
-    // Sets rule, offset, value and detail unless a note is set already.
+    // Sets rule, offset (and reached), value and detail unless a note is set
+    // already.
     // Returns false, for `return note.fail(...)` in a loader.
     bool fail(LoadRule rule, std::uint64_t offset, std::uint64_t value = 0,
               const char* detail = nullptr);

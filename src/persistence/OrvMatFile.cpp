@@ -102,8 +102,8 @@ bool OrvMatFile::load(std::istream& in) {
         MaterialPtr material = createMember(ar, at, type, &createMaterial);
         if (!material || !loadRecord(ar, *material, type)) {
             loadNote = ar.trace.note;
-            loadNote.offset = fileOffset(loadNote.offset, tag >> 16, textModeBody);
-            loadNote.record.start = fileOffset(loadNote.record.start, tag >> 16, textModeBody);
+            for (std::uint64_t* at : {&loadNote.offset, &loadNote.reached, &loadNote.record.start})
+                *at = fileOffset(*at, tag >> 16, textModeBody);
             return false;
         }
         loaded.push_back(material);
