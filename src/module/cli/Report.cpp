@@ -104,7 +104,8 @@ void Collector::emit(std::size_t index) {
 void Collector::showProgress(bool force) {
     if (!progress_) return;
     const auto now = std::chrono::steady_clock::now();
-    if (!force && now - lastProgress_ < std::chrono::milliseconds(100)) return;
+    // The first file shows the line at once, then it changes ten times a second.
+    if (!force && done_ > 1 && now - lastProgress_ < std::chrono::milliseconds(100)) return;
     lastProgress_ = now;
     const double seconds = std::chrono::duration<double>(now - start_).count();
     std::fprintf(stderr, "\r\033[Korvxml: %zu of %zu files, %.0f files/s", done_, jobs_.size(),
