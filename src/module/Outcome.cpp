@@ -2,7 +2,6 @@
 
 #include <cerrno>
 
-#include <fcntl.h>
 #include <sys/stat.h>
 #include <unistd.h>
 
@@ -74,9 +73,7 @@ bool refusePath(const std::string& native, ConversionOutcome& out) {
     struct stat st;
     if (::stat(native.c_str(), &st) != 0) return !out.note.fail(LoadRule::CannotOpen, 0, errno);
     if (!S_ISREG(st.st_mode)) return !out.note.fail(LoadRule::NotRegularFile, 0);
-    const int fd = ::open(native.c_str(), O_RDONLY | O_NONBLOCK | O_CLOEXEC);
-    if (fd < 0) return !out.note.fail(LoadRule::CannotOpen, 0, errno);
-    ::close(fd);
+    if (::access(native.c_str(), R_OK) != 0) return !out.note.fail(LoadRule::CannotOpen, 0, errno);
     out.fileSize = static_cast<std::uint64_t>(st.st_size);
     return false;
 }
