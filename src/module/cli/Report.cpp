@@ -1,7 +1,5 @@
 #include "module/cli/Report.h"
 
-#include <unistd.h>
-
 #include "platform/Text.h"
 
 namespace orvxml {
@@ -59,11 +57,12 @@ std::string jsonLine(const Job& job, const FileResult& r) {
            ", \"characters\": " + std::to_string(r.characters) + ", \"milliseconds\": " + ms + "}";
 }
 
-Collector::Collector(const std::vector<Job>& jobs, bool explain, bool quiet, std::FILE* report)
+Collector::Collector(const std::vector<Job>& jobs, bool explain, bool quiet, bool progress,
+                     std::FILE* report)
     : jobs_(jobs),
       explain_(explain),
       quiet_(quiet),
-      progress_(!quiet && ::isatty(STDERR_FILENO)),
+      progress_(progress && !quiet),
       report_(report),
       results_(jobs.size()),
       arrived_(jobs.size(), false),

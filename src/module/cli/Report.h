@@ -20,7 +20,8 @@ std::string jsonLine(const Job& job, const FileResult& result);
 // the number of workers.
 class Collector {
 public:
-    Collector(const std::vector<Job>& jobs, bool explain, bool quiet, std::FILE* report);
+    // `progress`: show the progress line on standard error (a terminal).
+    Collector(const std::vector<Job>& jobs, bool explain, bool quiet, bool progress, std::FILE* report);
     void add(std::size_t index, const FileResult& result);
     // Ends the progress line, prints the summary; returns the exit status.
     int finish();

@@ -72,7 +72,9 @@ int main(int argc, char** argv) {
             return usageError("can't write the report " + settings.reportPath + ": " + std::strerror(errno));
     }
 
-    Collector collector(jobs, settings.explain, settings.quiet, report);
+    // A lone file on standard output needs no progress line.
+    const bool progress = !toStdout && ::isatty(STDERR_FILENO);
+    Collector collector(jobs, settings.explain, settings.quiet, progress, report);
     if (toStdout) {
         for (std::size_t i = 0; i < jobs.size(); ++i) collector.add(i, runJob(jobs[i], stdout));
     } else {
