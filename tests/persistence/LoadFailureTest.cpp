@@ -83,6 +83,11 @@ TEST(LoadFailure, MaterialFileNotesTheFirstRefusal) {
          LoadRule::NestingTooDeep, 8 + 258 * 12 - 8, "MaterialMulti", kMulti, 2, 257},
         {"data ends inside a record", singleHead(header(0x20000, 1)).s.substr(0, 18),
          LoadRule::DataEndsEarly, 18, "MaterialSingleBRDF", kSingle, 2, 0},
+        // A version 1 bump material checks its base material's tag itself:
+        // name, path, multiplier, then tag 99.
+        {"a check of the class's own",
+         header(0x20000, 1).u32(3).u32(0x10000).u32(0).u32(0).u32(0).u32(99).zeros(8).s,
+         LoadRule::RecordRefused, 32, "MaterialBump", 3, 1, 0},
         // Version 1: the CR LF pairs of the file count once in the stream;
         // the offset is the file's.
         {"version 1 offsets count CR LF pairs",
