@@ -102,8 +102,8 @@ bool OrvMatFile::load(std::istream& in) {
         MaterialPtr material = createMember(ar, at, type, &createMaterial);
         if (!material || !loadRecord(ar, *material, type)) {
             loadNote = ar.trace.note;
-            for (std::uint64_t* at : {&loadNote.offset, &loadNote.reached, &loadNote.record.start})
-                *at = fileOffset(*at, tag >> 16, textModeBody);
+            for (std::uint64_t* offset : {&loadNote.offset, &loadNote.reached, &loadNote.record.start})
+                *offset = fileOffset(*offset, tag >> 16, textModeBody);
             return false;
         }
         loaded.push_back(material);

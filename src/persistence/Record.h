@@ -20,9 +20,9 @@ inline void writeVersion(QuickArchive& ar, int version) { ar.writeUInt(versionTa
 
 // Reads a version tag. Returns the version if the low half is 0 and the
 // version lies in [minVersion, maxVersion], else -1. A tag behind the end of
-// the data reads as 0 and is refused unless 0 is accepted.
-// The first version accepted in a record is the record's own; a refused one
-// is noted on the archive.
+// the data reads as 0 and is refused unless 0 is accepted. A refused tag is
+// noted on the archive; the first version accepted in a record is noted as
+// the record's own.
 inline int readVersion(QuickArchive& ar, int minVersion, int maxVersion) {
     const std::uint64_t at = ar.getReadPosition();
     std::uint32_t tag = 0;

@@ -2,8 +2,8 @@
 
 #include <atomic>
 #include <cerrno>
+#include <climits>
 #include <chrono>
-#include <csignal>
 #include <cstring>
 #include <map>
 
@@ -46,10 +46,13 @@ bool writeAll(int fd, const char* data, std::size_t size) {
     return true;
 }
 
+// The temporary file beside `path` that process `pid` writes first.
+std::string partPath(const std::string& path, pid_t pid) { return path + ".part" + std::to_string(pid); }
+
 // Writes `bytes` to `path` through a temporary file beside it, so that a
 // reader never sees half a file. Returns why it failed, or nothing.
 std::string writeFile(const std::string& path, const std::string& bytes) {
-    const std::string part = path + ".part" + std::to_string(::getpid());
+    const std::string part = partPath(path, ::getpid());
     const int fd = ::open(part.c_str(), O_WRONLY | O_CREAT | O_TRUNC | O_CLOEXEC, 0666);
     if (fd < 0) return path + ": " + std::strerror(errno);
     const bool written = writeAll(fd, bytes.data(), bytes.size());
@@ -102,7 +105,10 @@ namespace {
 // with a single write() of at most PIPE_BUF bytes, so messages of different
 // workers never interleave.
 enum class MessageType : std::uint8_t { Started, Finished };
-constexpr std::size_t kMaxText = 1500;  // of each text, so that a message fits PIPE_BUF
+constexpr std::size_t kMaxText = 1200;  // bytes of each of the three texts
+// Length, type, worker, index, status, characters, milliseconds, three texts.
+static_assert(4 + 1 + 4 + 8 + 1 + 8 + 8 + 3 * (2 + kMaxText) <= PIPE_BUF,
+              "a message is written in one piece");
 
 struct Message {
     MessageType type = MessageType::Started;
@@ -279,6 +285,7 @@ void runJobs(const std::vector<Job>& jobs, unsigned workers, const ResultSink& s
         const std::uint64_t held = holding[p.second];
         if (held == kNone || reported[held]) continue;
         reported[held] = true;
+        if (!jobs[held].output.empty()) ::unlink(partPath(jobs[held].output, p.first).c_str());
         sink(static_cast<std::size_t>(held), crashed(status));
     }
     // Jobs that no worker finished, if workers stopped early or couldn't start.
