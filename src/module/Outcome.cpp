@@ -29,9 +29,6 @@ bool kindOfPath(const std::u16string& path, FileKind& kind) {
     return false;
 }
 
-namespace {
-
-// The two documents as the drivers of the module write them.
 std::u16string materialDocument(const OrvMatFile& file) {
     std::u16string result;
     result.reserve(4096);
@@ -56,6 +53,8 @@ std::u16string optionsDocument(AllOptions& options) {
     return result;
 }
 
+namespace {
+
 // The settings blocks of an options document: its Assets elements at the
 // first level of indentation.
 std::size_t countBlocks(const std::u16string& document) {
@@ -71,11 +70,15 @@ std::size_t countBlocks(const std::u16string& document) {
 // isn't a regular file (a folder, a pipe that would block, a device).
 bool refusePath(const std::string& native, ConversionOutcome& out) {
     struct stat st;
-    if (::stat(native.c_str(), &st) != 0) return !out.note.fail(LoadRule::CannotOpen, 0, errno);
-    if (!S_ISREG(st.st_mode)) return !out.note.fail(LoadRule::NotRegularFile, 0);
-    if (::access(native.c_str(), R_OK) != 0) return !out.note.fail(LoadRule::CannotOpen, 0, errno);
-    out.fileSize = static_cast<std::uint64_t>(st.st_size);
-    return false;
+    if (::stat(native.c_str(), &st) != 0)
+        out.note.fail(LoadRule::CannotOpen, 0, errno);
+    else if (!S_ISREG(st.st_mode))
+        out.note.fail(LoadRule::NotRegularFile, 0);
+    else if (::access(native.c_str(), R_OK) != 0)
+        out.note.fail(LoadRule::CannotOpen, 0, errno);
+    else
+        out.fileSize = static_cast<std::uint64_t>(st.st_size);
+    return out.note.isSet();
 }
 
 }  // namespace

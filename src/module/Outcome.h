@@ -10,7 +10,15 @@
 
 namespace OrvaneLumoCore {
 
+class AllOptions;
+class OrvMatFile;
+
 enum class FileKind { Materials, Options };
+
+// The two documents, of a file that loaded, as the module's drivers write
+// them: root element, then the materials in file order or the settings blocks.
+std::u16string materialDocument(const OrvMatFile& file);
+std::u16string optionsDocument(AllOptions& options);
 
 // The conversion that the path's extension picks, as the module's extension
 // test decides it; false for any other extension.
