@@ -1,6 +1,7 @@
 #include "module/Outcome.h"
 
 #include <cerrno>
+#include <cstring>
 
 #include <sys/stat.h>
 #include <unistd.h>
@@ -56,13 +57,22 @@ std::u16string optionsDocument(AllOptions& options) {
 namespace {
 
 // The settings blocks of an options document: its Assets elements at the
-// first level of indentation.
+// first level of indentation. The search runs over the bytes of the text with
+// memmem, much faster than a search by 16-bit units; a hit must start on a
+// unit.
 std::size_t countBlocks(const std::u16string& document) {
-    static const std::u16string kBlockStart = u"\n  <Assets>\n";
+    static const char16_t kBlockStart[] = u"\n  <Assets>\n";
+    const std::size_t patternSize = sizeof kBlockStart - sizeof(char16_t);
+    const char* text = reinterpret_cast<const char*>(document.data());
+    const std::size_t size = document.size() * sizeof(char16_t);
     std::size_t n = 0;
-    for (std::size_t at = document.find(kBlockStart); at != std::u16string::npos;
-         at = document.find(kBlockStart, at + 1))
-        ++n;
+    for (std::size_t at = 0; at < size;) {
+        const void* hit = ::memmem(text + at, size - at, kBlockStart, patternSize);
+        if (!hit) break;
+        const std::size_t found = static_cast<std::size_t>(static_cast<const char*>(hit) - text);
+        if (found % sizeof(char16_t) == 0) ++n;
+        at = found + 1;
+    }
     return n;
 }
 
