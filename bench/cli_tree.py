@@ -21,8 +21,9 @@ average 5 to 7 during the runs), RelWithDebInfo, 10,000 files, best of 5:
                     jobs 2:  1.14 s   8800 files/s  (CPU 1.11 s)  best seen; up to 2.3 s
 
 About 85 microseconds of CPU per file. With the other builds running, the two
-jobs got one core's worth of CPU between them (CPU time equals elapsed time),
-so the tmpfs run shows the cost of the second process rather than its gain;
+jobs got one core's worth of CPU between them (CPU time equals elapsed time;
+two pure-CPU processes took twice as long as one at the same time), so the
+tmpfs run shows the cost of the second process rather than its gain;
 on the disk, two jobs overlap the waits of creating the output files. A
 profile of one job puts the time in the library's UTF-16 to UTF-8 encoder
 (18 %), the XML writer and file creation.
