@@ -175,6 +175,8 @@ const SunLightPtr& documentSun() {
     return sun;
 }
 
+void resetDocumentSun() { *documentSun() = SunLight(u"Default", documentSunId); }
+
 bool isDocumentSunId(const std::u16string& id) { return platform::iequals(id, documentSunId); }
 
 namespace {

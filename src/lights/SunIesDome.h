@@ -72,6 +72,10 @@ typedef boost::shared_ptr<SunLight> SunLightPtr;
 // sky record of the newest version replaces its settings in place.
 const SunLightPtr& documentSun();
 
+// Puts the document sun back into the state it has when the library is
+// loaded, in place: what a conversion sees first in a fresh process.
+void resetDocumentSun();
+
 // True if `id` is the document sun's id, ignoring case.
 bool isDocumentSunId(const std::u16string& id);
 

@@ -23,6 +23,10 @@ public:
 
     std::uint64_t blockCount() const override { return count_; }
     void fill(std::uint64_t index, char* block) const override;
+    std::uint64_t dataSize() const override {
+        const std::uint64_t blocks = count_ * QuickArchive::kBlockSize;
+        return length_ < blocks ? length_ : blocks;
+    }
 
 private:
     const platform::ByteSource& bytes_;

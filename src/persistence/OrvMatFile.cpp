@@ -10,6 +10,7 @@
 
 #include "persistence/FileBlocks.h"
 #include "persistence/QuickArchive.h"
+#include "persistence/Record.h"
 #include "platform/File.h"
 
 namespace OrvaneLumoCore {
@@ -55,11 +56,31 @@ public:
             const std::uint64_t next = convert(raw, block.get(), produced);
             if (produced == 0) break;
             starts_.push_back(raw);
+            total_ += produced;
             raw = next;
         }
     }
 
     std::uint64_t blockCount() const override { return starts_.size(); }
+    std::uint64_t dataSize() const override { return total_; }
+
+    // The file offset of byte `at` of the converted body: each CR LF pair in
+    // front of it counts two bytes of the file.
+    std::uint64_t fileOffset(std::uint64_t at) const {
+        const std::uint64_t index = at / kBlockSize;
+        if (index >= starts_.size()) return end_ + (at - total_);
+        std::uint64_t raw = starts_[index];
+        std::uint64_t seen = index * kBlockSize;
+        char buffer[2 * kBlockSize + 1];
+        const std::size_t got = bytes_.readAt(
+            raw, buffer, static_cast<std::size_t>(std::min<std::uint64_t>(sizeof buffer, end_ - raw)));
+        for (std::size_t i = 0; seen < at && i < got; ++seen) {
+            const bool pair = buffer[i] == '\r' && i + 1 < got && buffer[i + 1] == '\n';
+            i += pair ? 2 : 1;
+            raw += pair ? 2 : 1;
+        }
+        return raw + (at - seen);
+    }
 
     void fill(std::uint64_t index, char* block) const override {
         std::size_t produced = 0;
@@ -89,6 +110,7 @@ private:
     const platform::ByteSource& bytes_;
     std::uint64_t end_;
     std::vector<std::uint64_t> starts_;
+    std::uint64_t total_ = 0;
 };
 
 }  // namespace
@@ -103,26 +125,33 @@ std::string undoTextMode(const std::string& body) {
 }
 
 bool OrvMatFile::load(const platform::ByteSource& bytes) {
+    loadNote = LoadNote();
     std::uint32_t header[2] = {0, 0};
-    if (bytes.readAt(0, header, 8) != 8) return false;
+    if (bytes.readAt(0, header, 8) != 8)
+        return loadNote.fail(LoadRule::BadHeader, 0, 0, "file shorter than its 8-byte header");
     const std::uint32_t tag = header[0];
     const std::uint32_t count = header[1];
-    if (count == 0) return false;
-    if ((tag & 0xFFFF) != 0) return false;
+    if (count == 0) return loadNote.fail(LoadRule::BadHeader, 4, 0, "material count is 0");
+    if ((tag & 0xFFFF) != 0)
+        return loadNote.fail(LoadRule::BadHeader, 0, tag, "version tag with a low half");
 
     // The material stream behind the header, read block by block as the
     // materials reach it.
     const std::uint64_t size = std::max<std::uint64_t>(bytes.size(), 8);
     std::unique_ptr<QuickArchive::BlockSource> stream;
+    const TextModeBlocks* textMode = nullptr;  // version 1 only
+    std::uint64_t streamStart = 8;             // where the stream starts in the file
     switch (tag >> 16) {
         case 3: {
             // A block count and the blocks. A file that ends early ends the
             // list with the block it ends in, short or empty, zero-padded.
             std::uint32_t blockCount = 0;
-            if (bytes.readAt(8, &blockCount, 4) != 4 || blockCount == 0) return false;
+            if (bytes.readAt(8, &blockCount, 4) != 4 || blockCount == 0)
+                return loadNote.fail(LoadRule::BadHeader, 8, 0, "no blocks");
             const std::uint64_t body = size > 12 ? size - 12 : 0;
             stream.reset(new RangeBlocks(bytes, 12, body,
                                          std::min<std::uint64_t>(blockCount, body / kBlockSize + 1)));
+            streamStart = 12;
             break;
         }
         case 2:
@@ -130,23 +159,31 @@ bool OrvMatFile::load(const platform::ByteSource& bytes) {
             stream.reset(new RangeBlocks(bytes, 8, size - 8, RangeBlocks::blocksFor(size - 8)));
             break;
         case 1:
-            stream.reset(new TextModeBlocks(bytes, 8, size));
+            textMode = new TextModeBlocks(bytes, 8, size);
+            stream.reset(textMode);
             break;
         default:
-            return false;
+            return loadNote.fail(LoadRule::BadHeader, 0, tag, "unknown container version tag");
     }
     QuickArchive ar(*stream);
 
     // Every material takes at least its four-byte tag: a larger count can't
     // be real.
-    if (count > ar.bytesLeft()) return false;
+    if (count > ar.bytesLeft()) return loadNote.fail(LoadRule::CountTooLarge, 4, count);
     std::vector<MaterialPtr> loaded;
     for (std::uint32_t i = 0; i < count; ++i) {
+        const std::uint64_t at = ar.getReadPosition();
         std::uint32_t type = 0xFFFFFFFFu;
         ar.readUInt(type);
-        MaterialPtr material = createMaterial(type);
-        if (!material) return false;
-        if (!material->load(ar)) return false;
+        MaterialPtr material = createMember(ar, at, type, &createMaterial);
+        if (!material || !loadRecord(ar, *material, type)) {
+            // The note's offsets count bytes of the stream; the reader wants
+            // those of the file.
+            loadNote = ar.trace.note;
+            for (std::uint64_t* offset : {&loadNote.offset, &loadNote.reached, &loadNote.record.start})
+                *offset = textMode ? textMode->fileOffset(*offset) : streamStart + *offset;
+            return false;
+        }
         loaded.push_back(material);
     }
     materials.swap(loaded);
@@ -177,7 +214,11 @@ bool OrvMatFile::save(std::ostream& out) {
 
 bool OrvMatFile::load(const std::u16string& path) {
     platform::RegularFile file;
-    return file.open(path) && load(file);
+    if (!file.open(path)) {
+        loadNote = LoadNote();
+        return loadNote.fail(LoadRule::CannotOpen, 0);
+    }
+    return load(file);
 }
 
 bool OrvMatFile::save(const std::u16string& path) {

@@ -8,6 +8,7 @@
 #include <vector>
 
 #include "materials/BaseMaterial.h"
+#include "persistence/LoadNote.h"
 
 namespace platform {
 class ByteSource;
@@ -44,6 +45,8 @@ public:
     std::u16string getXml(std::u16string path);
 
     std::vector<MaterialPtr> materials;
+    // Why the last load failed, with offsets in the file.
+    LoadNote loadNote;
 };
 
 }  // namespace OrvaneLumoCore

@@ -5,22 +5,31 @@
 #include "options/AllOptions.h"
 #include "persistence/FileBlocks.h"
 #include "persistence/QuickArchive.h"
+#include "persistence/Record.h"
 #include "platform/File.h"
 
 namespace OrvaneLumoCore {
 
 bool OrvOptFile::load(AllOptions& options, const std::u16string& path) {
     platform::RegularFile file;
-    return file.open(path) && load(options, file);
+    if (!file.open(path)) {
+        loadNote = LoadNote();
+        return loadNote.fail(LoadRule::CannotOpen, 0);
+    }
+    return load(options, file);
 }
 
 bool OrvOptFile::load(AllOptions& options, const platform::ByteSource& bytes) {
-    if (bytes.size() < 1) return false;
+    loadNote = LoadNote();
+    if (bytes.size() < 1) return loadNote.fail(LoadRule::DataEndsEarly, 0);
     // The whole file is the archive; its blocks are read as the record
     // reaches them.
     const RangeBlocks blocks(bytes, 0, bytes.size(), RangeBlocks::blocksFor(bytes.size()));
     QuickArchive ar(blocks);
-    return options.load(ar);
+    // The file is the archive: its offsets are the file's.
+    const bool loaded = loadRecord(ar, options);
+    if (!loaded) loadNote = ar.trace.note;
+    return loaded;
 }
 
 bool OrvOptFile::save(AllOptions& options, const std::u16string& path) {

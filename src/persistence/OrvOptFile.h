@@ -3,6 +3,8 @@
 // no header of its own.
 #include <string>
 
+#include "persistence/LoadNote.h"
+
 namespace platform {
 class ByteSource;
 }
@@ -28,6 +30,9 @@ public:
     // The file at `path` as an "orvopt" document, or, if it doesn't load,
     // its text; the empty string if it can't be opened.
     std::u16string getXml(std::u16string path);
+
+    // Why the last load failed.
+    LoadNote loadNote;
 };
 
 }  // namespace OrvaneLumoCore

@@ -18,6 +18,7 @@
 #include <boost/array.hpp>
 #include <boost/shared_ptr.hpp>
 
+#include "persistence/LoadNote.h"
 #include "persistence/Types.h"
 
 namespace OrvaneLumoCore {
@@ -38,6 +39,9 @@ public:
         virtual std::uint64_t blockCount() const = 0;
         // Fills `block` (kBlockSize bytes) with block `index` < blockCount().
         virtual void fill(std::uint64_t index, char* block) const = 0;
+        // The bytes of data in the blocks; the rest of the last block is
+        // padding.
+        virtual std::uint64_t dataSize() const { return blockCount() * kBlockSize; }
     };
 
     explicit QuickArchive(std::size_t blockCount = 1);
@@ -112,8 +116,19 @@ public:
         return readPosition < total ? total - readPosition : 0;
     }
 
+    // Where the data ends: the source's data, else the bytes written, else
+    // the end of the last block.
+    std::uint64_t dataSize() const {
+        if (source) return source->dataSize();
+        if (writePosition > 0) return writePosition;
+        return static_cast<std::uint64_t>(blocks.size()) * kBlockSize;
+    }
+
     // Depth of nested member records being loaded; see persistence/Record.h.
     int nestingDepth = 0;
+    // Why a load from this archive failed, and the records being read; see
+    // persistence/LoadNote.h.
+    LoadTrace trace;
 
 private:
     void appendBlock();

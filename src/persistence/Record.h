@@ -3,6 +3,8 @@
 // of members held by shared pointers.
 #include <cstdint>
 #include <initializer_list>
+#include <typeinfo>
+#include <vector>
 
 #include <boost/shared_ptr.hpp>
 
@@ -18,13 +20,21 @@ inline void writeVersion(QuickArchive& ar, int version) { ar.writeUInt(versionTa
 
 // Reads a version tag. Returns the version if the low half is 0 and the
 // version lies in [minVersion, maxVersion], else -1. A tag behind the end of
-// the data reads as 0 and is refused unless 0 is accepted.
+// the data reads as 0 and is refused unless 0 is accepted. A refused tag is
+// noted on the archive; the first version accepted in a record is noted as
+// the record's own.
 inline int readVersion(QuickArchive& ar, int minVersion, int maxVersion) {
+    const std::uint64_t at = ar.getReadPosition();
     std::uint32_t tag = 0;
     ar.readUInt(tag);
-    if ((tag & 0xFFFF) != 0) return -1;
     const int v = static_cast<int>(tag >> 16);
-    return (v >= minVersion && v <= maxVersion) ? v : -1;
+    if ((tag & 0xFFFF) != 0 || v < minVersion || v > maxVersion) {
+        noteFailure(ar, LoadRule::VersionNotRead, at, tag);
+        return -1;
+    }
+    std::vector<RecordFrame>& open = ar.trace.open;
+    if (!open.empty() && open.back().version < 0) open.back().version = v;
+    return v;
 }
 
 // ---- counts --------------------------------------------------------------------
@@ -34,9 +44,12 @@ inline int readVersion(QuickArchive& ar, int minVersion, int maxVersion) {
 // it comes from damaged data, and loading it would only spin or fill memory.
 // Returns false for such a count.
 inline bool readCount(QuickArchive& ar, std::uint64_t& count) {
+    const std::uint64_t at = ar.getReadPosition();
     count = 0;
     ar.readLength(count);
-    return count <= ar.bytesLeft();
+    if (count <= ar.bytesLeft()) return true;
+    noteFailure(ar, LoadRule::CountTooLarge, at, count);
+    return false;
 }
 
 // ---- nesting -------------------------------------------------------------------
@@ -59,11 +72,36 @@ private:
     QuickArchive& ar_;
 };
 
+// Loads a record, with it on the archive's list of records being read; `tag`
+// is the type tag it was read under, if any.
+template <class T>
+bool loadRecord(QuickArchive& ar, T& record, std::int64_t tag = RecordFrame::kNoTag) {
+    RecordScope scope(ar, typeid(record), tag);
+    if (record.load(ar)) return true;
+    scope.noteRefusal();
+    return false;
+}
+
 // Loads a member's record one nesting level deeper.
 template <class T>
-bool loadNested(QuickArchive& ar, T& member) {
+bool loadNested(QuickArchive& ar, T& member, std::int64_t tag = RecordFrame::kNoTag) {
     NestingGuard guard(ar);
-    return guard.ok() && member.load(ar);
+    if (!guard.ok()) {
+        noteFailure(ar, LoadRule::NestingTooDeep, ar.getReadPosition(),
+                    static_cast<std::uint64_t>(ar.nestingDepth), &typeid(member));
+        return false;
+    }
+    return loadRecord(ar, member, tag);
+}
+
+// Creates a member through its family's factory; a tag without a class is
+// noted at `at`, where the tag stands.
+template <class T, class Tag>
+boost::shared_ptr<T> createMember(QuickArchive& ar, std::uint64_t at, std::uint32_t tag,
+                                  boost::shared_ptr<T> (*create)(Tag)) {
+    boost::shared_ptr<T> member = create(static_cast<Tag>(tag));
+    if (!member) noteFailure(ar, LoadRule::UnknownTag, at, tag, &typeid(T));
+    return member;
 }
 
 // ---- members held by shared pointers ---------------------------------------------
@@ -75,11 +113,12 @@ bool loadNested(QuickArchive& ar, T& member) {
 template <class T, class Tag>
 bool loadRequiredMember(QuickArchive& ar, boost::shared_ptr<T>& member,
                         boost::shared_ptr<T> (*create)(Tag)) {
+    const std::uint64_t at = ar.getReadPosition();
     std::uint32_t tag = 0xFFFFFFFFu;
     ar.readUInt(tag);
-    member = create(static_cast<Tag>(tag));
+    member = createMember(ar, at, tag, create);
     if (!member) return false;
-    return loadNested(ar, *member);
+    return loadNested(ar, *member, tag);
 }
 
 // Writes tag and record; a missing member makes the save fail.
@@ -114,13 +153,14 @@ template <class A, class TagA, class B, class TagB>
 bool loadPairedMembers(QuickArchive& ar, boost::shared_ptr<A>& first,
                        boost::shared_ptr<A> (*createFirst)(TagA), boost::shared_ptr<B>& second,
                        boost::shared_ptr<B> (*createSecond)(TagB)) {
+    const std::uint64_t at = ar.getReadPosition();
     std::uint32_t tagA = 0xFFFFFFFFu, tagB = 0xFFFFFFFFu;
     ar.readUInt(tagA);
     ar.readUInt(tagB);
-    first = createFirst(static_cast<TagA>(tagA));
-    second = createSecond(static_cast<TagB>(tagB));
+    first = createMember(ar, at, tagA, createFirst);
+    second = createMember(ar, at + 4, tagB, createSecond);
     if (!first || !second) return false;
-    return loadNested(ar, *first) && loadNested(ar, *second);
+    return loadNested(ar, *first, tagA) && loadNested(ar, *second, tagB);
 }
 
 template <class A, class B>

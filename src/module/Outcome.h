@@ -1,0 +1,44 @@
+#pragma once
+// A conversion that says how it went: the text the module returns for a file,
+// whether that text is a document, and, for the text road, why the file did
+// not load.
+#include <cstddef>
+#include <cstdint>
+#include <string>
+
+#include "persistence/LoadNote.h"
+
+namespace OrvaneLumoCore {
+
+enum class FileKind { Materials, Options };
+
+// The conversion that the path's extension picks, as the module's extension
+// test decides it; false for any other extension.
+bool kindOfPath(const std::u16string& path, FileKind& kind);
+
+enum class FileStatus {
+    Document,    // loaded and written as XML
+    Text,        // did not load; the text is the file's text
+    Unreadable,  // not a regular file, or it can't be opened
+};
+
+struct ConversionOutcome {
+    FileStatus status = FileStatus::Unreadable;
+    std::u16string text;        // what the module returns for the path
+    std::size_t items = 0;      // materials, or settings blocks, of a document
+    std::uint64_t fileSize = 0;
+    LoadNote note;              // why a file took the text road or is unreadable
+};
+
+// Converts the file at `path` as the first call in a fresh process would: the
+// document sun is put back to its start state first, so the result doesn't
+// depend on what was converted before. The text is byte for byte what
+// OrvMatFile::getXml or OrvOptFile::getXml returns then; a path that isn't a
+// regular file gives the empty text without being opened.
+ConversionOutcome convertFile(const std::u16string& path, FileKind kind);
+
+// One line on an outcome: "document, 3 materials, 12300 bytes" or
+// "text: <why>" or "unreadable: <why>".
+std::string explainOutcome(const ConversionOutcome& outcome, FileKind kind);
+
+}  // namespace OrvaneLumoCore

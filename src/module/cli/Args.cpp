@@ -1,0 +1,138 @@
+#include "module/cli/Args.h"
+
+#include <cstdlib>
+
+namespace orvxml {
+
+#ifndef ORVXML_VERSION
+#define ORVXML_VERSION "0.1.0"
+#endif
+
+const char kVersion[] = "orvxml " ORVXML_VERSION "\n";
+
+const char kUsage[] =
+    "Usage: orvxml [OPTION]... FILE\n"
+    "  or:  orvxml -o DIR [OPTION]... PATH...\n"
+    "  or:  orvxml --explain [OPTION]... PATH...\n"
+    "Convert material libraries (.orvmat, .lumat) and render options files\n"
+    "(.orvopt, .luopt) to XML, exactly as the PyOrvXml module does. A file that\n"
+    "doesn't load as binary comes back as its own text.\n"
+    "\n"
+    "Without -o the result goes to standard output as UTF-8. With -o each FILE\n"
+    "gives DIR/FILE.xml (a.orvmat gives a.orvmat.xml), and each folder is walked\n"
+    "and its content mirrored under DIR; files of other extensions in a folder\n"
+    "are skipped. Every file is converted as if it were the first in a fresh\n"
+    "process, so the results don't depend on the order of the files or on -j.\n"
+    "\n"
+    "  -o, --output=DIR   write one .xml file per input under DIR\n"
+    "  -j, --jobs=N       convert N files at a time (default: one per core)\n"
+    "      --explain      print one line per file: a document with its size, or\n"
+    "                     why the file fell back to text\n"
+    "      --report=FILE  write JSON Lines to FILE, one object per file: path,\n"
+    "                     kind, status, reason, characters, milliseconds\n"
+    "  -q, --quiet        print nothing but errors\n"
+    "  -h, --help         show this help and exit\n"
+    "      --version      show the version and exit\n"
+    "\n"
+    "Progress goes to standard error while it is a terminal; a summary line\n"
+    "(converted, fell back to text, unreadable) ends every run.\n"
+    "\n"
+    "Exit status: 0 if every file became a document, 1 if any file fell back to\n"
+    "text or could not be read (its text is still written), 2 for a usage error.\n";
+
+namespace {
+
+bool parseJobs(const std::string& text, unsigned& jobs) {
+    if (text.empty() || text.size() > 6) return false;
+    for (char c : text)
+        if (c < '0' || c > '9') return false;
+    const long n = std::strtol(text.c_str(), nullptr, 10);
+    if (n < 1) return false;
+    jobs = static_cast<unsigned>(n);
+    return true;
+}
+
+}  // namespace
+
+Parsed parseArgs(const std::vector<std::string>& args, Settings& s, std::string& error) {
+    bool optionsEnded = false;
+    for (std::size_t i = 0; i < args.size(); ++i) {
+        const std::string& a = args[i];
+        if (optionsEnded || a.size() < 2 || a[0] != '-') {
+            s.paths.push_back(a);
+            continue;
+        }
+        // The option's name and its value, from "--name=value", "--name value",
+        // "-xvalue" or "-x value".
+        std::string name = a, value;
+        bool hasValue = false;
+        if (a.compare(0, 2, "--") == 0) {
+            const std::size_t eq = a.find('=');
+            if (eq != std::string::npos) {
+                name = a.substr(0, eq);
+                value = a.substr(eq + 1);
+                hasValue = true;
+            }
+        } else if (a.size() > 2) {
+            name = a.substr(0, 2);
+            value = a.substr(2);
+            hasValue = true;
+        }
+        const bool takesValue = name == "-o" || name == "--output" || name == "-j" ||
+                                name == "--jobs" || name == "--report";
+        if (takesValue && !hasValue) {
+            if (i + 1 >= args.size()) {
+                error = "option " + name + " needs a value";
+                return Parsed::UsageError;
+            }
+            value = args[++i];
+        } else if (!takesValue && hasValue) {
+            error = (a.compare(0, 2, "--") == 0 ? "option " + name + " takes no value"
+                                                : "unknown option " + a);
+            return Parsed::UsageError;
+        }
+
+        if (name == "--") {
+            optionsEnded = true;
+        } else if (name == "-h" || name == "--help") {
+            return Parsed::Help;
+        } else if (name == "--version") {
+            return Parsed::Version;
+        } else if (name == "-q" || name == "--quiet") {
+            s.quiet = true;
+        } else if (name == "--explain") {
+            s.explain = true;
+        } else if (name == "-o" || name == "--output") {
+            if (value.empty()) {
+                error = "the output folder is empty";
+                return Parsed::UsageError;
+            }
+            s.outDir = value;
+        } else if (name == "--report") {
+            if (value.empty()) {
+                error = "the report file is empty";
+                return Parsed::UsageError;
+            }
+            s.reportPath = value;
+        } else if (name == "-j" || name == "--jobs") {
+            if (!parseJobs(value, s.jobs)) {
+                error = "--jobs needs a whole number from 1 on, not '" + value + "'";
+                return Parsed::UsageError;
+            }
+        } else {
+            error = "unknown option " + name;
+            return Parsed::UsageError;
+        }
+    }
+    if (s.paths.empty()) {
+        error = "no file given";
+        return Parsed::UsageError;
+    }
+    if (s.outDir.empty() && !s.explain && s.paths.size() > 1) {
+        error = "more than one path needs -o DIR (or --explain)";
+        return Parsed::UsageError;
+    }
+    return Parsed::Run;
+}
+
+}  // namespace orvxml

@@ -1,0 +1,41 @@
+#pragma once
+// Converting the jobs: one at a time in this process, or spread over worker
+// processes. The library keeps process-wide state (the document sun, the
+// scene's material table, the text converters' buffers) that isn't safe for
+// threads, so parallel conversions each get a process of their own.
+#include <cstddef>
+#include <cstdint>
+#include <cstdio>
+#include <functional>
+#include <string>
+#include <vector>
+
+#include "module/cli/Tree.h"
+
+namespace orvxml {
+
+struct FileResult {
+    OrvaneLumoCore::FileStatus status = OrvaneLumoCore::FileStatus::Unreadable;
+    std::uint64_t characters = 0;  // of the text, in code points
+    double milliseconds = 0;
+    std::string line;        // the --explain line, behind the path
+    std::string reason;      // why the file isn't a document; empty for one
+    std::string writeError;  // why the output couldn't be written; empty if it was
+};
+
+// Converts one job in this process: the output file gets the text as UTF-8,
+// or, if the job has none and `textOut` is given, the text goes there.
+FileResult runJob(const Job& job, std::FILE* textOut);
+
+typedef std::function<void(std::size_t index, const FileResult& result)> ResultSink;
+
+// Runs every job once, on up to `workers` processes, and hands each result
+// to `sink` in this process as it comes in. A worker that dies leaves its
+// file unreadable, with the signal as its reason; jobs no worker took are
+// run here.
+void runJobs(const std::vector<Job>& jobs, unsigned workers, const ResultSink& sink);
+
+// The text as UTF-8; a lone surrogate becomes U+FFFD.
+std::string toUtf8(const std::u16string& text);
+
+}  // namespace orvxml

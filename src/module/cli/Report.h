@@ -1,0 +1,45 @@
+#pragma once
+// What orvxml says about its files: the --explain lines, the JSON Lines of
+// --report, errors, the progress line and the summary.
+#include <chrono>
+#include <cstddef>
+#include <cstdio>
+#include <string>
+#include <vector>
+
+#include "module/cli/Jobs.h"
+
+namespace orvxml {
+
+// One JSON object on one line: path, kind, status, reason, characters,
+// milliseconds.
+std::string jsonLine(const Job& job, const FileResult& result);
+
+// Collects the results as they come in, in any order, and passes them on in
+// the order of the jobs, so that every output of a run is the same whatever
+// the number of workers.
+class Collector {
+public:
+    // `progress`: show the progress line on standard error (a terminal).
+    Collector(const std::vector<Job>& jobs, bool explain, bool quiet, bool progress, std::FILE* report);
+    void add(std::size_t index, const FileResult& result);
+    // Ends the progress line, prints the summary; returns the exit status.
+    int finish();
+
+private:
+    void emit(std::size_t index);
+    void showProgress(bool force);
+    void clearProgress();
+
+    const std::vector<Job>& jobs_;
+    const bool explain_, quiet_, progress_;
+    std::FILE* report_;
+    std::vector<FileResult> results_;
+    std::vector<bool> arrived_;
+    std::size_t next_ = 0, done_ = 0;
+    std::size_t documents_ = 0, texts_ = 0, unreadable_ = 0, notWritten_ = 0;
+    bool progressShown_ = false;
+    std::chrono::steady_clock::time_point start_, lastProgress_;
+};
+
+}  // namespace orvxml

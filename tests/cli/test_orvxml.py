@@ -1,0 +1,282 @@
+# -*- coding: utf-8 -*-
+"""The orvxml command end to end: output modes, folder trees, exit status,
+explanations, the report, and results that don't depend on order or --jobs.
+
+Standard library only; ORVXML names the binary, ORVXML_SOURCE_DIR the tree.
+"""
+import json
+import os
+import shutil
+import struct
+import subprocess
+import sys
+import tempfile
+import unittest
+
+ORVXML = os.environ.get('ORVXML', 'build/orvxml')
+EXAMPLES = os.path.join(os.environ.get('ORVXML_SOURCE_DIR', '.'), 'examples')
+
+
+def run(*args, **kwargs):
+    p = subprocess.Popen([ORVXML] + list(args), stdout=subprocess.PIPE,
+                         stderr=kwargs.pop('stderr', subprocess.PIPE), **kwargs)
+    out, err = p.communicate()
+    return p.returncode, out, (err or b'').decode('utf-8')
+
+
+def u32(*values):
+    return b''.join(struct.pack('<I', v) for v in values)
+
+
+def v2(count, stream):
+    """A material file of container version 2: header, then the stream."""
+    return u32(0x20000, count) + stream
+
+
+# A MaterialSingleBRDF (tag 0) record of version 2 up to its BRDF member's tag.
+SINGLE_HEAD = u32(0, 0x20000, 7, 8)
+# One MaterialMulti (tag 2) of version 2 that holds one member.
+MULTI_LEVEL = u32(2, 0x20000, 1)
+
+# Damaged files, one for each rule, and the start of the explanation.
+DAMAGED = [
+    ('header.orvmat', u32(0x40000, 1) + bytes(8),
+     'text: bad header at byte 0: unknown container version tag 0x00040000'),
+    ('tag.orvmat', v2(1, SINGLE_HEAD + u32(3) + bytes(8)),
+     'text: unknown type tag at byte 24, reading MaterialSingleBRDF (type tag 0, version 2) '
+     'from byte 12: Base_BRDF tag 3 has no class'),
+    ('version.orvmat', v2(1, SINGLE_HEAD + u32(2, 0x630000) + bytes(8)),
+     'text: record version not read at byte 28, reading Diffuse_BRDF (type tag 2) from byte 28: '
+     'version tag 0x00630000'),
+    ('count.orvmat', v2(1, u32(2, 0x20000, 5000) + bytes(8)),
+     'text: count larger than the bytes left at byte 16, reading MaterialMulti '
+     '(type tag 2, version 2) from byte 12: count 5000'),
+    ('nesting.orvmat', v2(1, MULTI_LEVEL * 258 + bytes(16)),
+     'text: nesting deeper than 256 at byte 3096, reading MaterialMulti (type tag 2, version 2) '
+     'from byte 3084: MaterialMulti at depth 257'),
+    ('short.orvmat', v2(1, SINGLE_HEAD)[:18],
+     'text: data ends early at byte 18, reading MaterialSingleBRDF (type tag 0, version 2) '
+     'from byte 12'),
+    ('options.luopt', u32(0x7F0001) + bytes(60),
+     'text: record version not read at byte 0, reading AllOptions from byte 0: '
+     'version tag 0x007f0001'),
+    ('missing.orvopt', None, 'unreadable: can\'t be opened: No such file or directory'),
+    ('pipe.orvmat', 'fifo', 'unreadable: not a regular file'),
+]
+
+
+class Tree(unittest.TestCase):
+    def setUp(self):
+        self.tmp = tempfile.mkdtemp(prefix='orvxml-cli-')
+
+    def tearDown(self):
+        shutil.rmtree(self.tmp)
+
+    def path(self, *parts):
+        return os.path.join(self.tmp, *parts)
+
+    def put(self, rel, data):
+        path = self.path(rel)
+        if not os.path.isdir(os.path.dirname(path)):
+            os.makedirs(os.path.dirname(path))
+        if data == 'fifo':
+            os.mkfifo(path)
+        elif data is not None:
+            with open(path, 'wb') as f:
+                f.write(data)
+        return path
+
+    def copy(self, example, rel):
+        with open(os.path.join(EXAMPLES, example), 'rb') as f:
+            return self.put(rel, f.read())
+
+    def files_under(self, root):
+        found = []
+        for folder, _, names in os.walk(root):
+            found += [os.path.relpath(os.path.join(folder, n), root) for n in names]
+        return sorted(found)
+
+    def read(self, path):
+        with open(path, 'rb') as f:
+            return f.read()
+
+
+class CommandLine(Tree):
+    def test_usage_errors_exit_2_with_a_message(self):
+        self.copy('notes.luopt', 'a.luopt')
+        os.mkdir(self.path('folder'))
+        for args in ([], ['--jobs', '0'], ['-j', 'x'], ['--bogus', 'a.orvmat'], ['-o'],
+                     ['--quiet=yes', 'a.orvmat'], [self.path('a.luopt'), self.path('a.luopt')],
+                     [self.path('folder')]):
+            code, out, err = run(*args)
+            self.assertEqual(code, 2, args)
+            self.assertEqual(out, b'', args)
+            self.assertTrue(err.startswith('orvxml: '), (args, err))
+
+    def test_help_and_version(self):
+        code, out, _ = run('--help')
+        self.assertEqual(code, 0)
+        self.assertTrue(out.startswith(b'Usage: orvxml '))
+        for option in (b'--output', b'--jobs', b'--explain', b'--report', b'--quiet', b'--version'):
+            self.assertIn(option, out)
+        code, out, _ = run('--version')
+        self.assertEqual(code, 0)
+        self.assertRegex(out.decode(), r'^orvxml \d+\.\d+')
+
+    def test_standard_output_is_the_text_alone(self):
+        code, out, err = run(os.path.join(EXAMPLES, 'materials_all_layers.orvmat'))
+        self.assertEqual(code, 0)
+        self.assertTrue(out.startswith(b'<orvmat>\n'))
+        self.assertTrue(out.endswith(b'</orvmat>\n'))
+        self.assertEqual(err, 'orvxml: 1 converted, 0 fell back to text, 0 unreadable' +
+                         err[err.index(' ('):])
+        # A text file comes back as its text, and the status says so.
+        text = self.put('note.orvopt', u'Render \u00e9t\u00e9\r\n'.encode('utf-8') + b'\0rest')
+        code, out, _ = run('-q', text)
+        self.assertEqual((code, out), (1, u'Render \u00e9t\u00e9\r\n'.encode('utf-8')))
+
+    def test_quiet_leaves_only_errors(self):
+        good = self.copy('render_settings.orvopt', 'good.orvopt')
+        self.assertEqual(run('-q', '-o', self.path('out'), good)[2], '')
+        code, _, err = run('-q', '-o', self.path('out'), good, self.path('gone.orvmat'))
+        self.assertEqual(code, 1)
+        self.assertEqual(err.splitlines(), [
+            'orvxml: %s: can\'t be opened: No such file or directory' % self.path('gone.orvmat')])
+
+    def test_progress_only_on_a_terminal(self):
+        tree = self.path('tree')
+        for i in range(30):
+            self.copy('materials_old_records_v2.orvmat', os.path.join('tree', '%02d.orvmat' % i))
+        code, _, err = run('-o', self.path('out'), tree)
+        self.assertEqual(code, 0)
+        self.assertEqual(len(err.splitlines()), 1)
+        self.assertNotIn('files/s', err)
+        try:
+            import pty
+            master, slave = pty.openpty()
+        except (ImportError, OSError):
+            self.skipTest('no pseudo terminal')
+        code, _, _ = run('-o', self.path('out2'), tree, stderr=slave)
+        os.close(slave)
+        shown = b''
+        try:
+            while True:
+                chunk = os.read(master, 4096)
+                if not chunk:
+                    break
+                shown += chunk
+        except OSError:
+            pass
+        os.close(master)
+        self.assertEqual(code, 0)
+        self.assertIn(b' of 30 files, ', shown)
+        self.assertIn(b'files/s', shown)
+        self.assertIn(b'30 converted, 0 fell back to text, 0 unreadable', shown)
+
+
+class Trees(Tree):
+    def test_folders_are_mirrored_and_other_files_skipped(self):
+        self.copy('materials_old_records_v2.orvmat', 'lib/a.orvmat')
+        self.copy('render_settings.orvopt', 'lib/sub/b.LUOPT')
+        self.copy('materials_old_records_v1.lumat', 'lib/sub/deeper/c.LuMat')
+        self.copy('notes.luopt', 'lib/notes.txt')
+        self.put('lib/sub/old.orvmat.xml', b'<x/>')
+        single = self.copy('old_settings_v4.luopt', 'single.luopt')
+        code, _, err = run('-o', self.path('out'), self.path('lib'), single)
+        self.assertEqual(code, 0, err)
+        self.assertEqual(self.files_under(self.path('out')), [
+            'a.orvmat.xml', 'single.luopt.xml', 'sub/b.LUOPT.xml', 'sub/deeper/c.LuMat.xml'])
+        _, alone, _ = run(self.path('lib/sub/b.LUOPT'))
+        self.assertEqual(self.read(self.path('out/sub/b.LUOPT.xml')), alone)
+
+    def test_exit_status_follows_the_worst_file(self):
+        good = self.copy('materials_old_records_v2.orvmat', 'good.orvmat')
+        text = self.copy('text_export.orvmat', 'text.orvmat')
+        other = self.copy('notes.luopt', 'notes.txt')
+        out = self.path('out')
+        self.assertEqual(run('-o', out, good)[0], 0)
+        code, _, err = run('-o', out, good, text)
+        self.assertEqual(code, 1)
+        self.assertIn('1 converted, 1 fell back to text, 0 unreadable', err)
+        # The text is written all the same, as the module returns it.
+        self.assertEqual(self.read(os.path.join(out, 'text.orvmat.xml')),
+                         self.read(text).split(b'\0')[0])
+        code, _, err = run('-o', out, good, other)
+        self.assertEqual(code, 1)
+        self.assertIn('notes.txt: not a .orvmat, .lumat, .orvopt or .luopt file', err)
+        self.assertIn('1 converted, 0 fell back to text, 1 unreadable', err)
+        self.assertFalse(os.path.exists(os.path.join(out, 'notes.txt.xml')))
+
+    def test_results_do_not_depend_on_order_or_jobs(self):
+        # The document sun examples change process-wide state; interleave them
+        # with other files so that each follows files of every kind.
+        names = ['textures_sky_document_sun_1.orvmat', 'textures_sky_document_sun_2.orvmat',
+                 'textures_sky_versions.orvmat', 'materials_folded_wrappers.orvmat',
+                 'render_settings.orvopt', 'text_export.orvmat']
+        inputs = []
+        for i in range(24):
+            name = names[i % len(names)]
+            inputs.append(self.copy(name, os.path.join('in', 'f%02d_%s' % (i, name))))
+        code, _, _ = run('-q', '--jobs', '2', '-o', self.path('two'), self.path('in'))
+        self.assertEqual(code, 1)  # text_export falls back to text
+        code, _, _ = run('-q', '--jobs', '1', '-o', self.path('one'), *reversed(inputs))
+        self.assertEqual(code, 1)
+        for path in inputs:
+            name = os.path.basename(path) + '.xml'
+            _, alone, _ = run(path)
+            self.assertEqual(self.read(self.path('two', name)), alone, name)
+            self.assertEqual(self.read(self.path('one', name)), alone, name)
+
+
+class Explanations(Tree):
+    def test_each_rule_is_explained(self):
+        paths = [self.put(os.path.join('bad', name), data) for name, data, _ in DAMAGED]
+        good = self.copy('materials_folded_wrappers.orvmat', 'good.orvmat')
+        code, out, _ = run('-q', '--explain', good, *paths)
+        self.assertEqual(code, 1)
+        lines = out.decode('utf-8').splitlines()
+        self.assertEqual(lines[0], good + ': document, 3 materials, 4108 bytes')
+        self.assertEqual(len(lines), 1 + len(DAMAGED))
+        for path, line, (_, _, expected) in zip(paths, lines[1:], DAMAGED):
+            self.assertEqual(line, path + ': ' + expected)
+
+    def test_explanations_of_a_walk_come_in_its_order(self):
+        for name, data, _ in DAMAGED[:6]:
+            self.put(os.path.join('bad', name), data)
+        one = run('-q', '-j', '1', '--explain', self.path('bad'))[1]
+        two = run('-q', '-j', '2', '--explain', self.path('bad'))[1]
+        self.assertEqual(one, two)
+        self.assertEqual(len(one.splitlines()), 6)
+
+
+class Report(Tree):
+    def test_one_json_object_per_file(self):
+        good = self.copy('render_settings.orvopt', 'in/good.orvopt')
+        text = self.copy('text_export.orvmat', 'in/text.orvmat')
+        version = self.put('in/version.orvmat', DAMAGED[2][1])
+        report = self.path('report.jsonl')
+        code, _, _ = run('-q', '-j', '2', '--report', report, '-o', self.path('out'),
+                         self.path('in'), self.path('in/missing.lumat'))
+        self.assertEqual(code, 1)
+        with open(report) as f:
+            rows = [json.loads(line) for line in f]
+        self.assertEqual([r['path'] for r in rows],
+                         [good, text, version, self.path('in/missing.lumat')])
+        for r in rows:
+            self.assertEqual(sorted(r), ['characters', 'kind', 'milliseconds', 'path', 'reason',
+                                         'status'])
+            self.assertGreaterEqual(r['milliseconds'], 0)
+        self.assertEqual([(r['kind'], r['status']) for r in rows],
+                         [('options', 'document'), ('materials', 'text'), ('materials', 'text'),
+                          ('materials', 'unreadable')])
+        self.assertIsNone(rows[0]['reason'])
+        self.assertTrue(rows[2]['reason'].startswith('record version not read at byte 28'))
+        self.assertEqual(rows[3]['reason'], 'can\'t be opened: No such file or directory')
+        for r, name in zip(rows[:2], ('good.orvopt.xml', 'text.orvmat.xml')):
+            written = self.read(self.path('out', name)).decode('utf-8')
+            self.assertEqual(r['characters'], len(written))
+        self.assertEqual(rows[2]['characters'], 0)
+
+
+if __name__ == '__main__':
+    unittest.main()
