@@ -8,6 +8,7 @@
 #include <boost/make_shared.hpp>
 
 #include "lights/BaseLight.h"
+#include "persistence/FamilyOf.h"
 #include "persistence/FieldRows.h"
 #include "persistence/Record.h"
 #include "xml/AssetXmlWriter.h"
@@ -15,26 +16,10 @@
 namespace OrvaneLumoCore {
 
 // Base of a light class `Derived` with type tag `Tag`. The class's defaults
-// are its member initialisers: `reset` assigns a new default object, and
-// `clone` copies (lights hold no shared children).
+// are its member initialisers, so the family's `reset` serves, and `clone`
+// copies (lights hold no shared children).
 template <class Derived, std::uint32_t Tag>
-class LightOf : public BaseLight {
-public:
-    static constexpr std::uint32_t kType = Tag;
-
-    std::uint32_t getType() const override { return Tag; }
-    LightPtr clone() const override { return boost::make_shared<Derived>(self()); }
-    void reset() override { static_cast<Derived&>(*this) = Derived(); }
-
-protected:
-    const Derived& self() const { return static_cast<const Derived&>(*this); }
-
-    // `other` as a Derived, or null if it is null or of another class.
-    const Derived* sameClass(const LightPtr& other) const {
-        if (!other || other->getType() != Tag) return nullptr;
-        return static_cast<const Derived*>(other.get());
-    }
-};
+using LightOf = FamilyOf<Derived, Tag, BaseLight>;
 
 // Resets `light` and reads a version tag of 1 to `newest`, then the fields
 // of `rows` that the version holds. Returns the version, or -1 for a tag

@@ -223,9 +223,8 @@ bool MayaDirectLight::load(QuickArchive& ar) {
     return true;
 }
 
-bool MayaDirectLight::isEqual(const LightPtr& other) const {
-    const Dir* o = sameClass(other);
-    return o && fieldsEqual(*this, *o, kDirectRecord) && transform == o->transform;
+bool MayaDirectLight::sameContent(const MayaDirectLight& o) const {
+    return fieldsEqual(*this, o, kDirectRecord) && transform == o.transform;
 }
 
 void MayaDirectLight::writeXml(AssetXmlWriter& writer, std::u16string url) {
@@ -241,9 +240,8 @@ bool OmniLight::save(QuickArchive& ar) const {
 
 bool OmniLight::load(QuickArchive& ar) { return loadFlatRecord(*this, ar, kOmniRecord, kNewest) > 0; }
 
-bool OmniLight::isEqual(const LightPtr& other) const {
-    const OmniLight* o = sameClass(other);
-    return o && fieldsEqual(*this, *o, kOmniRecord);
+bool OmniLight::sameContent(const OmniLight& o) const {
+    return fieldsEqual(*this, o, kOmniRecord);
 }
 
 void OmniLight::writeXml(AssetXmlWriter& writer, std::u16string url) {
@@ -259,9 +257,8 @@ bool SpotLight::save(QuickArchive& ar) const {
 
 bool SpotLight::load(QuickArchive& ar) { return loadFlatRecord(*this, ar, kSpotRecord, kNewest) > 0; }
 
-bool SpotLight::isEqual(const LightPtr& other) const {
-    const SpotLight* o = sameClass(other);
-    return o && fieldsEqual(*this, *o, kSpotRecord);
+bool SpotLight::sameContent(const SpotLight& o) const {
+    return fieldsEqual(*this, o, kSpotRecord);
 }
 
 void SpotLight::writeXml(AssetXmlWriter& writer, std::u16string url) {
@@ -283,9 +280,8 @@ bool RectangleLight::load(QuickArchive& ar) {
     return loadFlatRecord(*this, ar, kRectangleRecord, kNewest) > 0;
 }
 
-bool RectangleLight::isEqual(const LightPtr& other) const {
-    const RectLight* o = sameClass(other);
-    return o && fieldsEqual(*this, *o, kRectangleRecord);
+bool RectangleLight::sameContent(const RectangleLight& o) const {
+    return fieldsEqual(*this, o, kRectangleRecord);
 }
 
 void RectangleLight::writeXml(AssetXmlWriter& writer, std::u16string url) {
@@ -322,16 +318,15 @@ bool SphereLight::load(QuickArchive& ar) {
     return true;
 }
 
-bool SphereLight::isEqual(const LightPtr& other) const {
-    const SphereLight* o = sameClass(other);
-    if (!o || transform != o->transform || color != o->color || shadowColor != o->shadowColor)
+bool SphereLight::sameContent(const SphereLight& o) const {
+    if (transform != o.transform || color != o.color || shadowColor != o.shadowColor)
         return false;
     for (int k = 0; k < kRealCount; ++k)
-        if (reals[k] != o->reals[k]) return false;
+        if (reals[k] != o.reals[k]) return false;
     for (int k = 0; k < kIntCount; ++k)
-        if (ints[k] != o->ints[k]) return false;
+        if (ints[k] != o.ints[k]) return false;
     for (int k = 0; k < kFlagCount; ++k)
-        if (flags[k] != o->flags[k]) return false;
+        if (flags[k] != o.flags[k]) return false;
     return true;
 }
 

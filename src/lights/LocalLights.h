@@ -15,7 +15,7 @@ class MayaDirectLight : public LightOf<MayaDirectLight, 0> {
 public:
     bool save(QuickArchive& ar) const override;
     bool load(QuickArchive& ar) override;
-    bool isEqual(const LightPtr& other) const override;
+    bool sameContent(const MayaDirectLight& o) const;
     void writeXml(AssetXmlWriter& writer, std::u16string url) override;
     std::u16string getPluginName() const override { return u"MayaLightDirect"; }
 
@@ -64,7 +64,7 @@ class OmniLight : public LightOf<OmniLight, 2>, public PointLightFields {
 public:
     bool save(QuickArchive& ar) const override;
     bool load(QuickArchive& ar) override;
-    bool isEqual(const LightPtr& other) const override;
+    bool sameContent(const OmniLight& o) const;
     void writeXml(AssetXmlWriter& writer, std::u16string url) override;
     std::u16string getPluginName() const override { return u"LightOmni"; }
 
@@ -75,7 +75,7 @@ class SpotLight : public LightOf<SpotLight, 4>, public PointLightFields {
 public:
     bool save(QuickArchive& ar) const override;
     bool load(QuickArchive& ar) override;
-    bool isEqual(const LightPtr& other) const override;
+    bool sameContent(const SpotLight& o) const;
     void writeXml(AssetXmlWriter& writer, std::u16string url) override;
     std::u16string getPluginName() const override { return u"LightSpot"; }
 
@@ -93,7 +93,7 @@ class RectangleLight : public LightOf<RectangleLight, 3>, public PlacedLightFiel
 public:
     bool save(QuickArchive& ar) const override;
     bool load(QuickArchive& ar) override;
-    bool isEqual(const LightPtr& other) const override;
+    bool sameContent(const RectangleLight& o) const;
     void writeXml(AssetXmlWriter& writer, std::u16string url) override;
     std::u16string getPluginName() const override { return u"LightRectangle"; }
 
@@ -121,7 +121,7 @@ public:
 
     bool save(QuickArchive& ar) const override;
     bool load(QuickArchive& ar) override;
-    bool isEqual(const LightPtr& other) const override;
+    bool sameContent(const SphereLight& o) const;
 
     Color color{1, 1, 1};
     Color shadowColor{0, 0, 0};

@@ -144,16 +144,13 @@ bool SunLight::load(QuickArchive& ar) {
     return true;
 }
 
-LightPtr SunLight::clone() const {
-    boost::shared_ptr<SunLight> copy = boost::make_shared<SunLight>(*this);
-    copy->id = platform::newUuidString();
-    return copy;
+void SunLight::finishClone() {
+    id = platform::newUuidString();
 }
 
-bool SunLight::isEqual(const LightPtr& other) const {
-    const SunLight* o = sameClass(other);
-    return o && id == o->id && name == o->name && transform == o->transform &&
-           sunSettingsEqual(*this, *o) && enabled == o->enabled && invisible == o->invisible;
+bool SunLight::sameContent(const SunLight& o) const {
+    return id == o.id && name == o.name && transform == o.transform &&
+           sunSettingsEqual(*this, o) && enabled == o.enabled && invisible == o.invisible;
 }
 
 void SunLight::writeXml(AssetXmlWriter& writer, std::u16string url) {
@@ -192,9 +189,8 @@ bool IESLight::save(QuickArchive& ar) const {
 
 bool IESLight::load(QuickArchive& ar) { return loadFlatRecord(*this, ar, kIesRecord, kIesNewest) > 0; }
 
-bool IESLight::isEqual(const LightPtr& other) const {
-    const IESLight* o = sameClass(other);
-    return o && fieldsEqual(*this, *o, kIesRecord);
+bool IESLight::sameContent(const IESLight& o) const {
+    return fieldsEqual(*this, o, kIesRecord);
 }
 
 void IESLight::writeXml(AssetXmlWriter& writer, std::u16string url) {

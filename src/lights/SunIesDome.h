@@ -47,10 +47,10 @@ public:
 
     bool save(QuickArchive& ar) const override;
     bool load(QuickArchive& ar) override;
-    // A copy with a new id.
-    LightPtr clone() const override;
+    // A copy gets a new id.
+    void finishClone();
     // Id and name compare exactly.
-    bool isEqual(const LightPtr& other) const override;
+    bool sameContent(const SunLight& o) const;
 
     // Writes the sun once per writer and records its url in the writer's
     // sunRegistry. An empty url stands for "/" and the id; the document sun
@@ -80,7 +80,7 @@ public:
     bool save(QuickArchive& ar) const override;
     bool load(QuickArchive& ar) override;
     // The file path compares without regard to case.
-    bool isEqual(const LightPtr& other) const override;
+    bool sameContent(const IESLight& o) const;
     void writeXml(AssetXmlWriter& writer, std::u16string url) override;
     std::u16string getPluginName() const override { return u"LightIES"; }
 
@@ -108,7 +108,7 @@ public:
     bool save(QuickArchive& ar) const override;
     // Reads the version tag that `save` writes.
     bool load(QuickArchive& ar) override;
-    bool isEqual(const LightPtr& other) const override { return sameClass(other) != nullptr; }
+    bool sameContent(const DomeLight&) const { return true; }
 };
 
 }  // namespace OrvaneLumoCore

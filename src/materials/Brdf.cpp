@@ -180,15 +180,12 @@ bool loadRows(L& layer, QuickArchive& ar, const LayerTable<L>& table, bool empty
 // Every field of the current record but the base record: textures through
 // their own isEqual, colours per component, numbers exactly.
 template <class L>
-bool fieldsEqual(const L& a, const BrdfPtr& other, const LayerTable<L>& table) {
-    if (!other || other->getType() != a.getType()) return false;
-    const L* b = dynamic_cast<const L*>(other.get());
-    if (!b) return false;
+bool fieldsEqual(const L& a, const L& b, const LayerTable<L>& table) {
     for (const Row<L>& row : table.records[table.currentVersion]) {
         bool same = true;
         switch (row.kind) {
-        case RowKind::Field: same = row.field->equal(a, *b); break;
-        case RowKind::Texture: same = childrenEqual(a.*row.texture, b->*row.texture); break;
+        case RowKind::Field: same = row.field->equal(a, b); break;
+        case RowKind::Texture: same = childrenEqual(a.*row.texture, b.*row.texture); break;
         default: break;
         }
         if (!same) return false;
@@ -602,15 +599,9 @@ bool Glass_BRDF::load(QuickArchive& ar) {
     return loadRows(*this, ar, glassTable(), false);
 }
 
-BrdfPtr Glass_BRDF::clone() const {
-    boost::shared_ptr<Glass_BRDF> copy(new Glass_BRDF(*this));
-    cloneSlots(*copy, glassTable());
-    return copy;
-}
+void Glass_BRDF::finishClone() { cloneSlots(*this, glassTable()); }
 
-bool Glass_BRDF::isEqual(const BrdfPtr& other) const {
-    return fieldsEqual(*this, other, glassTable());
-}
+bool Glass_BRDF::sameContent(const Glass_BRDF& o) const { return fieldsEqual(*this, o, glassTable()); }
 
 void Glass_BRDF::writeXml(AssetXmlWriter& writer, std::u16string url) {
     writeLayer(*this, writer, url, glassTable());
@@ -647,31 +638,17 @@ bool BaseGlossy_BRDF::load(QuickArchive& ar) {
     return loadRows(*this, ar, glossyTable(), true);
 }
 
-void BaseGlossy_BRDF::cloneTextures() { cloneSlots(*this, glossyTable()); }
+void BaseGlossy_BRDF::finishClone() { cloneSlots(*this, glossyTable()); }
 
-bool BaseGlossy_BRDF::isEqual(const BrdfPtr& other) const {
-    return fieldsEqual(*this, other, glossyTable());
-}
+bool BaseGlossy_BRDF::sameContent(const BaseGlossy_BRDF& o) const { return fieldsEqual(*this, o, glossyTable()); }
 
 void BaseGlossy_BRDF::writeXml(AssetXmlWriter& writer, std::u16string url) {
     writeLayer(*this, writer, url, glossyTable());
 }
 
-Phong_BRDF::Phong_BRDF() { reset(); }
+Phong_BRDF::Phong_BRDF() { BaseGlossy_BRDF::reset(); }
 
-BrdfPtr Phong_BRDF::clone() const {
-    boost::shared_ptr<Phong_BRDF> copy(new Phong_BRDF(*this));
-    copy->cloneTextures();
-    return copy;
-}
-
-Blinn_BRDF::Blinn_BRDF() { reset(); }
-
-BrdfPtr Blinn_BRDF::clone() const {
-    boost::shared_ptr<Blinn_BRDF> copy(new Blinn_BRDF(*this));
-    copy->cloneTextures();
-    return copy;
-}
+Blinn_BRDF::Blinn_BRDF() { BaseGlossy_BRDF::reset(); }
 
 // ---- Mirror_BRDF -----------------------------------------------------------------------
 
@@ -696,15 +673,9 @@ bool Mirror_BRDF::load(QuickArchive& ar) {
     return loadRows(*this, ar, mirrorTable(), true);
 }
 
-BrdfPtr Mirror_BRDF::clone() const {
-    boost::shared_ptr<Mirror_BRDF> copy(new Mirror_BRDF(*this));
-    cloneSlots(*copy, mirrorTable());
-    return copy;
-}
+void Mirror_BRDF::finishClone() { cloneSlots(*this, mirrorTable()); }
 
-bool Mirror_BRDF::isEqual(const BrdfPtr& other) const {
-    return fieldsEqual(*this, other, mirrorTable());
-}
+bool Mirror_BRDF::sameContent(const Mirror_BRDF& o) const { return fieldsEqual(*this, o, mirrorTable()); }
 
 void Mirror_BRDF::writeXml(AssetXmlWriter& writer, std::u16string url) {
     writeLayer(*this, writer, url, mirrorTable());
@@ -732,15 +703,9 @@ bool Diffuse_BRDF::load(QuickArchive& ar) {
     return loadRows(*this, ar, diffuseTable(), false);
 }
 
-BrdfPtr Diffuse_BRDF::clone() const {
-    boost::shared_ptr<Diffuse_BRDF> copy(new Diffuse_BRDF(*this));
-    cloneSlots(*copy, diffuseTable());
-    return copy;
-}
+void Diffuse_BRDF::finishClone() { cloneSlots(*this, diffuseTable()); }
 
-bool Diffuse_BRDF::isEqual(const BrdfPtr& other) const {
-    return fieldsEqual(*this, other, diffuseTable());
-}
+bool Diffuse_BRDF::sameContent(const Diffuse_BRDF& o) const { return fieldsEqual(*this, o, diffuseTable()); }
 
 void Diffuse_BRDF::writeXml(AssetXmlWriter& writer, std::u16string url) {
     writeLayer(*this, writer, url, diffuseTable());
@@ -770,15 +735,9 @@ bool Light_BRDF::load(QuickArchive& ar) {
     return loadRows(*this, ar, lightTable(), false);
 }
 
-BrdfPtr Light_BRDF::clone() const {
-    boost::shared_ptr<Light_BRDF> copy(new Light_BRDF(*this));
-    cloneSlots(*copy, lightTable());
-    return copy;
-}
+void Light_BRDF::finishClone() { cloneSlots(*this, lightTable()); }
 
-bool Light_BRDF::isEqual(const BrdfPtr& other) const {
-    return fieldsEqual(*this, other, lightTable());
-}
+bool Light_BRDF::sameContent(const Light_BRDF& o) const { return fieldsEqual(*this, o, lightTable()); }
 
 void Light_BRDF::writeXml(AssetXmlWriter& writer, std::u16string url) {
     writeLayer(*this, writer, url, lightTable());

@@ -77,26 +77,23 @@ bool FresnelTexture::load(QuickArchive& ar) {
            loadOptionalMember(ar, refract_ior_tex, createTexture);
 }
 
-TexturePtr FresnelTexture::clone() const {
-    boost::shared_ptr<FresnelTexture> copy(new FresnelTexture(*this));
-    copy->reflection_tex = cloneChild(reflection_tex);
-    copy->refraction_tex = cloneChild(refraction_tex);
-    copy->fresnel_ior_tex = cloneChild(fresnel_ior_tex);
-    copy->refract_ior_tex = cloneChild(refract_ior_tex);
-    return copy;
+void FresnelTexture::finishClone() {
+    reflection_tex = cloneChild(reflection_tex);
+    refraction_tex = cloneChild(refraction_tex);
+    fresnel_ior_tex = cloneChild(fresnel_ior_tex);
+    refract_ior_tex = cloneChild(refract_ior_tex);
 }
 
-bool FresnelTexture::isEqual(const TexturePtr& other) const {
-    const FresnelTexture* o = sameClass(*this, other);
-    return o && childrenEqual(reflection_tex, o->reflection_tex) &&
-           childrenEqual(refraction_tex, o->refraction_tex) &&
-           childrenEqual(fresnel_ior_tex, o->fresnel_ior_tex) &&
-           childrenEqual(refract_ior_tex, o->refract_ior_tex) && whiteInverse == o->whiteInverse &&
-           blackInverse == o->blackInverse && fresnel_ior == o->fresnel_ior &&
-           refract_ior == o->refract_ior && black_color_tex_mult == o->black_color_tex_mult &&
-           white_color_tex_mult == o->white_color_tex_mult &&
-           fresnel_ior_tex_mult == o->fresnel_ior_tex_mult &&
-           refract_ior_tex_mult == o->refract_ior_tex_mult;
+bool FresnelTexture::sameContent(const FresnelTexture& o) const {
+    return childrenEqual(reflection_tex, o.reflection_tex) &&
+           childrenEqual(refraction_tex, o.refraction_tex) &&
+           childrenEqual(fresnel_ior_tex, o.fresnel_ior_tex) &&
+           childrenEqual(refract_ior_tex, o.refract_ior_tex) && whiteInverse == o.whiteInverse &&
+           blackInverse == o.blackInverse && fresnel_ior == o.fresnel_ior &&
+           refract_ior == o.refract_ior && black_color_tex_mult == o.black_color_tex_mult &&
+           white_color_tex_mult == o.white_color_tex_mult &&
+           fresnel_ior_tex_mult == o.fresnel_ior_tex_mult &&
+           refract_ior_tex_mult == o.refract_ior_tex_mult;
 }
 
 void FresnelTexture::writeXml(AssetXmlWriter& w, std::u16string url) {
@@ -155,18 +152,15 @@ bool BlendTexture::load(QuickArchive& ar) {
     return true;
 }
 
-TexturePtr BlendTexture::clone() const {
-    boost::shared_ptr<BlendTexture> copy(new BlendTexture(*this));
-    copy->color_a = cloneChild(color_a);
-    copy->color_b = cloneChild(color_b);
-    return copy;
+void BlendTexture::finishClone() {
+    color_a = cloneChild(color_a);
+    color_b = cloneChild(color_b);
 }
 
-bool BlendTexture::isEqual(const TexturePtr& other) const {
-    const BlendTexture* o = sameClass(*this, other);
-    return o && childrenEqual(color_a, o->color_a) && childrenEqual(color_b, o->color_b) &&
-           colorAMult == o->colorAMult && colorBMult == o->colorBMult &&
-           blend_amount == o->blend_amount;
+bool BlendTexture::sameContent(const BlendTexture& o) const {
+    return childrenEqual(color_a, o.color_a) && childrenEqual(color_b, o.color_b) &&
+           colorAMult == o.colorAMult && colorBMult == o.colorBMult &&
+           blend_amount == o.blend_amount;
 }
 
 void BlendTexture::writeXml(AssetXmlWriter& w, std::u16string url) {
@@ -203,15 +197,12 @@ bool InvertTexture::load(QuickArchive& ar) {
     return true;
 }
 
-TexturePtr InvertTexture::clone() const {
-    boost::shared_ptr<InvertTexture> copy(new InvertTexture(*this));
-    copy->texture = cloneChild(texture);
-    return copy;
+void InvertTexture::finishClone() {
+    texture = cloneChild(texture);
 }
 
-bool InvertTexture::isEqual(const TexturePtr& other) const {
-    const InvertTexture* o = sameClass(*this, other);
-    return o && childrenEqual(texture, o->texture) && invert_alpha == o->invert_alpha;
+bool InvertTexture::sameContent(const InvertTexture& o) const {
+    return childrenEqual(texture, o.texture) && invert_alpha == o.invert_alpha;
 }
 
 void InvertTexture::writeXml(AssetXmlWriter& w, std::u16string url) {
@@ -240,11 +231,8 @@ bool AColorTexture::load(QuickArchive& ar) {
     return true;
 }
 
-TexturePtr AColorTexture::clone() const { return TexturePtr(new AColorTexture(*this)); }
-
-bool AColorTexture::isEqual(const TexturePtr& other) const {
-    const AColorTexture* o = sameClass(*this, other);
-    return o && color == o->color;
+bool AColorTexture::sameContent(const AColorTexture& o) const {
+    return color == o.color;
 }
 
 void AColorTexture::writeXml(AssetXmlWriter& w, std::u16string url) {

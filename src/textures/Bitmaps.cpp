@@ -38,12 +38,9 @@ bool BitmapBuffer::load(QuickArchive& ar) {
     return true;
 }
 
-BitmapPtr BitmapBuffer::clone() const { return BitmapPtr(new BitmapBuffer(*this)); }
-
-bool BitmapBuffer::isEqual(const BitmapPtr& other) const {
-    const BitmapBuffer* o = sameClass(*this, other);
-    return o && platform::iequals(file, o->file) && filter_type == o->filter_type &&
-           filter_blur == o->filter_blur && gamma == o->gamma;
+bool BitmapBuffer::sameContent(const BitmapBuffer& o) const {
+    return platform::iequals(file, o.file) && filter_type == o.filter_type &&
+           filter_blur == o.filter_blur && gamma == o.gamma;
 }
 
 void BitmapBuffer::writeXml(AssetXmlWriter& w, std::u16string url) {
@@ -80,16 +77,13 @@ bool BitmapTexture::load(QuickArchive& ar) {
     return true;
 }
 
-TexturePtr BitmapTexture::clone() const {
-    boost::shared_ptr<BitmapTexture> copy(new BitmapTexture(*this));
-    copy->uvw = cloneChild(uvw);
-    copy->bitmap = cloneChild(bitmap);
-    return copy;
+void BitmapTexture::finishClone() {
+    uvw = cloneChild(uvw);
+    bitmap = cloneChild(bitmap);
 }
 
-bool BitmapTexture::isEqual(const TexturePtr& other) const {
-    const BitmapTexture* o = sameClass(*this, other);
-    return o && childrenEqual(uvw, o->uvw) && childrenEqual(bitmap, o->bitmap) && tile == o->tile;
+bool BitmapTexture::sameContent(const BitmapTexture& o) const {
+    return childrenEqual(uvw, o.uvw) && childrenEqual(bitmap, o.bitmap) && tile == o.tile;
 }
 
 void BitmapTexture::writeXml(AssetXmlWriter& w, std::u16string url) {
