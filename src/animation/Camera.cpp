@@ -4,7 +4,7 @@
 
 #include "persistence/QuickArchive.h"
 #include "persistence/Record.h"
-#include "xml/AssetXmlWriter.h"
+#include "xml/AssetScope.h"
 
 namespace OrvaneLumoCore {
 
@@ -232,14 +232,10 @@ bool RenderView::load(QuickArchive& ar) {
 
 void RenderView::writeXml(AssetXmlWriter& writer, std::u16string url) {
     const std::u16string assetUrl = url + u"/" + getPluginName();
-    writer.openAsset(assetUrl, "settings", "");
-    writer.openPlugin(getPluginName(), "settings");
-    writer.openParameters();
-    writer.writeInteger("img_width", img_width);
-    writer.writeInteger("img_height", img_height);
-    writer.closeParameters();
-    writer.closePlugin();
-    writer.closeAsset();
+    writeAsset(writer, assetUrl, "settings", getPluginName(), [&] {
+        writer.writeInteger("img_width", img_width);
+        writer.writeInteger("img_height", img_height);
+    });
 }
 
 bool RenderView::operator==(const RenderView& o) const {

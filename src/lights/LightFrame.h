@@ -11,7 +11,7 @@
 #include "persistence/FamilyOf.h"
 #include "persistence/FieldRows.h"
 #include "persistence/Record.h"
-#include "xml/AssetXmlWriter.h"
+#include "xml/AssetScope.h"
 
 namespace OrvaneLumoCore {
 
@@ -45,13 +45,7 @@ void saveFlatRecord(const L& light, QuickArchive& ar, const RecordRow<L> (&rows)
 template <class WriteParams>
 void writeLightAsset(AssetXmlWriter& w, const std::u16string& url, const std::u16string& plugin,
                      WriteParams writeParams) {
-    w.openAsset(url, "light", "");
-    w.openPlugin(plugin, "light");
-    w.openParameters();
-    writeParams();
-    w.closeParameters();
-    w.closePlugin();
-    w.closeAsset();
+    writeAsset(w, url, "light", plugin, writeParams);
 }
 
 }  // namespace OrvaneLumoCore

@@ -17,7 +17,7 @@
 #include "platform/WideChar.h"
 #include "textures/Bitmaps.h"
 #include "textures/BasicTextures.h"
-#include "xml/AssetXmlWriter.h"
+#include "xml/AssetScope.h"
 
 namespace OrvaneLumoCore {
 
@@ -221,9 +221,7 @@ void writeLayer(const L& layer, AssetXmlWriter& writer, std::u16string url,
         const TexturePtr& texture = layer.*slot.texture;
         if (texture) texture->writeXml(writer, slotPrefix + slot.word);
     }
-    writer.openAsset(url, layer.getAssetType(), "");
-    writer.openPlugin(layer.getPluginName(), layer.getAssetType());
-    writer.openParameters();
+    openPluginAsset(writer, url, layer.getAssetType(), layer.getPluginName(), "");
     for (const Param<L>& p : table.params) {
         if (auto f = std::get_if<FieldRef<L>>(&p.field)) {
             f->writeParam(writer, p.name, "", false, layer);
@@ -235,9 +233,7 @@ void writeLayer(const L& layer, AssetXmlWriter& writer, std::u16string url,
             writer.writeBool(p.name, layer.*i->integer != 0);
         }
     }
-    writer.closeParameters();
-    writer.closePlugin();
-    writer.closeAsset();
+    closePluginAsset(writer);
 }
 
 const RowKind kBase = RowKind::BaseRecord;

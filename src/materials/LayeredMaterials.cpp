@@ -2,7 +2,7 @@
 
 #include "persistence/QuickArchive.h"
 #include "persistence/Record.h"
-#include "xml/AssetXmlWriter.h"
+#include "xml/AssetScope.h"
 
 namespace OrvaneLumoCore {
 
@@ -127,9 +127,7 @@ void MaterialLayeredBRDF::writeLayerAssets(AssetXmlWriter& writer,
 }
 
 void MaterialLayeredBRDF::openMainAsset(AssetXmlWriter& writer, const std::u16string& url) const {
-    writer.openAsset(url, getAssetType(), "deflumat");
-    writer.openPlugin(getPluginName(), getAssetType());
-    writer.openParameters();
+    openPluginAsset(writer, url, getAssetType(), getPluginName(), "deflumat");
 }
 
 void MaterialLayeredBRDF::writeOwnParameters(AssetXmlWriter& writer,

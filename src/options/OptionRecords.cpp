@@ -6,7 +6,7 @@
 #include "options/RecordRows.h"
 #include "persistence/QuickArchive.h"
 #include "persistence/Record.h"
-#include "xml/AssetXmlWriter.h"
+#include "xml/AssetScope.h"
 
 namespace OrvaneLumoCore {
 
@@ -320,9 +320,7 @@ void OrvaneFrameData::reset() { rows::resetRows(static_cast<LumoFrameData&>(*thi
 
 void OrvaneFrameData::writeXml(AssetXmlWriter& writer, std::u16string url) {
     const LumoFrameData& data = *this;
-    writer.openAsset(url + u"/" + getPluginName(), getAssetType(), u"");
-    writer.openPlugin(getPluginName(), getAssetType());
-    writer.openParameters();
+    openPluginAsset(writer, url + u"/" + getPluginName(), getAssetType(), getPluginName());
     for (const rows::Row<F>& r : kFrameRows) {
         if (!r.ownXml) continue;
         switch (r.enc) {
@@ -339,9 +337,7 @@ void OrvaneFrameData::writeXml(AssetXmlWriter& writer, std::u16string url) {
         default: break;
         }
     }
-    writer.closeParameters();
-    writer.closePlugin();
-    writer.closeAsset();
+    closePluginAsset(writer);
 }
 
 // ---- OrvaneLFBStampInfo ----------------------------------------------------------------
