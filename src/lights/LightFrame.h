@@ -10,6 +10,7 @@
 #include "lights/BaseLight.h"
 #include "persistence/FamilyOf.h"
 #include "persistence/FieldRows.h"
+#include "xml/ParamRows.h"
 #include "persistence/Record.h"
 #include "xml/AssetScope.h"
 

@@ -12,6 +12,7 @@
 #include <boost/any.hpp>
 
 #include "persistence/FieldRows.h"
+#include "xml/ParamRows.h"
 #include "persistence/QuickArchive.h"
 #include "persistence/Record.h"
 #include "platform/WideChar.h"
@@ -224,7 +225,7 @@ void writeLayer(const L& layer, AssetXmlWriter& writer, std::u16string url,
     openPluginAsset(writer, url, layer.getAssetType(), layer.getPluginName(), "");
     for (const Param<L>& p : table.params) {
         if (auto f = std::get_if<FieldRef<L>>(&p.field)) {
-            f->writeParam(writer, p.name, "", false, layer);
+            writeParam(writer, ParamRow<L>{p.name, *f}, layer);
         } else if (auto t = std::get_if<TexturePtr L::*>(&p.field)) {
             writer.writePluginRef(p.name, boost::any(layer.**t), slotPrefix + slotWord(*t, table));
         } else if (auto r = std::get_if<FromReflection<L>>(&p.field)) {

@@ -3,9 +3,9 @@
 //
 // A `RecordRow` names a plain field of a class by its member pointer and the
 // versions of the record that hold it; `readFields` and `writeFields` walk a
-// table in order, so a class's table reads like its record. A `ParamRow`
-// names an XML parameter and the field it shows; `writeParams` writes a
-// table in order with the form that follows from the field's type.
+// table in order, so a class's table reads like its record. The XML
+// parameters that show such fields are described beside the writer, in
+// xml/ParamRows.h.
 //
 // The encoding of a field follows from its type: bool as bool8, int32 as
 // i32, float as f32, Color as color, AColor as acolor, Vector as vector,
@@ -15,11 +15,11 @@
 #include <cstddef>
 #include <cstdint>
 #include <string>
+#include <type_traits>
 
 #include "persistence/QuickArchive.h"
 #include "persistence/Types.h"
 #include "platform/WideChar.h"
-#include "xml/AssetXmlWriter.h"
 
 namespace OrvaneLumoCore {
 
@@ -88,20 +88,17 @@ public:
         return false;
     }
 
-    // The parameter form of the field's type; text goes out as `string`.
-    void writeParam(AssetXmlWriter& w, const char* name, const WriterText& label, bool isUserData,
-                    const C& obj) const {
-        switch (kind_) {
-            case Kind::Bool: w.writeBool(name, obj.*b_, label, isUserData); break;
-            case Kind::Int: w.writeInteger(name, obj.*i_, label, isUserData); break;
-            case Kind::Float: w.writeFloat(name, obj.*f_, label, isUserData); break;
-            case Kind::Color: w.writeColor(name, obj.*c_, label); break;
-            case Kind::AColor: w.writeAColor(name, obj.*a_, label); break;
-            case Kind::Vector: w.writeVector(name, obj.*v_, label); break;
-            case Kind::Transform: w.writeTransform(name, obj.*t_, label); break;
-            case Kind::WString: w.writeString(name, obj.*s_, label, isUserData); break;
-            case Kind::Path: w.writeFileName(name, obj.*s_, label, isUserData); break;
-        }
+    // The field in `obj`; T is the type of the field's kind (std::u16string for a path).
+    template <class T>
+    const T& get(const C& obj) const {
+        if constexpr (std::is_same<T, bool>::value) return obj.*b_;
+        else if constexpr (std::is_same<T, std::int32_t>::value) return obj.*i_;
+        else if constexpr (std::is_same<T, float>::value) return obj.*f_;
+        else if constexpr (std::is_same<T, Color>::value) return obj.*c_;
+        else if constexpr (std::is_same<T, AColor>::value) return obj.*a_;
+        else if constexpr (std::is_same<T, Vector>::value) return obj.*v_;
+        else if constexpr (std::is_same<T, Transform>::value) return obj.*t_;
+        else return obj.*s_;
     }
 
 private:
@@ -168,20 +165,6 @@ bool fieldsEqual(const C& x, const C& y, const Rows& rows) {
     for (const RecordRow<C>& row : rows)
         if (!row.field.equal(x, y)) return false;
     return true;
-}
-
-// One XML parameter that shows a field. An empty label shows the name.
-template <class C>
-struct ParamRow {
-    const char* name;
-    FieldRef<C> field;
-    const char* label = "";
-    bool isUserData = false;
-};
-
-template <class C, class Rows>
-void writeParams(AssetXmlWriter& w, const C& obj, const Rows& rows) {
-    for (const ParamRow<C>& row : rows) row.field.writeParam(w, row.name, row.label, row.isUserData, obj);
 }
 
 }  // namespace OrvaneLumoCore

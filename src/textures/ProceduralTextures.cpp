@@ -8,7 +8,7 @@
 #include "persistence/Record.h"
 #include "textures/BasicTextures.h"
 #include "textures/TextureFrame.h"
-#include "xml/AssetXmlWriter.h"
+#include "xml/ParamRows.h"
 
 namespace OrvaneLumoCore {
 
