@@ -63,4 +63,11 @@ struct Rect {
     bool operator!=(const Rect& o) const { return !(*this == o); }
 };
 
+// A transform whose offset is kept in double precision; records hold it as a
+// transform of f32.
+struct TransformD {
+    Matrix m;
+    double offs[3];
+};
+
 }  // namespace OrvaneLumoCore

@@ -3,8 +3,9 @@
 //
 // A `ParamRow` names a parameter and the field it shows (a FieldRef of
 // persistence/FieldRows.h); `writeParams` writes a table in order, each in the
-// form that follows from the field's type: bool, integer, float, color,
-// acolor, vector, transform, string, and a file name for a path.
+// form that follows from the field's type: bool, integer, float (a double
+// narrowed), color, acolor, vector, transform (a TransformD's offset
+// narrowed), string, and a file name for a path.
 #include "persistence/FieldRows.h"
 #include "xml/AssetXmlWriter.h"
 
@@ -26,15 +27,20 @@ void writeParam(AssetXmlWriter& w, const ParamRow<C>& row, const C& obj) {
     const char* name = row.name;
     const WriterText label(row.label);
     switch (f.kind()) {
-        case Kind::Bool: w.writeBool(name, f.template get<bool>(obj), label, row.isUserData); break;
+        case Kind::Bool:
+        case Kind::Bool32: w.writeBool(name, f.template get<bool>(obj), label, row.isUserData); break;
         case Kind::Int: w.writeInteger(name, f.template get<std::int32_t>(obj), label, row.isUserData); break;
         case Kind::Float: w.writeFloat(name, f.template get<float>(obj), label, row.isUserData); break;
+        case Kind::Double: w.writeFloat(name, static_cast<float>(f.template get<double>(obj)), label, row.isUserData); break;
         case Kind::Color: w.writeColor(name, f.template get<Color>(obj), label); break;
         case Kind::AColor: w.writeAColor(name, f.template get<AColor>(obj), label); break;
         case Kind::Vector: w.writeVector(name, f.template get<Vector>(obj), label); break;
         case Kind::Transform: w.writeTransform(name, f.template get<Transform>(obj), label); break;
+        case Kind::TransformD: w.writeTransform(name, FieldRef<C>::narrowed(f.template get<TransformD>(obj)), label); break;
         case Kind::WString: w.writeString(name, f.template get<std::u16string>(obj), label, row.isUserData); break;
         case Kind::Path: w.writeFileName(name, f.template get<std::u16string>(obj), label, row.isUserData); break;
+        case Kind::NarrowText: w.writeString(name, f.template get<std::string>(obj), label, row.isUserData); break;
+        case Kind::None: break;
     }
 }
 
