@@ -286,8 +286,8 @@ struct RowsOf {
     static R forcedI32(std::int32_t C::*m, std::int32_t value, int since = 0) {
         return row(m, value, since, RowUse::Forced);
     }
-    static R hook(int code, int since = 0, FieldRef<C> f = FieldRef<C>()) {
-        R r = row(f, 0, since, RowUse::Hook);
+    static R hook(int code, int since = 0, FieldRef<C> f = FieldRef<C>(), double def = 0) {
+        R r = row(f, def, since, RowUse::Hook);
         r.hook = code;
         return r;
     }
