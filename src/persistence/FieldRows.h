@@ -27,11 +27,15 @@
 #include <string>
 #include <type_traits>
 
+#include <boost/shared_ptr.hpp>
+
 #include "persistence/QuickArchive.h"
 #include "persistence/Types.h"
 #include "platform/WideChar.h"
 
 namespace OrvaneLumoCore {
+
+class BaseTexture;
 
 // A field of class C, of one of the types above; or none, for rows whose
 // bytes belong to no field.
@@ -40,7 +44,7 @@ class FieldRef {
 public:
     enum class Kind {
         None, Bool, Bool32, Int, Float, Double, Color, AColor, Vector, Transform, TransformD,
-        WString, Path, NarrowText
+        WString, Path, NarrowText, Texture
     };
 
     // Not explicit: a table row is written with the bare member pointer. The
@@ -58,6 +62,9 @@ public:
     constexpr FieldRef(TransformD C::*m) : kind_(Kind::TransformD), td_(m) {}
     constexpr FieldRef(std::u16string C::*m) : kind_(Kind::WString), s_(m) {}
     constexpr FieldRef(std::string C::*m) : kind_(Kind::NarrowText), n_(m) {}
+    // A texture child: its bytes and its comparison are the class's code
+    // (a hook row), since they depend on the texture family.
+    constexpr FieldRef(boost::shared_ptr<BaseTexture> C::*m) : kind_(Kind::Texture), x_(m) {}
     static constexpr FieldRef path(std::u16string C::*m) { return FieldRef(Kind::Path, m); }
     static constexpr FieldRef bool32(bool C::*m) { return FieldRef(Kind::Bool32, m); }
     // The bytes of `kind` that belong to no field (constant and dropped rows).
@@ -67,7 +74,8 @@ public:
 
     void read(QuickArchive& ar, C& obj) const {
         switch (kind_) {
-            case Kind::None: break;
+            case Kind::None:
+            case Kind::Texture: break;
             case Kind::Bool: ar.readByte(obj.*b_); break;
             case Kind::Bool32: {
                 std::int32_t flag = (obj.*b_) ? 1 : 0;
@@ -105,7 +113,8 @@ public:
 
     void write(QuickArchive& ar, const C& obj) const {
         switch (kind_) {
-            case Kind::None: break;
+            case Kind::None:
+            case Kind::Texture: break;
             case Kind::Bool: ar.writeByte(obj.*b_); break;
             case Kind::Bool32: ar.writeInt(obj.*b_ ? 1 : 0); break;
             case Kind::Int: ar.writeInt(obj.*i_); break;
@@ -142,6 +151,7 @@ public:
             case Kind::WString: return x.*s_ == y.*s_;
             case Kind::Path: return platform::iequals(x.*s_, y.*s_);
             case Kind::NarrowText: return x.*n_ == y.*n_;
+            case Kind::Texture: return x.*x_ == y.*x_;
         }
         return false;
     }
@@ -169,6 +179,7 @@ public:
             case Kind::WString:
             case Kind::Path: (obj.*s_).clear(); break;
             case Kind::NarrowText: (obj.*n_).clear(); break;
+            case Kind::Texture: (obj.*x_).reset(); break;
         }
     }
 
@@ -186,6 +197,7 @@ public:
         else if constexpr (std::is_same<T, Transform>::value) return obj.*t_;
         else if constexpr (std::is_same<T, TransformD>::value) return obj.*td_;
         else if constexpr (std::is_same<T, std::string>::value) return obj.*n_;
+        else if constexpr (std::is_same<T, boost::shared_ptr<BaseTexture>>::value) return obj.*x_;
         else return obj.*s_;
     }
     template <class T>
@@ -216,6 +228,7 @@ private:
         TransformD C::*td_;
         std::u16string C::*s_;
         std::string C::*n_;
+        boost::shared_ptr<BaseTexture> C::*x_;
     };
 };
 
@@ -231,12 +244,27 @@ enum class RowUse : std::uint8_t {
     Hook,     // the class's own code, given `hook`; the field, if any, is the hook's
 };
 
+// The code number of a hook row that has no field, for tables written as
+// lists: {&C::count, RowHook{kBaseRecord}}.
+struct RowHook {
+    int code;
+};
+
 // One row of a record: the field, the versions `since` to `until` that hold
 // it, its default (`number`, or `color` for colours) and its use. A row
-// written as {&C::field} or {&C::field, since} is a plain field whose default
-// lies elsewhere (the class's member initialisers or its reset).
+// written as &C::field, {&C::field, since} or {&C::field, since, until} is a
+// plain field whose default lies elsewhere (the class's member initialisers or
+// its reset); a texture child is a hook row with code 0.
 template <class C>
 struct RecordRow {
+    RecordRow() = default;
+    template <class M>
+    RecordRow(M C::*m, int first = 1, int last = kLastVersion) : RecordRow(FieldRef<C>(m), first, last) {}
+    RecordRow(FieldRef<C> f, int first = 1, int last = kLastVersion) : field(f), since(first), until(last) {
+        if (f.kind() == FieldRef<C>::Kind::Texture) use = RowUse::Hook;
+    }
+    RecordRow(RowHook h) : use(RowUse::Hook), hook(h.code) {}
+
     FieldRef<C> field;
     int since = 1;
     int until = kLastVersion;

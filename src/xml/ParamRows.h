@@ -11,13 +11,16 @@
 
 namespace OrvaneLumoCore {
 
-// One XML parameter that shows a field. An empty label shows the name.
+// One XML parameter that shows a field. An empty label shows the name. A
+// parameter in a form of its own (a reference to a child's Asset, a value
+// derived from the field) names a nonzero `hook`: the class's code writes it.
 template <class C>
 struct ParamRow {
     const char* name;
     FieldRef<C> field;
     const char* label = "";
     bool isUserData = false;
+    int hook = 0;
 };
 
 template <class C>
@@ -40,13 +43,25 @@ void writeParam(AssetXmlWriter& w, const ParamRow<C>& row, const C& obj) {
         case Kind::WString: w.writeString(name, f.template get<std::u16string>(obj), label, row.isUserData); break;
         case Kind::Path: w.writeFileName(name, f.template get<std::u16string>(obj), label, row.isUserData); break;
         case Kind::NarrowText: w.writeString(name, f.template get<std::string>(obj), label, row.isUserData); break;
-        case Kind::None: break;
+        case Kind::None:
+        case Kind::Texture: break;
     }
 }
 
 template <class C, class Rows>
 void writeParams(AssetXmlWriter& w, const C& obj, const Rows& rows) {
     for (const ParamRow<C>& row : rows) writeParam(w, row, obj);
+}
+
+// The same; a row with a hook, or one that shows a texture, goes to `hook(row)`.
+template <class C, class Rows, class Hook>
+void writeParams(AssetXmlWriter& w, const C& obj, const Rows& rows, Hook hook) {
+    for (const ParamRow<C>& row : rows) {
+        if (row.hook != 0 || row.field.kind() == FieldRef<C>::Kind::Texture)
+            hook(row);
+        else
+            writeParam(w, row, obj);
+    }
 }
 
 }  // namespace OrvaneLumoCore
