@@ -30,6 +30,7 @@
 #include <boost/shared_ptr.hpp>
 
 #include "persistence/QuickArchive.h"
+#include "persistence/Record.h"
 #include "persistence/Types.h"
 #include "platform/WideChar.h"
 
@@ -427,6 +428,25 @@ bool fieldsEqual(const C& x, const C& y, const Rows& rows) {
         if (hasField && !row.field.equal(x, y)) return false;
     }
     return true;
+}
+
+// A flat record: resets `obj` and reads a version tag of 1 to `newest`, then
+// the rows that the version holds. Returns the version, or -1 for a tag that
+// isn't listed.
+template <class C, class Rows>
+int loadFlatRecord(C& obj, QuickArchive& ar, const Rows& rows, int newest) {
+    obj.reset();
+    const int v = readVersion(ar, 1, newest);
+    if (v < 0) return -1;
+    readFields(ar, obj, rows, v);
+    return v;
+}
+
+// Writes the tag of version `newest` and the rows of that version.
+template <class C, class Rows>
+void saveFlatRecord(const C& obj, QuickArchive& ar, const Rows& rows, int newest) {
+    writeVersion(ar, newest);
+    writeFields(ar, obj, rows, newest);
 }
 
 // A table held elsewhere, for descriptions that gather several tables.

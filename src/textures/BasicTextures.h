@@ -13,11 +13,8 @@ namespace OrvaneLumoCore {
 // as their complements; XML writes them back as max(0, 1 - c).
 class FresnelTexture : public FamilyOf<FresnelTexture, 1, BaseTexture> {
 public:
-    FresnelTexture() { reset(); }
-
     bool save(QuickArchive& ar) const override;
     bool load(QuickArchive& ar) override;
-    void reset() override;
     void finishClone();
     bool sameContent(const FresnelTexture& o) const;
     void writeXml(AssetXmlWriter& writer, std::u16string url) override;
@@ -27,14 +24,14 @@ public:
     TexturePtr refraction_tex;
     TexturePtr fresnel_ior_tex;
     TexturePtr refract_ior_tex;
-    Color whiteInverse;
-    Color blackInverse;
-    float fresnel_ior;
-    float refract_ior;
-    float black_color_tex_mult;
-    float white_color_tex_mult;
-    float fresnel_ior_tex_mult;
-    float refract_ior_tex_mult;
+    Color whiteInverse{1, 1, 1};
+    Color blackInverse{0x1.050506p-2f, 0x1.050506p-2f, 0x1.050506p-2f};  // 0.25490198
+    float fresnel_ior = 1.55f;
+    float refract_ior = 1.55f;
+    float black_color_tex_mult = 1.0f;
+    float white_color_tex_mult = 1.0f;
+    float fresnel_ior_tex_mult = 1.0f;
+    float refract_ior_tex_mult = 1.0f;
 };
 
 // Mixes two textures by a fixed amount.
@@ -77,17 +74,16 @@ public:
 // A constant colour with alpha.
 class AColorTexture : public FamilyOf<AColorTexture, 5, BaseTexture> {
 public:
-    AColorTexture() { reset(); }
+    AColorTexture() = default;
     explicit AColorTexture(const AColor& c) : color(c) {}
 
     bool save(QuickArchive& ar) const override;
     bool load(QuickArchive& ar) override;
-    void reset() override;
     bool sameContent(const AColorTexture& o) const;
     void writeXml(AssetXmlWriter& writer, std::u16string url) override;
     std::u16string getPluginName() const override { return u"TexAColor"; }
 
-    AColor color;
+    AColor color{1, 1, 1, 1};
 };
 
 }  // namespace OrvaneLumoCore

@@ -4,7 +4,8 @@
 #include "persistence/Record.h"
 #include "platform/WideChar.h"
 #include "textures/TextureFrame.h"
-#include "xml/AssetXmlWriter.h"
+#include "persistence/FieldRows.h"
+#include "xml/ParamRows.h"
 
 namespace OrvaneLumoCore {
 
@@ -12,44 +13,35 @@ const char16_t* const kFilterLabels[3] = {u"No filter", u"Mip-map", u"Summed-are
 
 // ---- BitmapBuffer --------------------------------------------------------------
 
-void BitmapBuffer::reset() {
-    file.clear();
-    filter_type = 1;
-    filter_blur = 0.15f;
-    gamma = 1.0f;
-}
+typedef BitmapBuffer B;
+
+const RecordRow<B> kBufferRecord[] = {
+    &B::filter_type,
+    &B::filter_blur,
+    &B::gamma,
+    FieldRef<B>::path(&B::file),
+};
+
+const ParamRow<B> kBufferParams[] = {
+    {"filter_type", &B::filter_type},
+    {"filter_blur", &B::filter_blur},
+    {"gamma", &B::gamma},
+    {"file", FieldRef<B>::path(&B::file)},
+};
 
 bool BitmapBuffer::save(QuickArchive& ar) const {
-    writeVersion(ar, 1);
-    ar.writeInt(filter_type);
-    ar.writeFloat(filter_blur);
-    ar.writeFloat(gamma);
-    ar.writeWString(file);
+    saveFlatRecord(*this, ar, kBufferRecord, 1);
     return true;
 }
 
-bool BitmapBuffer::load(QuickArchive& ar) {
-    reset();
-    if (readVersion(ar, 1, 1) < 0) return false;
-    ar.readInt(filter_type);
-    ar.readFloat(filter_blur);
-    ar.readFloat(gamma);
-    ar.readWString(file);
-    return true;
-}
+bool BitmapBuffer::load(QuickArchive& ar) { return loadFlatRecord(*this, ar, kBufferRecord, 1) > 0; }
 
-bool BitmapBuffer::sameContent(const BitmapBuffer& o) const {
-    return platform::iequals(file, o.file) && filter_type == o.filter_type &&
-           filter_blur == o.filter_blur && gamma == o.gamma;
-}
+bool BitmapBuffer::sameContent(const BitmapBuffer& o) const { return fieldsEqual(*this, o, kBufferRecord); }
 
 void BitmapBuffer::writeXml(AssetXmlWriter& w, std::u16string url) {
     TextureFrame frame(w, *this, url);
     frame.open();
-    w.writeInteger("filter_type", filter_type);
-    w.writeFloat("filter_blur", filter_blur);
-    w.writeFloat("gamma", gamma);
-    w.writeFileName("file", file);
+    writeParams(w, *this, kBufferParams);
     frame.close();
 }
 

@@ -13,19 +13,16 @@ namespace OrvaneLumoCore {
 
 class BitmapBuffer : public FamilyOf<BitmapBuffer, 0, BaseBitmap> {
 public:
-    BitmapBuffer() { reset(); }
-
     bool save(QuickArchive& ar) const override;
     bool load(QuickArchive& ar) override;
-    void reset() override;
     bool sameContent(const BitmapBuffer& o) const;  // `file` ignores case
     void writeXml(AssetXmlWriter& writer, std::u16string url) override;
     std::u16string getPluginName() const override { return u"BitmapBuffer"; }
 
     std::u16string file;
-    std::int32_t filter_type;  // index into kFilterLabels
-    float filter_blur;
-    float gamma;
+    std::int32_t filter_type = 1;  // index into kFilterLabels
+    float filter_blur = 0.15f;
+    float gamma = 1.0f;
 };
 
 // Display names of the filter types, by `filter_type`; XML writes the index.
