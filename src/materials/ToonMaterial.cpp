@@ -144,26 +144,19 @@ bool MaterialToon::load(QuickArchive& ar) {
     return true;
 }
 
-MaterialPtr MaterialToon::copyWith(bool newName) const {
-    boost::shared_ptr<MaterialToon> c = copyOf(*this, newName);
-    c->base_mtl = copyChild(base_mtl, true);
-    for (const ToonTexture& t : kToonTextures) (*c).*t.field = cloneChild(this->*t.field);
-    return c;
+void MaterialToon::copyChildren(bool newName) {
+    base_mtl = copyChild(base_mtl, true);
+    for (const ToonTexture& t : kToonTextures) this->*t.field = cloneChild(this->*t.field);
 }
 
-MaterialPtr MaterialToon::duplicate() const { return copyWith(true); }
-
-MaterialPtr MaterialToon::clone() const { return copyWith(false); }
-
-bool MaterialToon::isEqual(const MaterialPtr& other) const {
-    const MaterialToon* o = sameClass(*this, other);
-    if (!o || !childrenEqual(base_mtl, o->base_mtl) || lineColor != o->lineColor) return false;
+bool MaterialToon::sameContent(const MaterialToon& o) const {
+    if (!childrenEqual(base_mtl, o.base_mtl) || lineColor != o.lineColor) return false;
     for (const ToonTexture& t : kToonTextures)
-        if (!childrenEqual(this->*t.field, o->*t.field)) return false;
+        if (!childrenEqual(this->*t.field, o.*t.field)) return false;
     for (const ToonFloat& f : kToonFloats)
-        if (this->*f.field != o->*f.field) return false;
+        if (this->*f.field != o.*f.field) return false;
     for (const ToonBool& b : kToonBools)
-        if (this->*b.field != o->*b.field) return false;
+        if (this->*b.field != o.*b.field) return false;
     return true;
 }
 

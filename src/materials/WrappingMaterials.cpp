@@ -73,25 +73,18 @@ bool MaterialOverrideEnvironment::load(QuickArchive& ar) {
     return true;
 }
 
-MaterialPtr MaterialOverrideEnvironment::copyWith(bool newName) const {
-    boost::shared_ptr<MaterialOverrideEnvironment> c = copyOf(*this, newName);
-    c->base_mtl = copyChild(base_mtl, newName);
-    for (const EnvironmentGroup& g : kEnvironmentRecordOrder) (*c).*g.tex = cloneChild(this->*g.tex);
-    return c;
+void MaterialOverrideEnvironment::copyChildren(bool newName) {
+    base_mtl = copyChild(base_mtl, newName);
+    for (const EnvironmentGroup& g : kEnvironmentRecordOrder) this->*g.tex = cloneChild(this->*g.tex);
 }
 
-MaterialPtr MaterialOverrideEnvironment::duplicate() const { return copyWith(true); }
-
-MaterialPtr MaterialOverrideEnvironment::clone() const { return copyWith(false); }
-
-bool MaterialOverrideEnvironment::isEqual(const MaterialPtr& other) const {
-    const MaterialOverrideEnvironment* o = sameClass(*this, other);
-    if (!o || !childrenEqual(base_mtl, o->base_mtl)) return false;
+bool MaterialOverrideEnvironment::sameContent(const MaterialOverrideEnvironment& o) const {
+    if (!childrenEqual(base_mtl, o.base_mtl)) return false;
     for (const EnvironmentGroup& g : kEnvironmentRecordOrder)
-        if (!childrenEqual(this->*g.tex, o->*g.tex)) return false;
+        if (!childrenEqual(this->*g.tex, o.*g.tex)) return false;
     for (const EnvironmentGroup& g : kEnvironmentRecordOrder)
-        if (this->*g.color != o->*g.color || this->*g.mult != o->*g.mult ||
-            this->*g.override_ != o->*g.override_)
+        if (this->*g.color != o.*g.color || this->*g.mult != o.*g.mult ||
+            this->*g.override_ != o.*g.override_)
             return false;
     return true;
 }
@@ -152,26 +145,19 @@ bool MaterialDisplaced::load(QuickArchive& ar) {
     return true;
 }
 
-MaterialPtr MaterialDisplaced::copyWith(bool newName) const {
-    boost::shared_ptr<MaterialDisplaced> c = copyOf(*this, newName);
-    c->base_mtl = copyChild(base_mtl, newName);
-    c->displace_tex = cloneChild(displace_tex);
-    return c;
+void MaterialDisplaced::copyChildren(bool newName) {
+    base_mtl = copyChild(base_mtl, newName);
+    displace_tex = cloneChild(displace_tex);
 }
 
-MaterialPtr MaterialDisplaced::duplicate() const { return copyWith(true); }
-
-MaterialPtr MaterialDisplaced::clone() const { return copyWith(false); }
-
-bool MaterialDisplaced::isEqual(const MaterialPtr& other) const {
-    const MaterialDisplaced* o = sameClass(*this, other);
-    return o && childrenEqual(base_mtl, o->base_mtl) && childrenEqual(displace_tex, o->displace_tex) &&
-           displace_tex_mult == o->displace_tex_mult && displace_shift == o->displace_shift &&
-           displace_edge_length == o->displace_edge_length &&
-           displace_max_subdivs == o->displace_max_subdivs &&
-           displace_continuity == o->displace_continuity &&
-           displace_view_dependent == o->displace_view_dependent &&
-           displace_use_globals == o->displace_use_globals;
+bool MaterialDisplaced::sameContent(const MaterialDisplaced& o) const {
+    return childrenEqual(base_mtl, o.base_mtl) && childrenEqual(displace_tex, o.displace_tex) &&
+           displace_tex_mult == o.displace_tex_mult && displace_shift == o.displace_shift &&
+           displace_edge_length == o.displace_edge_length &&
+           displace_max_subdivs == o.displace_max_subdivs &&
+           displace_continuity == o.displace_continuity &&
+           displace_view_dependent == o.displace_view_dependent &&
+           displace_use_globals == o.displace_use_globals;
 }
 
 void MaterialDisplaced::writeXml(AssetXmlWriter& writer, std::u16string url) {
@@ -219,23 +205,16 @@ bool MaterialObjectExclusion::load(QuickArchive& ar) {
     return true;
 }
 
-MaterialPtr MaterialObjectExclusion::copyWith(bool newName) const {
-    boost::shared_ptr<MaterialObjectExclusion> c = copyOf(*this, newName);
-    c->base_mtl = copyChild(base_mtl, newName);
-    return c;
+void MaterialObjectExclusion::copyChildren(bool newName) {
+    base_mtl = copyChild(base_mtl, newName);
 }
 
-MaterialPtr MaterialObjectExclusion::duplicate() const { return copyWith(true); }
-
-MaterialPtr MaterialObjectExclusion::clone() const { return copyWith(false); }
-
-bool MaterialObjectExclusion::isEqual(const MaterialPtr& other) const {
-    const MaterialObjectExclusion* o = sameClass(*this, other);
-    if (!o || !childrenEqual(base_mtl, o->base_mtl) || mode != o->mode ||
-        short_circuit != o->short_circuit || objects.size() != o->objects.size())
+bool MaterialObjectExclusion::sameContent(const MaterialObjectExclusion& o) const {
+    if (!childrenEqual(base_mtl, o.base_mtl) || mode != o.mode ||
+        short_circuit != o.short_circuit || objects.size() != o.objects.size())
         return false;
     for (std::size_t i = 0; i < objects.size(); ++i)
-        if (!platform::iequals(objects[i], o->objects[i])) return false;
+        if (!platform::iequals(objects[i], o.objects[i])) return false;
     return true;
 }
 
@@ -283,21 +262,14 @@ bool MaterialAngleBlend::load(QuickArchive& ar) {
     return true;
 }
 
-MaterialPtr MaterialAngleBlend::copyWith(bool newName) const {
-    boost::shared_ptr<MaterialAngleBlend> c = copyOf(*this, newName);
-    c->mtl_one = copyChild(mtl_one, newName);
-    c->mtl_two = copyChild(mtl_two, newName);
-    return c;
+void MaterialAngleBlend::copyChildren(bool newName) {
+    mtl_one = copyChild(mtl_one, newName);
+    mtl_two = copyChild(mtl_two, newName);
 }
 
-MaterialPtr MaterialAngleBlend::duplicate() const { return copyWith(true); }
-
-MaterialPtr MaterialAngleBlend::clone() const { return copyWith(false); }
-
-bool MaterialAngleBlend::isEqual(const MaterialPtr& other) const {
-    const MaterialAngleBlend* o = sameClass(*this, other);
-    return o && childrenEqual(mtl_one, o->mtl_one) && childrenEqual(mtl_two, o->mtl_two) &&
-           start_angle == o->start_angle && stop_angle == o->stop_angle;
+bool MaterialAngleBlend::sameContent(const MaterialAngleBlend& o) const {
+    return childrenEqual(mtl_one, o.mtl_one) && childrenEqual(mtl_two, o.mtl_two) &&
+           start_angle == o.start_angle && stop_angle == o.stop_angle;
 }
 
 void MaterialAngleBlend::writeXml(AssetXmlWriter& writer, std::u16string url) {
@@ -345,21 +317,14 @@ bool MaterialAlphaContribution::load(QuickArchive& ar) {
     return true;
 }
 
-MaterialPtr MaterialAlphaContribution::copyWith(bool newName) const {
-    boost::shared_ptr<MaterialAlphaContribution> c = copyOf(*this, newName);
-    c->base_mtl = copyChild(base_mtl, newName);
-    c->alpha_tex = cloneChild(alpha_tex);
-    return c;
+void MaterialAlphaContribution::copyChildren(bool newName) {
+    base_mtl = copyChild(base_mtl, newName);
+    alpha_tex = cloneChild(alpha_tex);
 }
 
-MaterialPtr MaterialAlphaContribution::duplicate() const { return copyWith(true); }
-
-MaterialPtr MaterialAlphaContribution::clone() const { return copyWith(false); }
-
-bool MaterialAlphaContribution::isEqual(const MaterialPtr& other) const {
-    const MaterialAlphaContribution* o = sameClass(*this, other);
-    return o && childrenEqual(base_mtl, o->base_mtl) && childrenEqual(alpha_tex, o->alpha_tex) &&
-           alpha_tex_mult == o->alpha_tex_mult && alpha == o->alpha;
+bool MaterialAlphaContribution::sameContent(const MaterialAlphaContribution& o) const {
+    return childrenEqual(base_mtl, o.base_mtl) && childrenEqual(alpha_tex, o.alpha_tex) &&
+           alpha_tex_mult == o.alpha_tex_mult && alpha == o.alpha;
 }
 
 void MaterialAlphaContribution::writeXml(AssetXmlWriter& writer, std::u16string url) {

@@ -16,23 +16,20 @@
 #include <string>
 #include <vector>
 
-#include "materials/BaseMaterial.h"
+#include "materials/MaterialOf.h"
 #include "persistence/Types.h"
 #include "textures/BaseTexture.h"
 
 namespace OrvaneLumoCore {
 
-class MaterialOverrideEnvironment : public BaseMaterial {
+class MaterialOverrideEnvironment : public MaterialOf<MaterialOverrideEnvironment, kMaterialOverrideEnvironment> {
 public:
     MaterialOverrideEnvironment();
 
     bool save(QuickArchive& ar) const override;
     bool load(QuickArchive& ar) override;
-    std::uint32_t getType() const override { return kMaterialOverrideEnvironment; }
     void reset() override;
-    MaterialPtr duplicate() const override;
-    MaterialPtr clone() const override;
-    bool isEqual(const MaterialPtr& other) const override;
+    bool sameContent(const MaterialOverrideEnvironment& o) const;
 
     // No Asset of its own: base_mtl's Assets under the same url.
     void writeXml(AssetXmlWriter& writer, std::u16string url) override;
@@ -44,21 +41,18 @@ public:
     float bg_tex_mult, gi_tex_mult, reflect_tex_mult, refract_tex_mult;
     bool override_bg, override_gi, override_reflect, override_refract;
 
-private:
-    MaterialPtr copyWith(bool newName) const;
+    // On a fresh copy: the children that are not to be shared.
+    void copyChildren(bool newName);
 };
 
-class MaterialDisplaced : public BaseMaterial {
+class MaterialDisplaced : public MaterialOf<MaterialDisplaced, kMaterialDisplaced> {
 public:
     MaterialDisplaced();
 
     bool save(QuickArchive& ar) const override;
     bool load(QuickArchive& ar) override;
-    std::uint32_t getType() const override { return kMaterialDisplaced; }
     void reset() override;
-    MaterialPtr duplicate() const override;
-    MaterialPtr clone() const override;
-    bool isEqual(const MaterialPtr& other) const override;
+    bool sameContent(const MaterialDisplaced& o) const;
 
     // No Asset of its own: base_mtl's Assets one step (the name) below.
     void writeXml(AssetXmlWriter& writer, std::u16string url) override;
@@ -74,23 +68,20 @@ public:
     std::int32_t displace_view_dependent;
     std::int32_t displace_use_globals;
 
-private:
-    MaterialPtr copyWith(bool newName) const;
+    // On a fresh copy: the children that are not to be shared.
+    void copyChildren(bool newName);
 };
 
-class MaterialObjectExclusion : public BaseMaterial {
+class MaterialObjectExclusion : public MaterialOf<MaterialObjectExclusion, kMaterialObjectExclusion> {
 public:
     MaterialObjectExclusion();
 
     bool save(QuickArchive& ar) const override;
     // Version 1 has no base record and keeps the name it had.
     bool load(QuickArchive& ar) override;
-    std::uint32_t getType() const override { return kMaterialObjectExclusion; }
     void reset() override;
-    MaterialPtr duplicate() const override;
-    MaterialPtr clone() const override;
     // `objects` agree entry by entry, ignoring case.
-    bool isEqual(const MaterialPtr& other) const override;
+    bool sameContent(const MaterialObjectExclusion& o) const;
 
     void writeXml(AssetXmlWriter& writer, std::u16string url) override;
     std::u16string getPluginName() const override { return u"MtlObjectExclusion"; }
@@ -100,21 +91,18 @@ public:
     std::vector<std::u16string> objects;
     bool short_circuit;
 
-private:
-    MaterialPtr copyWith(bool newName) const;
+    // On a fresh copy: the children that are not to be shared.
+    void copyChildren(bool newName);
 };
 
-class MaterialAngleBlend : public BaseMaterial {
+class MaterialAngleBlend : public MaterialOf<MaterialAngleBlend, kMaterialAngleBlend> {
 public:
     MaterialAngleBlend();
 
     bool save(QuickArchive& ar) const override;
     bool load(QuickArchive& ar) override;
-    std::uint32_t getType() const override { return kMaterialAngleBlend; }
     void reset() override;
-    MaterialPtr duplicate() const override;
-    MaterialPtr clone() const override;
-    bool isEqual(const MaterialPtr& other) const override;
+    bool sameContent(const MaterialAngleBlend& o) const;
 
     void writeXml(AssetXmlWriter& writer, std::u16string url) override;
     std::u16string getPluginName() const override { return u"MtlAngleBlend"; }
@@ -124,21 +112,18 @@ public:
     float start_angle;
     float stop_angle;
 
-private:
-    MaterialPtr copyWith(bool newName) const;
+    // On a fresh copy: the children that are not to be shared.
+    void copyChildren(bool newName);
 };
 
-class MaterialAlphaContribution : public BaseMaterial {
+class MaterialAlphaContribution : public MaterialOf<MaterialAlphaContribution, kMaterialAlphaContribution> {
 public:
     MaterialAlphaContribution();
 
     bool save(QuickArchive& ar) const override;
     bool load(QuickArchive& ar) override;
-    std::uint32_t getType() const override { return kMaterialAlphaContribution; }
     void reset() override;
-    MaterialPtr duplicate() const override;
-    MaterialPtr clone() const override;
-    bool isEqual(const MaterialPtr& other) const override;
+    bool sameContent(const MaterialAlphaContribution& o) const;
 
     void writeXml(AssetXmlWriter& writer, std::u16string url) override;
     std::u16string getPluginName() const override { return u"MtlAlphaContribution"; }
@@ -148,8 +133,8 @@ public:
     float alpha_tex_mult;
     float alpha;
 
-private:
-    MaterialPtr copyWith(bool newName) const;
+    // On a fresh copy: the children that are not to be shared.
+    void copyChildren(bool newName);
 };
 
 }  // namespace OrvaneLumoCore
