@@ -1,6 +1,7 @@
 #include "materials/WrappingMaterials.h"
 
 #include "materials/MaterialMembers.h"
+#include "materials/MaterialRows.h"
 #include "persistence/QuickArchive.h"
 #include "persistence/Record.h"
 #include "platform/WideChar.h"
@@ -97,67 +98,38 @@ void MaterialOverrideEnvironment::writeXml(AssetXmlWriter& writer, std::u16strin
 
 MaterialDisplaced::MaterialDisplaced() { MaterialDisplaced::reset(); }
 
-void MaterialDisplaced::reset() {
-    base_mtl.reset();
-    displace_tex.reset();
-    displace_tex_mult = 1;
-    displace_shift = 0;
-    displace_edge_length = 4;
-    displace_max_subdivs = 256;
-    displace_continuity = 1;
-    displace_view_dependent = 1;
-    displace_use_globals = 1;
-}
-
-bool MaterialDisplaced::save(QuickArchive& ar) const {
-    writeVersion(ar, kDisplacedVersion);
-    if (!BaseMaterial::save(ar) || !saveOptionalMember(ar, base_mtl) ||
-        !saveOptionalMember(ar, displace_tex))
-        return false;
-    ar.writeFloat(displace_tex_mult);
-    ar.writeFloat(displace_shift);
-    ar.writeFloat(displace_edge_length);
-    ar.writeInt(displace_max_subdivs);
-    ar.writeInt(displace_continuity);
-    ar.writeInt(displace_view_dependent);
-    ar.writeInt(displace_use_globals);
-    return true;
-}
+typedef MaterialDisplaced Disp;
+typedef RowsOf<Disp> DispRow;
 
 // Version 1: base record, base_mtl, displace_tex, displace_tex_mult.
 // Version 2: as 1, then the shift, the edge length and the four integers.
-bool MaterialDisplaced::load(QuickArchive& ar) {
-    const int v = readVersion(ar, 1, kDisplacedVersion);
-    reset();  // also when the tag is refused
-    if (v < 0) return false;
-    if (!BaseMaterial::load(ar) || !loadMaterialMember(ar, base_mtl) ||
-        !loadTextureMember(ar, displace_tex))
-        return false;
-    ar.readFloat(displace_tex_mult);
-    if (v >= 2) {
-        ar.readFloat(displace_shift);
-        ar.readFloat(displace_edge_length);
-        ar.readInt(displace_max_subdivs);
-        ar.readInt(displace_continuity);
-        ar.readInt(displace_view_dependent);
-        ar.readInt(displace_use_globals);
-    }
-    return true;
+const RecordRow<Disp> kDisplacedRecord[] = {
+    kBaseRecord,
+    &Disp::base_mtl,
+    &Disp::displace_tex,
+    DispRow::f32(&Disp::displace_tex_mult, 1, 1),
+    DispRow::f32(&Disp::displace_shift, 0, 2),
+    DispRow::f32(&Disp::displace_edge_length, 4, 2),
+    DispRow::i32(&Disp::displace_max_subdivs, 256, 2),
+    DispRow::i32(&Disp::displace_continuity, 1, 2),
+    DispRow::i32(&Disp::displace_view_dependent, 1, 2),
+    DispRow::i32(&Disp::displace_use_globals, 1, 2),
+};
+
+void MaterialDisplaced::reset() { resetMaterialRows(*this, kDisplacedRecord); }
+
+bool MaterialDisplaced::save(QuickArchive& ar) const {
+    return saveMaterialRecord(*this, ar, kDisplacedRecord, kDisplacedVersion);
 }
 
-void MaterialDisplaced::copyChildren(bool newName) {
-    base_mtl = copyChild(base_mtl, newName);
-    displace_tex = cloneChild(displace_tex);
+bool MaterialDisplaced::load(QuickArchive& ar) {
+    return loadMaterialRecord(*this, ar, kDisplacedRecord, kDisplacedVersion);
 }
+
+void MaterialDisplaced::copyChildren(bool newName) { copyChildRows(*this, kDisplacedRecord, newName); }
 
 bool MaterialDisplaced::sameContent(const MaterialDisplaced& o) const {
-    return childrenEqual(base_mtl, o.base_mtl) && childrenEqual(displace_tex, o.displace_tex) &&
-           displace_tex_mult == o.displace_tex_mult && displace_shift == o.displace_shift &&
-           displace_edge_length == o.displace_edge_length &&
-           displace_max_subdivs == o.displace_max_subdivs &&
-           displace_continuity == o.displace_continuity &&
-           displace_view_dependent == o.displace_view_dependent &&
-           displace_use_globals == o.displace_use_globals;
+    return materialRowsEqual(*this, o, kDisplacedRecord);
 }
 
 void MaterialDisplaced::writeXml(AssetXmlWriter& writer, std::u16string url) {
@@ -235,41 +207,30 @@ void MaterialObjectExclusion::writeXml(AssetXmlWriter& writer, std::u16string ur
 
 MaterialAngleBlend::MaterialAngleBlend() { MaterialAngleBlend::reset(); }
 
-void MaterialAngleBlend::reset() {
-    mtl_one.reset();
-    mtl_two.reset();
-    start_angle = 75;
-    stop_angle = 150;
-}
+typedef MaterialAngleBlend Blend;
+
+const RecordRow<Blend> kAngleBlendRecord[] = {
+    kBaseRecord,
+    &Blend::mtl_one,
+    &Blend::mtl_two,
+    RowsOf<Blend>::f32(&Blend::start_angle, 75, 1),
+    RowsOf<Blend>::f32(&Blend::stop_angle, 150, 1),
+};
+
+void MaterialAngleBlend::reset() { resetMaterialRows(*this, kAngleBlendRecord); }
 
 bool MaterialAngleBlend::save(QuickArchive& ar) const {
-    writeVersion(ar, kAngleBlendVersion);
-    if (!BaseMaterial::save(ar) || !saveOptionalMember(ar, mtl_one) || !saveOptionalMember(ar, mtl_two))
-        return false;
-    ar.writeFloat(start_angle);
-    ar.writeFloat(stop_angle);
-    return true;
+    return saveMaterialRecord(*this, ar, kAngleBlendRecord, kAngleBlendVersion);
 }
 
 bool MaterialAngleBlend::load(QuickArchive& ar) {
-    const int v = readVersion(ar, 1, kAngleBlendVersion);
-    reset();  // also when the tag is refused
-    if (v < 0) return false;
-    if (!BaseMaterial::load(ar) || !loadMaterialMember(ar, mtl_one) || !loadMaterialMember(ar, mtl_two))
-        return false;
-    ar.readFloat(start_angle);
-    ar.readFloat(stop_angle);
-    return true;
+    return loadMaterialRecord(*this, ar, kAngleBlendRecord, kAngleBlendVersion);
 }
 
-void MaterialAngleBlend::copyChildren(bool newName) {
-    mtl_one = copyChild(mtl_one, newName);
-    mtl_two = copyChild(mtl_two, newName);
-}
+void MaterialAngleBlend::copyChildren(bool newName) { copyChildRows(*this, kAngleBlendRecord, newName); }
 
 bool MaterialAngleBlend::sameContent(const MaterialAngleBlend& o) const {
-    return childrenEqual(mtl_one, o.mtl_one) && childrenEqual(mtl_two, o.mtl_two) &&
-           start_angle == o.start_angle && stop_angle == o.stop_angle;
+    return materialRowsEqual(*this, o, kAngleBlendRecord);
 }
 
 void MaterialAngleBlend::writeXml(AssetXmlWriter& writer, std::u16string url) {
@@ -288,43 +249,32 @@ void MaterialAngleBlend::writeXml(AssetXmlWriter& writer, std::u16string url) {
 
 MaterialAlphaContribution::MaterialAlphaContribution() { MaterialAlphaContribution::reset(); }
 
-void MaterialAlphaContribution::reset() {
-    base_mtl.reset();
-    alpha_tex.reset();
-    alpha_tex_mult = 1;
-    alpha = 1;
-}
+typedef MaterialAlphaContribution Alpha;
+
+const RecordRow<Alpha> kAlphaContributionRecord[] = {
+    kBaseRecord,
+    &Alpha::base_mtl,
+    &Alpha::alpha_tex,
+    RowsOf<Alpha>::f32(&Alpha::alpha_tex_mult, 1, 1),
+    RowsOf<Alpha>::f32(&Alpha::alpha, 1, 1),
+};
+
+void MaterialAlphaContribution::reset() { resetMaterialRows(*this, kAlphaContributionRecord); }
 
 bool MaterialAlphaContribution::save(QuickArchive& ar) const {
-    writeVersion(ar, kAlphaContributionVersion);
-    if (!BaseMaterial::save(ar) || !saveOptionalMember(ar, base_mtl) ||
-        !saveOptionalMember(ar, alpha_tex))
-        return false;
-    ar.writeFloat(alpha_tex_mult);
-    ar.writeFloat(alpha);
-    return true;
+    return saveMaterialRecord(*this, ar, kAlphaContributionRecord, kAlphaContributionVersion);
 }
 
 bool MaterialAlphaContribution::load(QuickArchive& ar) {
-    const int v = readVersion(ar, 1, kAlphaContributionVersion);
-    reset();  // also when the tag is refused
-    if (v < 0) return false;
-    if (!BaseMaterial::load(ar) || !loadMaterialMember(ar, base_mtl) ||
-        !loadTextureMember(ar, alpha_tex))
-        return false;
-    ar.readFloat(alpha_tex_mult);
-    ar.readFloat(alpha);
-    return true;
+    return loadMaterialRecord(*this, ar, kAlphaContributionRecord, kAlphaContributionVersion);
 }
 
 void MaterialAlphaContribution::copyChildren(bool newName) {
-    base_mtl = copyChild(base_mtl, newName);
-    alpha_tex = cloneChild(alpha_tex);
+    copyChildRows(*this, kAlphaContributionRecord, newName);
 }
 
 bool MaterialAlphaContribution::sameContent(const MaterialAlphaContribution& o) const {
-    return childrenEqual(base_mtl, o.base_mtl) && childrenEqual(alpha_tex, o.alpha_tex) &&
-           alpha_tex_mult == o.alpha_tex_mult && alpha == o.alpha;
+    return materialRowsEqual(*this, o, kAlphaContributionRecord);
 }
 
 void MaterialAlphaContribution::writeXml(AssetXmlWriter& writer, std::u16string url) {

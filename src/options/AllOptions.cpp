@@ -25,7 +25,7 @@ enum Special {
     kPath,
 };
 
-RecordRow<D> path(std::u16string D::*member) { return DR::hook(kPath, 0, member); }
+constexpr RecordRow<D> path(std::u16string D::*member) { return DR::hook(kPath, 0, member); }
 
 // The record in file order. The number behind a builder is the first version
 // that holds the field; versions 10 to 15 don't exist.

@@ -37,6 +37,7 @@
 namespace OrvaneLumoCore {
 
 class BaseTexture;
+class BaseMaterial;
 
 // A field of class C, of one of the types above; or none, for rows whose
 // bytes belong to no field.
@@ -45,7 +46,7 @@ class FieldRef {
 public:
     enum class Kind {
         None, Bool, Bool32, Int, Float, Double, Color, AColor, Vector, Transform, TransformD,
-        WString, Path, NarrowText, Texture
+        WString, Path, NarrowText, Texture, Material
     };
 
     // Not explicit: a table row is written with the bare member pointer. The
@@ -63,20 +64,23 @@ public:
     constexpr FieldRef(TransformD C::*m) : kind_(Kind::TransformD), td_(m) {}
     constexpr FieldRef(std::u16string C::*m) : kind_(Kind::WString), s_(m) {}
     constexpr FieldRef(std::string C::*m) : kind_(Kind::NarrowText), n_(m) {}
-    // A texture child: its bytes and its comparison are the class's code
-    // (a hook row), since they depend on the texture family.
+    // A child texture or material: its bytes and its comparison are the
+    // class's code (a hook row), since they depend on the child's family.
     constexpr FieldRef(boost::shared_ptr<BaseTexture> C::*m) : kind_(Kind::Texture), x_(m) {}
+    constexpr FieldRef(boost::shared_ptr<BaseMaterial> C::*m) : kind_(Kind::Material), mt_(m) {}
     static constexpr FieldRef path(std::u16string C::*m) { return FieldRef(Kind::Path, m); }
     static constexpr FieldRef bool32(bool C::*m) { return FieldRef(Kind::Bool32, m); }
     // The bytes of `kind` that belong to no field (constant and dropped rows).
     static constexpr FieldRef unbound(Kind kind) { return FieldRef(kind, static_cast<bool C::*>(nullptr)); }
 
-    Kind kind() const { return kind_; }
+    constexpr Kind kind() const { return kind_; }
+    constexpr bool isChild() const { return kind_ == Kind::Texture || kind_ == Kind::Material; }
 
     void read(QuickArchive& ar, C& obj) const {
         switch (kind_) {
             case Kind::None:
-            case Kind::Texture: break;
+            case Kind::Texture:
+            case Kind::Material: break;
             case Kind::Bool: ar.readByte(obj.*b_); break;
             case Kind::Bool32: {
                 std::int32_t flag = (obj.*b_) ? 1 : 0;
@@ -115,7 +119,8 @@ public:
     void write(QuickArchive& ar, const C& obj) const {
         switch (kind_) {
             case Kind::None:
-            case Kind::Texture: break;
+            case Kind::Texture:
+            case Kind::Material: break;
             case Kind::Bool: ar.writeByte(obj.*b_); break;
             case Kind::Bool32: ar.writeInt(obj.*b_ ? 1 : 0); break;
             case Kind::Int: ar.writeInt(obj.*i_); break;
@@ -153,6 +158,7 @@ public:
             case Kind::Path: return platform::iequals(x.*s_, y.*s_);
             case Kind::NarrowText: return x.*n_ == y.*n_;
             case Kind::Texture: return x.*x_ == y.*x_;
+            case Kind::Material: return x.*mt_ == y.*mt_;
         }
         return false;
     }
@@ -181,6 +187,7 @@ public:
             case Kind::Path: (obj.*s_).clear(); break;
             case Kind::NarrowText: (obj.*n_).clear(); break;
             case Kind::Texture: (obj.*x_).reset(); break;
+            case Kind::Material: (obj.*mt_).reset(); break;
         }
     }
 
@@ -199,6 +206,7 @@ public:
         else if constexpr (std::is_same<T, TransformD>::value) return obj.*td_;
         else if constexpr (std::is_same<T, std::string>::value) return obj.*n_;
         else if constexpr (std::is_same<T, boost::shared_ptr<BaseTexture>>::value) return obj.*x_;
+        else if constexpr (std::is_same<T, boost::shared_ptr<BaseMaterial>>::value) return obj.*mt_;
         else return obj.*s_;
     }
     template <class T>
@@ -230,6 +238,7 @@ private:
         std::u16string C::*s_;
         std::string C::*n_;
         boost::shared_ptr<BaseTexture> C::*x_;
+        boost::shared_ptr<BaseMaterial> C::*mt_;
     };
 };
 
@@ -255,22 +264,22 @@ struct RowHook {
 // it, its default (`number`, or `color` for colours) and its use. A row
 // written as &C::field, {&C::field, since} or {&C::field, since, until} is a
 // plain field whose default lies elsewhere (the class's member initialisers or
-// its reset); a texture child is a hook row with code 0.
+// its reset); a child texture or material is a hook row with code 0.
 template <class C>
 struct RecordRow {
-    RecordRow() = default;
+    constexpr RecordRow() = default;
     template <class M>
-    RecordRow(M C::*m, int first = 1, int last = kLastVersion) : RecordRow(FieldRef<C>(m), first, last) {}
-    RecordRow(FieldRef<C> f, int first = 1, int last = kLastVersion) : field(f), since(first), until(last) {
-        if (f.kind() == FieldRef<C>::Kind::Texture) use = RowUse::Hook;
-    }
-    RecordRow(RowHook h) : use(RowUse::Hook), hook(h.code) {}
+    constexpr RecordRow(M C::*m, int first = 1, int last = kLastVersion)
+        : RecordRow(FieldRef<C>(m), first, last) {}
+    constexpr RecordRow(FieldRef<C> f, int first = 1, int last = kLastVersion)
+        : field(f), since(first), until(last), use(f.isChild() ? RowUse::Hook : RowUse::Field) {}
+    constexpr RecordRow(RowHook h) : use(RowUse::Hook), hook(h.code) {}
 
     FieldRef<C> field;
     int since = 1;
     int until = kLastVersion;
     double number = 0;
-    Color color = Color(0, 0, 0);
+    Color color;
     RowUse use = RowUse::Field;
     int hook = 0;
 
@@ -283,7 +292,7 @@ struct RecordRow {
 template <class C>
 struct RowsOf {
     typedef RecordRow<C> R;
-    static R row(FieldRef<C> f, double number, int since, RowUse use = RowUse::Field, int until = kLastVersion) {
+    static constexpr R row(FieldRef<C> f, double number, int since, RowUse use = RowUse::Field, int until = kLastVersion) {
         R r;
         r.field = f;
         r.number = number;
@@ -292,30 +301,30 @@ struct RowsOf {
         r.use = use;
         return r;
     }
-    static R b8(bool C::*m, bool def, int since = 0) { return row(m, def, since); }
-    static R b32(bool C::*m, bool def, int since = 0) { return row(FieldRef<C>::bool32(m), def, since); }
+    static constexpr R b8(bool C::*m, bool def, int since = 0) { return row(m, def, since); }
+    static constexpr R b32(bool C::*m, bool def, int since = 0) { return row(FieldRef<C>::bool32(m), def, since); }
     // A bool32 held in an i32 field keeps the whole value.
-    static R b32(std::int32_t C::*m, double def, int since = 0) { return row(m, def, since); }
-    static R i32(std::int32_t C::*m, double def, int since = 0) { return row(m, def, since); }
-    static R f32(float C::*m, double def, int since = 0) { return row(m, def, since); }
-    static R f64(double C::*m, double def, int since = 0) { return row(m, def, since); }
-    static R color(Color C::*m, Color def, int since = 0) {
+    static constexpr R b32(std::int32_t C::*m, double def, int since = 0) { return row(m, def, since); }
+    static constexpr R i32(std::int32_t C::*m, double def, int since = 0) { return row(m, def, since); }
+    static constexpr R f32(float C::*m, double def, int since = 0) { return row(m, def, since); }
+    static constexpr R f64(double C::*m, double def, int since = 0) { return row(m, def, since); }
+    static constexpr R color(Color C::*m, Color def, int since = 0) {
         R r = row(m, 0, since);
         r.color = def;
         return r;
     }
     // Defaults to all zero, the matrix included.
-    static R transformD(TransformD C::*m, int since = 0) { return row(m, 0, since); }
-    static R narrowText(std::string C::*m, int since = 0) { return row(m, 0, since); }
-    static R wideText(std::u16string C::*m, int since = 0) { return row(m, 0, since); }
-    static R keptF32(float C::*m, int since) { return row(m, 0, since, RowUse::Kept); }
-    static R constI32(std::int32_t value, int since = 0) { return row(unbound(Kind::Int), value, since, RowUse::Const); }
-    static R constF32(float value, int since = 0) { return row(unbound(Kind::Float), value, since, RowUse::Const); }
-    static R droppedF32(int since, int until) { return row(unbound(Kind::Float), 0, since, RowUse::Dropped, until); }
-    static R forcedI32(std::int32_t C::*m, std::int32_t value, int since = 0) {
+    static constexpr R transformD(TransformD C::*m, int since = 0) { return row(m, 0, since); }
+    static constexpr R narrowText(std::string C::*m, int since = 0) { return row(m, 0, since); }
+    static constexpr R wideText(std::u16string C::*m, int since = 0) { return row(m, 0, since); }
+    static constexpr R keptF32(float C::*m, int since) { return row(m, 0, since, RowUse::Kept); }
+    static constexpr R constI32(std::int32_t value, int since = 0) { return row(unbound(Kind::Int), value, since, RowUse::Const); }
+    static constexpr R constF32(float value, int since = 0) { return row(unbound(Kind::Float), value, since, RowUse::Const); }
+    static constexpr R droppedF32(int since, int until) { return row(unbound(Kind::Float), 0, since, RowUse::Dropped, until); }
+    static constexpr R forcedI32(std::int32_t C::*m, std::int32_t value, int since = 0) {
         return row(m, value, since, RowUse::Forced);
     }
-    static R hook(int code, int since = 0, FieldRef<C> f = FieldRef<C>(), double def = 0) {
+    static constexpr R hook(int code, int since = 0, FieldRef<C> f = FieldRef<C>(), double def = 0) {
         R r = row(f, def, since, RowUse::Hook);
         r.hook = code;
         return r;

@@ -44,7 +44,8 @@ void writeParam(AssetXmlWriter& w, const ParamRow<C>& row, const C& obj) {
         case Kind::Path: w.writeFileName(name, f.template get<std::u16string>(obj), label, row.isUserData); break;
         case Kind::NarrowText: w.writeString(name, f.template get<std::string>(obj), label, row.isUserData); break;
         case Kind::None:
-        case Kind::Texture: break;
+        case Kind::Texture:
+        case Kind::Material: break;
     }
 }
 
@@ -53,11 +54,11 @@ void writeParams(AssetXmlWriter& w, const C& obj, const Rows& rows) {
     for (const ParamRow<C>& row : rows) writeParam(w, row, obj);
 }
 
-// The same; a row with a hook, or one that shows a texture, goes to `hook(row)`.
+// The same; a row with a hook, or one that shows a child, goes to `hook(row)`.
 template <class C, class Rows, class Hook>
 void writeParams(AssetXmlWriter& w, const C& obj, const Rows& rows, Hook hook) {
     for (const ParamRow<C>& row : rows) {
-        if (row.hook != 0 || row.field.kind() == FieldRef<C>::Kind::Texture)
+        if (row.hook != 0 || row.field.isChild())
             hook(row);
         else
             writeParam(w, row, obj);
