@@ -292,7 +292,8 @@ struct RecordRow {
 template <class C>
 struct RowsOf {
     typedef RecordRow<C> R;
-    static constexpr R row(FieldRef<C> f, double number, int since, RowUse use = RowUse::Field, int until = kLastVersion) {
+    static constexpr R row(FieldRef<C> f, double number, int since, RowUse use = RowUse::Field,
+                           int until = kLastVersion) {
         R r;
         r.field = f;
         r.number = number;
@@ -318,9 +319,15 @@ struct RowsOf {
     static constexpr R narrowText(std::string C::*m, int since = 0) { return row(m, 0, since); }
     static constexpr R wideText(std::u16string C::*m, int since = 0) { return row(m, 0, since); }
     static constexpr R keptF32(float C::*m, int since) { return row(m, 0, since, RowUse::Kept); }
-    static constexpr R constI32(std::int32_t value, int since = 0) { return row(unbound(Kind::Int), value, since, RowUse::Const); }
-    static constexpr R constF32(float value, int since = 0) { return row(unbound(Kind::Float), value, since, RowUse::Const); }
-    static constexpr R droppedF32(int since, int until) { return row(unbound(Kind::Float), 0, since, RowUse::Dropped, until); }
+    static constexpr R constI32(std::int32_t value, int since = 0) {
+        return row(unbound(Kind::Int), value, since, RowUse::Const);
+    }
+    static constexpr R constF32(float value, int since = 0) {
+        return row(unbound(Kind::Float), value, since, RowUse::Const);
+    }
+    static constexpr R droppedF32(int since, int until) {
+        return row(unbound(Kind::Float), 0, since, RowUse::Dropped, until);
+    }
     static constexpr R forcedI32(std::int32_t C::*m, std::int32_t value, int since = 0) {
         return row(m, value, since, RowUse::Forced);
     }

@@ -36,7 +36,8 @@ template <class C, class Rows>
 bool rowsEqual(const C& a, const C& b, const Rows& rows) {
     for (const RecordRow<C>& row : rows) {
         if (row.field.kind() != FieldRef<C>::Kind::Texture) continue;
-        if (!childrenEqual(row.field.template get<TexturePtr>(a), row.field.template get<TexturePtr>(b))) return false;
+        const TexturePtr& x = row.field.template get<TexturePtr>(a);
+        if (!childrenEqual(x, row.field.template get<TexturePtr>(b))) return false;
     }
     return fieldsEqual(a, b, rows);
 }

@@ -34,12 +34,16 @@ void writeParam(AssetXmlWriter& w, const ParamRow<C>& row, const C& obj) {
         case Kind::Bool32: w.writeBool(name, f.template get<bool>(obj), label, row.isUserData); break;
         case Kind::Int: w.writeInteger(name, f.template get<std::int32_t>(obj), label, row.isUserData); break;
         case Kind::Float: w.writeFloat(name, f.template get<float>(obj), label, row.isUserData); break;
-        case Kind::Double: w.writeFloat(name, static_cast<float>(f.template get<double>(obj)), label, row.isUserData); break;
+        case Kind::Double:
+            w.writeFloat(name, static_cast<float>(f.template get<double>(obj)), label, row.isUserData);
+            break;
         case Kind::Color: w.writeColor(name, f.template get<Color>(obj), label); break;
         case Kind::AColor: w.writeAColor(name, f.template get<AColor>(obj), label); break;
         case Kind::Vector: w.writeVector(name, f.template get<Vector>(obj), label); break;
         case Kind::Transform: w.writeTransform(name, f.template get<Transform>(obj), label); break;
-        case Kind::TransformD: w.writeTransform(name, FieldRef<C>::narrowed(f.template get<TransformD>(obj)), label); break;
+        case Kind::TransformD:
+            w.writeTransform(name, FieldRef<C>::narrowed(f.template get<TransformD>(obj)), label);
+            break;
         case Kind::WString: w.writeString(name, f.template get<std::u16string>(obj), label, row.isUserData); break;
         case Kind::Path: w.writeFileName(name, f.template get<std::u16string>(obj), label, row.isUserData); break;
         case Kind::NarrowText: w.writeString(name, f.template get<std::string>(obj), label, row.isUserData); break;
