@@ -233,10 +233,7 @@ void MayaDirectLight::writeXml(AssetXmlWriter& writer, std::u16string url) {
 
 // ---- OmniLight ----
 
-bool OmniLight::save(QuickArchive& ar) const {
-    saveFlatRecord(*this, ar, kOmniRecord, kNewest);
-    return true;
-}
+bool OmniLight::save(QuickArchive& ar) const { return saveFlatRecord(*this, ar, kOmniRecord, kNewest); }
 
 bool OmniLight::load(QuickArchive& ar) { return loadFlatRecord(*this, ar, kOmniRecord, kNewest) > 0; }
 
@@ -250,10 +247,7 @@ void OmniLight::writeXml(AssetXmlWriter& writer, std::u16string url) {
 
 // ---- SpotLight ----
 
-bool SpotLight::save(QuickArchive& ar) const {
-    saveFlatRecord(*this, ar, kSpotRecord, kNewest);
-    return true;
-}
+bool SpotLight::save(QuickArchive& ar) const { return saveFlatRecord(*this, ar, kSpotRecord, kNewest); }
 
 bool SpotLight::load(QuickArchive& ar) { return loadFlatRecord(*this, ar, kSpotRecord, kNewest) > 0; }
 
@@ -271,10 +265,7 @@ void SpotLight::writeXml(AssetXmlWriter& writer, std::u16string url) {
 
 // ---- RectangleLight ----
 
-bool RectangleLight::save(QuickArchive& ar) const {
-    saveFlatRecord(*this, ar, kRectangleRecord, kNewest);
-    return true;
-}
+bool RectangleLight::save(QuickArchive& ar) const { return saveFlatRecord(*this, ar, kRectangleRecord, kNewest); }
 
 bool RectangleLight::load(QuickArchive& ar) {
     return loadFlatRecord(*this, ar, kRectangleRecord, kNewest) > 0;

@@ -182,10 +182,7 @@ namespace {
 
 // ---- IESLight ----
 
-bool IESLight::save(QuickArchive& ar) const {
-    saveFlatRecord(*this, ar, kIesRecord, kIesNewest);
-    return true;
-}
+bool IESLight::save(QuickArchive& ar) const { return saveFlatRecord(*this, ar, kIesRecord, kIesNewest); }
 
 bool IESLight::load(QuickArchive& ar) { return loadFlatRecord(*this, ar, kIesRecord, kIesNewest) > 0; }
 

@@ -174,7 +174,9 @@ public:
             case Kind::Float: obj.*f_ = static_cast<float>(number); break;
             case Kind::Double: obj.*d_ = number; break;
             case Kind::Color: obj.*c_ = color; break;
-            case Kind::AColor: obj.*a_ = AColor(color.r, color.g, color.b, static_cast<float>(number)); break;
+            case Kind::AColor:  // `color`, alpha `number`
+                obj.*a_ = AColor(color.r, color.g, color.b, static_cast<float>(number));
+                break;
             case Kind::Vector: obj.*v_ = Vector(0, 0, 0); break;
             case Kind::Transform: obj.*t_ = Transform(); break;
             case Kind::TransformD: {
@@ -458,11 +460,13 @@ int loadFlatRecord(C& obj, QuickArchive& ar, const Rows& rows, int newest) {
     return v;
 }
 
-// Writes the tag of version `newest` and the rows of that version.
+// Writes the tag of version `newest` and the rows of that version; true,
+// since a flat record has nothing that can fail.
 template <class C, class Rows>
-void saveFlatRecord(const C& obj, QuickArchive& ar, const Rows& rows, int newest) {
+bool saveFlatRecord(const C& obj, QuickArchive& ar, const Rows& rows, int newest) {
     writeVersion(ar, newest);
     writeFields(ar, obj, rows, newest);
+    return true;
 }
 
 // A table held elsewhere, for descriptions that gather several tables.

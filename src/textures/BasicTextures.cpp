@@ -169,10 +169,7 @@ void InvertTexture::writeXml(AssetXmlWriter& w, std::u16string url) {
 
 const RecordRow<AColorTexture> kAColorRecord[] = {&AColorTexture::color};
 
-bool AColorTexture::save(QuickArchive& ar) const {
-    saveFlatRecord(*this, ar, kAColorRecord, 1);
-    return true;
-}
+bool AColorTexture::save(QuickArchive& ar) const { return saveFlatRecord(*this, ar, kAColorRecord, 1); }
 
 bool AColorTexture::load(QuickArchive& ar) { return loadFlatRecord(*this, ar, kAColorRecord, 1) > 0; }
 

@@ -29,10 +29,7 @@ const ParamRow<B> kBufferParams[] = {
     {"file", FieldRef<B>::path(&B::file)},
 };
 
-bool BitmapBuffer::save(QuickArchive& ar) const {
-    saveFlatRecord(*this, ar, kBufferRecord, 1);
-    return true;
-}
+bool BitmapBuffer::save(QuickArchive& ar) const { return saveFlatRecord(*this, ar, kBufferRecord, 1); }
 
 bool BitmapBuffer::load(QuickArchive& ar) { return loadFlatRecord(*this, ar, kBufferRecord, 1) > 0; }
 
