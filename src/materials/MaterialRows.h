@@ -6,6 +6,7 @@
 // reset, save, load, the comparison and the copies walk it.
 #include "materials/BaseMaterial.h"
 #include "materials/MaterialMembers.h"
+#include "materials/MaterialOf.h"
 #include "persistence/FieldRows.h"
 #include "persistence/Record.h"
 
@@ -82,5 +83,31 @@ void copyChildRows(M& copy, const Rows& rows, bool newName) {
         }
     }
 }
+
+// Base of a material whose record is one table. The class gives
+//
+//   static RowSpan<RecordRow<Class>> record();  // the table, in record order
+//   static constexpr int kRecordVersion = N;    // the version that save writes
+//
+// and gets reset (the table's defaults; name and uuid stay), save, load
+// (which resets right behind the version tag, also when the tag is refused),
+// the comparison and the copies from it.
+template <class Derived, std::uint32_t Tag>
+class TableMaterialOf : public MaterialOf<Derived, Tag> {
+public:
+    void reset() override { resetMaterialRows(self(), Derived::record()); }
+    bool save(QuickArchive& ar) const override {
+        return saveMaterialRecord(self(), ar, Derived::record(), Derived::kRecordVersion);
+    }
+    bool load(QuickArchive& ar) override {
+        return loadMaterialRecord(self(), ar, Derived::record(), Derived::kRecordVersion);
+    }
+    bool sameContent(const Derived& o) const { return materialRowsEqual(self(), o, Derived::record()); }
+    void copyChildren(bool newName) { copyChildRows(self(), Derived::record(), newName); }
+
+private:
+    Derived& self() { return static_cast<Derived&>(*this); }
+    const Derived& self() const { return static_cast<const Derived&>(*this); }
+};
 
 }  // namespace OrvaneLumoCore

@@ -1,7 +1,6 @@
 #include "materials/ToonMaterial.h"
 
 #include "materials/MaterialMembers.h"
-#include "materials/MaterialRows.h"
 #include "persistence/QuickArchive.h"
 #include "persistence/Record.h"
 #include "xml/AssetXmlWriter.h"
@@ -9,8 +8,6 @@
 namespace OrvaneLumoCore {
 
 namespace {
-
-const int kToonVersion = 2;
 
 // The line parameters in the order of both XML forms, with the word of the
 // material's own writeXml and the word of the conversion. A row without a
@@ -93,18 +90,12 @@ const RecordRow<Toon> kToonRecord[] = {
 
 MaterialToon::MaterialToon() { MaterialToon::reset(); }
 
-void MaterialToon::reset() { resetMaterialRows(*this, kToonRecord); }
-
-bool MaterialToon::save(QuickArchive& ar) const { return saveMaterialRecord(*this, ar, kToonRecord, kToonVersion); }
-
-bool MaterialToon::load(QuickArchive& ar) { return loadMaterialRecord(*this, ar, kToonRecord, kToonVersion); }
+RowSpan<RecordRow<MaterialToon>> MaterialToon::record() { return rowSpan(kToonRecord); }
 
 void MaterialToon::copyChildren(bool newName) {
     base_mtl = copyChild(base_mtl, true);
     for (const ToonTexture& t : kToonTextures) this->*t.field = cloneChild(this->*t.field);
 }
-
-bool MaterialToon::sameContent(const MaterialToon& o) const { return materialRowsEqual(*this, o, kToonRecord); }
 
 void MaterialToon::writeTextureAssets(AssetXmlWriter& writer, const std::u16string& url) const {
     for (const ToonTexture& t : kToonTextures)

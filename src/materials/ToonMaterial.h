@@ -10,25 +10,21 @@
 #include <cstdint>
 #include <string>
 
-#include "materials/MaterialOf.h"
+#include "materials/MaterialRows.h"
 #include "persistence/Types.h"
 #include "textures/BaseTexture.h"
 
 namespace OrvaneLumoCore {
 
-class MaterialToon : public MaterialOf<MaterialToon, kMaterialToon> {
+class MaterialToon : public TableMaterialOf<MaterialToon, kMaterialToon> {
 public:
     // Which words the line parameters go out under.
     enum class Words { Own, Conversion };
 
-    MaterialToon();
+    static constexpr int kRecordVersion = 2;
+    static RowSpan<RecordRow<MaterialToon>> record();
 
-    bool save(QuickArchive& ar) const override;
-    // Resets right behind reading the version tag.
-    bool load(QuickArchive& ar) override;
-    // The defaults of the fields below; name and uuid stay.
-    void reset() override;
-    bool sameContent(const MaterialToon& o) const;
+    MaterialToon();
 
     void writeXml(AssetXmlWriter& writer, std::u16string url) override;
     std::u16string getPluginName() const override { return u"MtlToon"; }

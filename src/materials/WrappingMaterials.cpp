@@ -1,7 +1,6 @@
 #include "materials/WrappingMaterials.h"
 
 #include "materials/MaterialMembers.h"
-#include "materials/MaterialRows.h"
 #include "persistence/QuickArchive.h"
 #include "persistence/Record.h"
 #include "platform/WideChar.h"
@@ -12,10 +11,7 @@ namespace OrvaneLumoCore {
 namespace {
 
 const int kOverrideEnvironmentVersion = 1;
-const int kDisplacedVersion = 2;
 const int kObjectExclusionVersion = 3;
-const int kAngleBlendVersion = 1;
-const int kAlphaContributionVersion = 1;
 
 // The four environment groups of MaterialOverrideEnvironment in the order of
 // its record, which has the background first. Each row of the record
@@ -116,21 +112,7 @@ const RecordRow<Disp> kDisplacedRecord[] = {
     DispRow::i32(&Disp::displace_use_globals, 1, 2),
 };
 
-void MaterialDisplaced::reset() { resetMaterialRows(*this, kDisplacedRecord); }
-
-bool MaterialDisplaced::save(QuickArchive& ar) const {
-    return saveMaterialRecord(*this, ar, kDisplacedRecord, kDisplacedVersion);
-}
-
-bool MaterialDisplaced::load(QuickArchive& ar) {
-    return loadMaterialRecord(*this, ar, kDisplacedRecord, kDisplacedVersion);
-}
-
-void MaterialDisplaced::copyChildren(bool newName) { copyChildRows(*this, kDisplacedRecord, newName); }
-
-bool MaterialDisplaced::sameContent(const MaterialDisplaced& o) const {
-    return materialRowsEqual(*this, o, kDisplacedRecord);
-}
+RowSpan<RecordRow<MaterialDisplaced>> MaterialDisplaced::record() { return rowSpan(kDisplacedRecord); }
 
 void MaterialDisplaced::writeXml(AssetXmlWriter& writer, std::u16string url) {
     url = childUrl(url, name);
@@ -217,21 +199,7 @@ const RecordRow<Blend> kAngleBlendRecord[] = {
     RowsOf<Blend>::f32(&Blend::stop_angle, 150, 1),
 };
 
-void MaterialAngleBlend::reset() { resetMaterialRows(*this, kAngleBlendRecord); }
-
-bool MaterialAngleBlend::save(QuickArchive& ar) const {
-    return saveMaterialRecord(*this, ar, kAngleBlendRecord, kAngleBlendVersion);
-}
-
-bool MaterialAngleBlend::load(QuickArchive& ar) {
-    return loadMaterialRecord(*this, ar, kAngleBlendRecord, kAngleBlendVersion);
-}
-
-void MaterialAngleBlend::copyChildren(bool newName) { copyChildRows(*this, kAngleBlendRecord, newName); }
-
-bool MaterialAngleBlend::sameContent(const MaterialAngleBlend& o) const {
-    return materialRowsEqual(*this, o, kAngleBlendRecord);
-}
+RowSpan<RecordRow<MaterialAngleBlend>> MaterialAngleBlend::record() { return rowSpan(kAngleBlendRecord); }
 
 void MaterialAngleBlend::writeXml(AssetXmlWriter& writer, std::u16string url) {
     url = childUrl(url, name);
@@ -259,23 +227,7 @@ const RecordRow<Alpha> kAlphaContributionRecord[] = {
     RowsOf<Alpha>::f32(&Alpha::alpha, 1, 1),
 };
 
-void MaterialAlphaContribution::reset() { resetMaterialRows(*this, kAlphaContributionRecord); }
-
-bool MaterialAlphaContribution::save(QuickArchive& ar) const {
-    return saveMaterialRecord(*this, ar, kAlphaContributionRecord, kAlphaContributionVersion);
-}
-
-bool MaterialAlphaContribution::load(QuickArchive& ar) {
-    return loadMaterialRecord(*this, ar, kAlphaContributionRecord, kAlphaContributionVersion);
-}
-
-void MaterialAlphaContribution::copyChildren(bool newName) {
-    copyChildRows(*this, kAlphaContributionRecord, newName);
-}
-
-bool MaterialAlphaContribution::sameContent(const MaterialAlphaContribution& o) const {
-    return materialRowsEqual(*this, o, kAlphaContributionRecord);
-}
+RowSpan<RecordRow<MaterialAlphaContribution>> MaterialAlphaContribution::record() { return rowSpan(kAlphaContributionRecord); }
 
 void MaterialAlphaContribution::writeXml(AssetXmlWriter& writer, std::u16string url) {
     url = childUrl(url, name);

@@ -16,7 +16,7 @@
 #include <string>
 #include <vector>
 
-#include "materials/MaterialOf.h"
+#include "materials/MaterialRows.h"
 #include "persistence/Types.h"
 #include "textures/BaseTexture.h"
 
@@ -45,14 +45,12 @@ public:
     void copyChildren(bool newName);
 };
 
-class MaterialDisplaced : public MaterialOf<MaterialDisplaced, kMaterialDisplaced> {
+class MaterialDisplaced : public TableMaterialOf<MaterialDisplaced, kMaterialDisplaced> {
 public:
-    MaterialDisplaced();
+    static constexpr int kRecordVersion = 2;
+    static RowSpan<RecordRow<MaterialDisplaced>> record();
 
-    bool save(QuickArchive& ar) const override;
-    bool load(QuickArchive& ar) override;
-    void reset() override;
-    bool sameContent(const MaterialDisplaced& o) const;
+    MaterialDisplaced();
 
     // No Asset of its own: base_mtl's Assets one step (the name) below.
     void writeXml(AssetXmlWriter& writer, std::u16string url) override;
@@ -67,9 +65,6 @@ public:
     std::int32_t displace_continuity;
     std::int32_t displace_view_dependent;
     std::int32_t displace_use_globals;
-
-    // On a fresh copy: the children that are not to be shared.
-    void copyChildren(bool newName);
 };
 
 class MaterialObjectExclusion : public MaterialOf<MaterialObjectExclusion, kMaterialObjectExclusion> {
@@ -95,14 +90,12 @@ public:
     void copyChildren(bool newName);
 };
 
-class MaterialAngleBlend : public MaterialOf<MaterialAngleBlend, kMaterialAngleBlend> {
+class MaterialAngleBlend : public TableMaterialOf<MaterialAngleBlend, kMaterialAngleBlend> {
 public:
-    MaterialAngleBlend();
+    static constexpr int kRecordVersion = 1;
+    static RowSpan<RecordRow<MaterialAngleBlend>> record();
 
-    bool save(QuickArchive& ar) const override;
-    bool load(QuickArchive& ar) override;
-    void reset() override;
-    bool sameContent(const MaterialAngleBlend& o) const;
+    MaterialAngleBlend();
 
     void writeXml(AssetXmlWriter& writer, std::u16string url) override;
     std::u16string getPluginName() const override { return u"MtlAngleBlend"; }
@@ -111,19 +104,14 @@ public:
     MaterialPtr mtl_two;
     float start_angle;
     float stop_angle;
-
-    // On a fresh copy: the children that are not to be shared.
-    void copyChildren(bool newName);
 };
 
-class MaterialAlphaContribution : public MaterialOf<MaterialAlphaContribution, kMaterialAlphaContribution> {
+class MaterialAlphaContribution : public TableMaterialOf<MaterialAlphaContribution, kMaterialAlphaContribution> {
 public:
-    MaterialAlphaContribution();
+    static constexpr int kRecordVersion = 1;
+    static RowSpan<RecordRow<MaterialAlphaContribution>> record();
 
-    bool save(QuickArchive& ar) const override;
-    bool load(QuickArchive& ar) override;
-    void reset() override;
-    bool sameContent(const MaterialAlphaContribution& o) const;
+    MaterialAlphaContribution();
 
     void writeXml(AssetXmlWriter& writer, std::u16string url) override;
     std::u16string getPluginName() const override { return u"MtlAlphaContribution"; }
@@ -132,9 +120,6 @@ public:
     TexturePtr alpha_tex;
     float alpha_tex_mult;
     float alpha;
-
-    // On a fresh copy: the children that are not to be shared.
-    void copyChildren(bool newName);
 };
 
 }  // namespace OrvaneLumoCore
