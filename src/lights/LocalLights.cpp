@@ -233,13 +233,7 @@ void MayaDirectLight::writeXml(AssetXmlWriter& writer, std::u16string url) {
 
 // ---- OmniLight ----
 
-bool OmniLight::save(QuickArchive& ar) const { return saveFlatRecord(*this, ar, kOmniRecord, kNewest); }
-
-bool OmniLight::load(QuickArchive& ar) { return loadFlatRecord(*this, ar, kOmniRecord, kNewest) > 0; }
-
-bool OmniLight::sameContent(const OmniLight& o) const {
-    return fieldsEqual(*this, o, kOmniRecord);
-}
+RowSpan<RecordRow<OmniLight>> OmniLight::record() { return rowSpan(kOmniRecord); }
 
 void OmniLight::writeXml(AssetXmlWriter& writer, std::u16string url) {
     writeParamAsset(writer, url, *this, kOmniParams);
@@ -247,13 +241,7 @@ void OmniLight::writeXml(AssetXmlWriter& writer, std::u16string url) {
 
 // ---- SpotLight ----
 
-bool SpotLight::save(QuickArchive& ar) const { return saveFlatRecord(*this, ar, kSpotRecord, kNewest); }
-
-bool SpotLight::load(QuickArchive& ar) { return loadFlatRecord(*this, ar, kSpotRecord, kNewest) > 0; }
-
-bool SpotLight::sameContent(const SpotLight& o) const {
-    return fieldsEqual(*this, o, kSpotRecord);
-}
+RowSpan<RecordRow<SpotLight>> SpotLight::record() { return rowSpan(kSpotRecord); }
 
 void SpotLight::writeXml(AssetXmlWriter& writer, std::u16string url) {
     writeLightAsset(writer, url + u"/" + getPluginName(), getPluginName(), [&] {
@@ -265,15 +253,7 @@ void SpotLight::writeXml(AssetXmlWriter& writer, std::u16string url) {
 
 // ---- RectangleLight ----
 
-bool RectangleLight::save(QuickArchive& ar) const { return saveFlatRecord(*this, ar, kRectangleRecord, kNewest); }
-
-bool RectangleLight::load(QuickArchive& ar) {
-    return loadFlatRecord(*this, ar, kRectangleRecord, kNewest) > 0;
-}
-
-bool RectangleLight::sameContent(const RectangleLight& o) const {
-    return fieldsEqual(*this, o, kRectangleRecord);
-}
+RowSpan<RecordRow<RectangleLight>> RectangleLight::record() { return rowSpan(kRectangleRecord); }
 
 void RectangleLight::writeXml(AssetXmlWriter& writer, std::u16string url) {
     writeParamAsset(writer, url, *this, kRectangleParams);

@@ -84,7 +84,6 @@ const ParamRow<IESLight> kIesParams[] = {
 };
 
 constexpr int kSunNewest = 4;
-constexpr int kIesNewest = 3;
 
 }  // namespace
 
@@ -182,13 +181,7 @@ namespace {
 
 // ---- IESLight ----
 
-bool IESLight::save(QuickArchive& ar) const { return saveFlatRecord(*this, ar, kIesRecord, kIesNewest); }
-
-bool IESLight::load(QuickArchive& ar) { return loadFlatRecord(*this, ar, kIesRecord, kIesNewest) > 0; }
-
-bool IESLight::sameContent(const IESLight& o) const {
-    return fieldsEqual(*this, o, kIesRecord);
-}
+RowSpan<RecordRow<IESLight>> IESLight::record() { return rowSpan(kIesRecord); }
 
 void IESLight::writeXml(AssetXmlWriter& writer, std::u16string url) {
     writeLightAsset(writer, url + u"/" + getPluginName(), getPluginName(),

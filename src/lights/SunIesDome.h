@@ -75,12 +75,11 @@ const SunLightPtr& documentSun();
 // True if `id` is the document sun's id, ignoring case.
 bool isDocumentSunId(const std::u16string& id);
 
-class IESLight : public LightOf<IESLight, 6> {
+class IESLight : public FlatFamilyOf<IESLight, 6, BaseLight> {
 public:
-    bool save(QuickArchive& ar) const override;
-    bool load(QuickArchive& ar) override;
-    // The file path compares without regard to case.
-    bool sameContent(const IESLight& o) const;
+    static constexpr int kRecordVersion = 3;
+    static RowSpan<RecordRow<IESLight>> record();  // the file path compares without regard to case
+
     void writeXml(AssetXmlWriter& writer, std::u16string url) override;
     std::u16string getPluginName() const override { return u"LightIES"; }
 

@@ -20,6 +20,8 @@
 
 #include <boost/make_shared.hpp>
 
+#include "persistence/FieldRows.h"
+
 namespace OrvaneLumoCore {
 
 template <class T, class = void>
@@ -55,6 +57,25 @@ protected:
         if (!other || other->getType() != Tag) return nullptr;
         return static_cast<const Derived*>(other.get());
     }
+};
+
+// Base of a family class whose record is one flat table. The class gives
+//
+//   static RowSpan<RecordRow<Class>> record();  // the table, in record order
+//   static constexpr int kRecordVersion = N;    // the version that save writes
+//
+// and gets save, load (from version 1) and the comparison from it; its
+// defaults are its member initialisers.
+template <class Derived, std::uint32_t Tag, class Base>
+class FlatFamilyOf : public FamilyOf<Derived, Tag, Base> {
+public:
+    bool save(QuickArchive& ar) const override {
+        return saveFlatRecord(this->self(), ar, Derived::record(), Derived::kRecordVersion);
+    }
+    bool load(QuickArchive& ar) override {
+        return loadFlatRecord(static_cast<Derived&>(*this), ar, Derived::record(), Derived::kRecordVersion) > 0;
+    }
+    bool sameContent(const Derived& o) const { return fieldsEqual(this->self(), o, Derived::record()); }
 };
 
 }  // namespace OrvaneLumoCore

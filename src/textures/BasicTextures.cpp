@@ -169,11 +169,7 @@ void InvertTexture::writeXml(AssetXmlWriter& w, std::u16string url) {
 
 const RecordRow<AColorTexture> kAColorRecord[] = {&AColorTexture::color};
 
-bool AColorTexture::save(QuickArchive& ar) const { return saveFlatRecord(*this, ar, kAColorRecord, 1); }
-
-bool AColorTexture::load(QuickArchive& ar) { return loadFlatRecord(*this, ar, kAColorRecord, 1) > 0; }
-
-bool AColorTexture::sameContent(const AColorTexture& o) const { return fieldsEqual(*this, o, kAColorRecord); }
+RowSpan<RecordRow<AColorTexture>> AColorTexture::record() { return rowSpan(kAColorRecord); }
 
 void AColorTexture::writeXml(AssetXmlWriter& w, std::u16string url) {
     TextureFrame frame(w, *this, url);

@@ -72,14 +72,14 @@ public:
 };
 
 // A constant colour with alpha.
-class AColorTexture : public FamilyOf<AColorTexture, 5, BaseTexture> {
+class AColorTexture : public FlatFamilyOf<AColorTexture, 5, BaseTexture> {
 public:
+    static constexpr int kRecordVersion = 1;
+    static RowSpan<RecordRow<AColorTexture>> record();
+
     AColorTexture() = default;
     explicit AColorTexture(const AColor& c) : color(c) {}
 
-    bool save(QuickArchive& ar) const override;
-    bool load(QuickArchive& ar) override;
-    bool sameContent(const AColorTexture& o) const;
     void writeXml(AssetXmlWriter& writer, std::u16string url) override;
     std::u16string getPluginName() const override { return u"TexAColor"; }
 

@@ -29,11 +29,7 @@ const ParamRow<B> kBufferParams[] = {
     {"file", FieldRef<B>::path(&B::file)},
 };
 
-bool BitmapBuffer::save(QuickArchive& ar) const { return saveFlatRecord(*this, ar, kBufferRecord, 1); }
-
-bool BitmapBuffer::load(QuickArchive& ar) { return loadFlatRecord(*this, ar, kBufferRecord, 1) > 0; }
-
-bool BitmapBuffer::sameContent(const BitmapBuffer& o) const { return fieldsEqual(*this, o, kBufferRecord); }
+RowSpan<RecordRow<BitmapBuffer>> BitmapBuffer::record() { return rowSpan(kBufferRecord); }
 
 void BitmapBuffer::writeXml(AssetXmlWriter& w, std::u16string url) {
     TextureFrame frame(w, *this, url);

@@ -11,11 +11,11 @@
 
 namespace OrvaneLumoCore {
 
-class BitmapBuffer : public FamilyOf<BitmapBuffer, 0, BaseBitmap> {
+class BitmapBuffer : public FlatFamilyOf<BitmapBuffer, 0, BaseBitmap> {
 public:
-    bool save(QuickArchive& ar) const override;
-    bool load(QuickArchive& ar) override;
-    bool sameContent(const BitmapBuffer& o) const;  // `file` ignores case
+    static constexpr int kRecordVersion = 1;
+    static RowSpan<RecordRow<BitmapBuffer>> record();  // `file` ignores case
+
     void writeXml(AssetXmlWriter& writer, std::u16string url) override;
     std::u16string getPluginName() const override { return u"BitmapBuffer"; }
 
