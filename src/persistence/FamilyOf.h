@@ -1,8 +1,9 @@
 #pragma once
 // The per-class operations of a model family, written once.
 //
-// Every family (textures, UVW generators, bitmaps, BRDF layers, lights) has a
-// root with a type tag, a copy and a comparison of content. A class derives
+// Every family (textures, UVW generators, bitmaps, BRDF layers, lights, and
+// materials through materials/MaterialOf.h) has a root with a type tag, a
+// copy and a comparison of content. A class derives
 // from FamilyOf<Class, Tag, Base>, where Base is the family's root or a base
 // that a few classes of it share, and supplies its content:
 //
@@ -14,6 +15,9 @@
 // a class whose defaults are its member initialisers needs no reset of its
 // own. A class that sets its defaults by hand overrides reset; its
 // constructor then calls that reset (by its class name where it is a base's).
+//
+// A class whose record is one flat table derives from FlatFamilyOf instead and
+// also gets save, load and the comparison from its table.
 #include <cstdint>
 #include <type_traits>
 #include <utility>
