@@ -11,8 +11,8 @@ namespace {
 typedef AllOptions D;
 typedef RowsOf<D> DR;
 
-// Fields that the record's own code reads and writes.
-enum Special {
+// The hook rows: fields that the record's own code reads and writes.
+enum DocumentHook {
     kParams,
     kFrameData,
     kStampInfo,
@@ -150,7 +150,7 @@ void writeChannels(QuickArchive& ar, const std::vector<std::int32_t>& channels) 
     for (std::int32_t channel : channels) ar.writeLength(static_cast<std::uint32_t>(channel));
 }
 
-bool loadSpecial(QuickArchive& ar, AllOptions& o, const RecordRow<D>& r, int version) {
+bool loadHookRow(QuickArchive& ar, AllOptions& o, const RecordRow<D>& r, int version) {
     switch (r.hook) {
     case kParams: return loadNested(ar, o.params);
     case kFrameData: return loadNested(ar, o.frameData);
@@ -171,7 +171,7 @@ bool loadSpecial(QuickArchive& ar, AllOptions& o, const RecordRow<D>& r, int ver
     return false;
 }
 
-bool saveSpecial(QuickArchive& ar, const AllOptions& o, const RecordRow<D>& r) {
+bool saveHookRow(QuickArchive& ar, const AllOptions& o, const RecordRow<D>& r) {
     switch (r.hook) {
     case kParams: return o.params.save(ar);
     case kFrameData: return o.frameData.save(ar);
@@ -195,7 +195,7 @@ AllOptions::AllOptions() { reset(); }
 bool AllOptions::save(QuickArchive& ar) const {
     ar.writeUInt(versionTag(kVersion) | kTagLowHalf);
     return writeFields(ar, *this, kDocumentRows, kVersion,
-                       [&](const RecordRow<D>& r) { return saveSpecial(ar, *this, r); });
+                       [&](const RecordRow<D>& r) { return saveHookRow(ar, *this, r); });
 }
 
 bool AllOptions::load(QuickArchive& ar) {
@@ -205,7 +205,7 @@ bool AllOptions::load(QuickArchive& ar) {
     const int version = static_cast<int>(tag >> 16);
     if ((tag & 0xFFFF) != kTagLowHalf || !isKnownVersion(version)) return false;
     return readFields(ar, *this, kDocumentRows, version,
-                      [&](const RecordRow<D>& r) { return loadSpecial(ar, *this, r, version); });
+                      [&](const RecordRow<D>& r) { return loadHookRow(ar, *this, r, version); });
 }
 
 void AllOptions::reset() {
