@@ -9,82 +9,40 @@
 namespace OrvaneLumoCore {
 
 namespace {
-
-const int kOverrideEnvironmentVersion = 1;
 const int kObjectExclusionVersion = 3;
-
-// The four environment groups of MaterialOverrideEnvironment in the order of
-// its record, which has the background first. Each row of the record
-// (textures, colours, multipliers, switches) walks this table.
-typedef MaterialOverrideEnvironment Env;
-struct EnvironmentGroup {
-    TexturePtr Env::*tex;
-    Color Env::*color;
-    float Env::*mult;
-    bool Env::*override_;
-};
-const EnvironmentGroup kEnvironmentRecordOrder[] = {
-    {&Env::bg_tex, &Env::bg_color, &Env::bg_tex_mult, &Env::override_bg},
-    {&Env::gi_tex, &Env::gi_color, &Env::gi_tex_mult, &Env::override_gi},
-    {&Env::reflect_tex, &Env::reflect_color, &Env::reflect_tex_mult, &Env::override_reflect},
-    {&Env::refract_tex, &Env::refract_color, &Env::refract_tex_mult, &Env::override_refract},
-};
-
 }  // namespace
 
 // ---- MaterialOverrideEnvironment ----------------------------------------------------------
 
 MaterialOverrideEnvironment::MaterialOverrideEnvironment() { MaterialOverrideEnvironment::reset(); }
 
-void MaterialOverrideEnvironment::reset() {
-    base_mtl.reset();
-    for (const EnvironmentGroup& g : kEnvironmentRecordOrder) {
-        (this->*g.tex).reset();
-        this->*g.color = Color(0, 0, 0);
-        this->*g.mult = 1;
-        this->*g.override_ = false;
-    }
-}
+typedef MaterialOverrideEnvironment Env;
+typedef RowsOf<Env> EnvRow;
 
-bool MaterialOverrideEnvironment::save(QuickArchive& ar) const {
-    writeVersion(ar, kOverrideEnvironmentVersion);
-    if (!BaseMaterial::save(ar) || !saveOptionalMember(ar, base_mtl)) return false;
-    for (const EnvironmentGroup& g : kEnvironmentRecordOrder)
-        if (!saveOptionalMember(ar, this->*g.tex)) return false;
-    for (const EnvironmentGroup& g : kEnvironmentRecordOrder) ar.writeColor(this->*g.color);
-    for (const EnvironmentGroup& g : kEnvironmentRecordOrder) ar.writeFloat(this->*g.mult);
-    for (const EnvironmentGroup& g : kEnvironmentRecordOrder) ar.writeByte(this->*g.override_);
-    return true;
-}
+// The four environment groups (background, GI, reflection, refraction), each
+// row of the record walking them in this order.
+const RecordRow<Env> kOverrideEnvironmentRecord[] = {
+    kBaseRecord,
+    &Env::base_mtl,
+    &Env::bg_tex,
+    &Env::gi_tex,
+    &Env::reflect_tex,
+    &Env::refract_tex,
+    EnvRow::color(&Env::bg_color, Color(0, 0, 0), 1),
+    EnvRow::color(&Env::gi_color, Color(0, 0, 0), 1),
+    EnvRow::color(&Env::reflect_color, Color(0, 0, 0), 1),
+    EnvRow::color(&Env::refract_color, Color(0, 0, 0), 1),
+    EnvRow::f32(&Env::bg_tex_mult, 1, 1),
+    EnvRow::f32(&Env::gi_tex_mult, 1, 1),
+    EnvRow::f32(&Env::reflect_tex_mult, 1, 1),
+    EnvRow::f32(&Env::refract_tex_mult, 1, 1),
+    EnvRow::b8(&Env::override_bg, false, 1),
+    EnvRow::b8(&Env::override_gi, false, 1),
+    EnvRow::b8(&Env::override_reflect, false, 1),
+    EnvRow::b8(&Env::override_refract, false, 1),
+};
 
-bool MaterialOverrideEnvironment::load(QuickArchive& ar) {
-    const int v = readVersion(ar, 1, kOverrideEnvironmentVersion);
-    reset();  // also when the tag is refused
-    if (v < 0) return false;
-    if (!BaseMaterial::load(ar) || !loadMaterialMember(ar, base_mtl)) return false;
-    for (const EnvironmentGroup& g : kEnvironmentRecordOrder)
-        if (!loadTextureMember(ar, this->*g.tex)) return false;
-    for (const EnvironmentGroup& g : kEnvironmentRecordOrder) ar.readColor(this->*g.color);
-    for (const EnvironmentGroup& g : kEnvironmentRecordOrder) ar.readFloat(this->*g.mult);
-    for (const EnvironmentGroup& g : kEnvironmentRecordOrder) ar.readByte(this->*g.override_);
-    return true;
-}
-
-void MaterialOverrideEnvironment::copyChildren(bool newName) {
-    base_mtl = copyChild(base_mtl, newName);
-    for (const EnvironmentGroup& g : kEnvironmentRecordOrder) this->*g.tex = cloneChild(this->*g.tex);
-}
-
-bool MaterialOverrideEnvironment::sameContent(const MaterialOverrideEnvironment& o) const {
-    if (!childrenEqual(base_mtl, o.base_mtl)) return false;
-    for (const EnvironmentGroup& g : kEnvironmentRecordOrder)
-        if (!childrenEqual(this->*g.tex, o.*g.tex)) return false;
-    for (const EnvironmentGroup& g : kEnvironmentRecordOrder)
-        if (this->*g.color != o.*g.color || this->*g.mult != o.*g.mult ||
-            this->*g.override_ != o.*g.override_)
-            return false;
-    return true;
-}
+RowSpan<RecordRow<Env>> MaterialOverrideEnvironment::record() { return rowSpan(kOverrideEnvironmentRecord); }
 
 void MaterialOverrideEnvironment::writeXml(AssetXmlWriter& writer, std::u16string url) {
     if (base_mtl) base_mtl->writeXml(writer, url);

@@ -22,14 +22,13 @@
 
 namespace OrvaneLumoCore {
 
-class MaterialOverrideEnvironment : public MaterialOf<MaterialOverrideEnvironment, kMaterialOverrideEnvironment> {
+class MaterialOverrideEnvironment
+    : public TableMaterialOf<MaterialOverrideEnvironment, kMaterialOverrideEnvironment> {
 public:
-    MaterialOverrideEnvironment();
+    static constexpr int kRecordVersion = 1;
+    static RowSpan<RecordRow<MaterialOverrideEnvironment>> record();
 
-    bool save(QuickArchive& ar) const override;
-    bool load(QuickArchive& ar) override;
-    void reset() override;
-    bool sameContent(const MaterialOverrideEnvironment& o) const;
+    MaterialOverrideEnvironment();
 
     // No Asset of its own: base_mtl's Assets under the same url.
     void writeXml(AssetXmlWriter& writer, std::u16string url) override;
@@ -40,9 +39,6 @@ public:
     Color gi_color, bg_color, reflect_color, refract_color;
     float bg_tex_mult, gi_tex_mult, reflect_tex_mult, refract_tex_mult;
     bool override_bg, override_gi, override_reflect, override_refract;
-
-    // On a fresh copy: the children that are not to be shared.
-    void copyChildren(bool newName);
 };
 
 class MaterialDisplaced : public TableMaterialOf<MaterialDisplaced, kMaterialDisplaced> {
