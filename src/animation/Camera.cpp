@@ -2,55 +2,65 @@
 
 #include <boost/make_shared.hpp>
 
+#include "persistence/FieldRows.h"
 #include "persistence/QuickArchive.h"
 #include "persistence/Record.h"
-#include "xml/AssetXmlWriter.h"
+#include "xml/AssetScope.h"
 
 namespace OrvaneLumoCore {
 
 namespace {
 
-template <class... F>
-struct Overload : F... {
-    using F::operator()...;
-};
-template <class... F>
-Overload(F...) -> Overload<F...>;
-
 typedef PhysicalCamera C;
+typedef RowsOf<C> CR;
+
+// The two animated rows: each holds its default as its key at time 0.
+enum AnimatedRow { kFocalLength, kFocusDistance };
+
+AnimatedReal C::*animatedField(const RecordRow<C>& row) {
+    return row.hook == kFocalLength ? &C::focal_length : &C::focus_distance;
+}
+
+// An f32 of an old record that sets the key at time 0.
+void readKeyAtZero(QuickArchive& ar, AnimatedReal& value) {
+    float atZero = value.getValue(0.0);
+    ar.readFloat(atZero);
+    value.setValue(atZero, 0.0);
+}
+
+// The record, version 2, with the defaults. A bool is stored as a bool32.
+const RecordRow<C> kPhysicalCameraRows[] = {
+    CR::i32(&C::type, 0, 1),
+    CR::f32(&C::film_width, 36, 1),
+    CR::hook(kFocalLength, 1, {}, 40),
+    CR::f32(&C::zoom_factor, 1, 1),
+    CR::f32(&C::distortion, 0, 1),
+    CR::f32(&C::f_number, 8, 1),
+    CR::f32(&C::lens_shift, 0, 1),
+    CR::f32(&C::shutter_speed, 30, 1),
+    CR::f32(&C::shutter_angle, 180, 1),
+    CR::f32(&C::shutter_offset, 0, 1),
+    CR::f32(&C::latency, 0, 1),
+    CR::f32(&C::ISO, 200, 1),
+    CR::b32(&C::specify_focus, false, 1),
+    CR::hook(kFocusDistance, 1, {}, 200),
+    CR::b32(&C::targeted, false, 1),
+    CR::f32(&C::target_distance, 200, 1),
+    CR::f32(&C::dof_display_threshold, 0, 1),
+    CR::b32(&C::exposure, true, 1),
+    CR::color(&C::white_balance, Color(1, 1, 1), 1),
+    CR::b32(&C::vignetting, true, 1),
+    CR::b32(&C::blades_enable, false, 1),
+    CR::i32(&C::blades_num, 5, 1),
+    CR::f32(&C::blades_rotation, 0, 1),
+    CR::f32(&C::center_bias, 0, 1),
+    CR::f32(&C::anisotropy, 0, 1),
+    CR::b32(&C::use_dof, false, 1),
+    CR::b32(&C::use_moblur, false, 1),
+    CR::i32(&C::subdivs, 6, 1),
+};
 
 }  // namespace
-
-const std::array<CameraRow, 28> kPhysicalCameraRows = {{
-    {"type",                  &C::type,                  0},
-    {"film_width",            &C::film_width,            36},
-    {"focal_length",          &C::focal_length,          40},
-    {"zoom_factor",           &C::zoom_factor,           1},
-    {"distortion",            &C::distortion,            0},
-    {"f_number",              &C::f_number,              8},
-    {"lens_shift",            &C::lens_shift,            0},
-    {"shutter_speed",         &C::shutter_speed,         30},
-    {"shutter_angle",         &C::shutter_angle,         180},
-    {"shutter_offset",        &C::shutter_offset,        0},
-    {"latency",               &C::latency,               0},
-    {"ISO",                   &C::ISO,                   200},
-    {"specify_focus",         &C::specify_focus,         0},
-    {"focus_distance",        &C::focus_distance,        200},
-    {"targeted",              &C::targeted,              0},
-    {"target_distance",       &C::target_distance,       200},
-    {"dof_display_threshold", &C::dof_display_threshold, 0},
-    {"exposure",              &C::exposure,              1},
-    {"white_balance",         &C::white_balance,         1},
-    {"vignetting",            &C::vignetting,            1},
-    {"blades_enable",         &C::blades_enable,         0},
-    {"blades_num",            &C::blades_num,            5},
-    {"blades_rotation",       &C::blades_rotation,       0},
-    {"center_bias",           &C::center_bias,           0},
-    {"anisotropy",            &C::anisotropy,            0},
-    {"use_dof",               &C::use_dof,               0},
-    {"use_moblur",            &C::use_moblur,            0},
-    {"subdivs",               &C::subdivs,               6},
-}};
 
 // ---- PhysicalCamera ------------------------------------------------------------
 
@@ -61,37 +71,19 @@ boost::shared_ptr<BaseCamera> PhysicalCamera::clone() const {
 }
 
 void PhysicalCamera::reset() {
-    for (const CameraRow& row : kPhysicalCameraRows) {
-        const float d = row.byDefault;
-        std::visit(Overload{
-                       [&](std::int32_t C::*f) { this->*f = static_cast<std::int32_t>(d); },
-                       [&](float C::*f) { this->*f = d; },
-                       [&](bool C::*f) { this->*f = d != 0; },
-                       [&](Color C::*f) { this->*f = Color(d, d, d); },
-                       [&](AnimatedReal C::*f) {
-                           (this->*f).reset();
-                           (this->*f).setValue(d, 0.0);
-                       },
-                   },
-                   row.field);
+    resetFields(*this, kPhysicalCameraRows);
+    for (const RecordRow<C>& row : kPhysicalCameraRows) {
+        if (row.use != RowUse::Hook) continue;
+        AnimatedReal& value = this->*animatedField(row);
+        value.reset();
+        value.setValue(static_cast<float>(row.number), 0.0);
     }
 }
 
 bool PhysicalCamera::save(QuickArchive& ar) const {
     writeVersion(ar, 2);
-    bool ok = true;
-    for (const CameraRow& row : kPhysicalCameraRows) {
-        std::visit(Overload{
-                       [&](std::int32_t C::*f) { ar.writeInt(this->*f); },
-                       [&](float C::*f) { ar.writeFloat(this->*f); },
-                       [&](bool C::*f) { ar.writeInt(this->*f ? 1 : 0); },
-                       [&](Color C::*f) { ar.writeColor(this->*f); },
-                       [&](AnimatedReal C::*f) { ok = ok && (this->*f).save(ar); },
-                   },
-                   row.field);
-        if (!ok) return false;
-    }
-    return true;
+    return writeFields(ar, *this, kPhysicalCameraRows, 2,
+                       [&](const RecordRow<C>& row) { return (this->*animatedField(row)).save(ar); });
 }
 
 // Version 1 holds the two animated rows as one f32 each, the key at time 0;
@@ -100,40 +92,17 @@ bool PhysicalCamera::load(QuickArchive& ar) {
     reset();
     const int version = readVersion(ar, 1, 2);
     if (version < 0) return false;
-    bool ok = true;
-    for (const CameraRow& row : kPhysicalCameraRows) {
-        std::visit(Overload{
-                       [&](std::int32_t C::*f) { ar.readInt(this->*f); },
-                       [&](float C::*f) { ar.readFloat(this->*f); },
-                       [&](bool C::*f) {
-                           std::int32_t flag = (this->*f) ? 1 : 0;
-                           ar.readInt(flag);
-                           this->*f = flag != 0;
-                       },
-                       [&](Color C::*f) { ar.readColor(this->*f); },
-                       [&](AnimatedReal C::*f) {
-                           AnimatedReal& value = this->*f;
-                           if (version >= 2) {
-                               ok = loadNested(ar, value);
-                               return;
-                           }
-                           float atZero = value.getValue(0.0);
-                           ar.readFloat(atZero);
-                           value.setValue(atZero, 0.0);
-                       },
-                   },
-                   row.field);
-        if (!ok) return false;
-    }
-    return true;
+    return readFields(ar, *this, kPhysicalCameraRows, version, [&](const RecordRow<C>& row) {
+        AnimatedReal& value = this->*animatedField(row);
+        if (version >= 2) return loadNested(ar, value);
+        readKeyAtZero(ar, value);
+        return true;
+    });
 }
 
 bool PhysicalCamera::operator==(const PhysicalCamera& o) const {
-    bool same = true;
-    for (const CameraRow& row : kPhysicalCameraRows) {
-        std::visit([&](auto C::*f) { same = same && this->*f == o.*f; }, row.field);
-    }
-    return same;
+    return fieldsEqual(*this, o, kPhysicalCameraRows) && focal_length == o.focal_length &&
+           focus_distance == o.focus_distance;
 }
 
 // ---- RenderView ----------------------------------------------------------------
@@ -146,13 +115,6 @@ const Rect kNoRect = [] {
     r.width = r.height = 0;
     return r;
 }();
-
-// An f32 of an old record that sets the key at time 0.
-void readKeyAtZero(QuickArchive& ar, AnimatedReal& value) {
-    float atZero = value.getValue(0.0);
-    ar.readFloat(atZero);
-    value.setValue(atZero, 0.0);
-}
 
 // Versions 1 and 2 keep the view state as a bool8 flag: false is state 1.
 void readStateFlag(QuickArchive& ar, AnimatedInt& state) {
@@ -232,14 +194,10 @@ bool RenderView::load(QuickArchive& ar) {
 
 void RenderView::writeXml(AssetXmlWriter& writer, std::u16string url) {
     const std::u16string assetUrl = url + u"/" + getPluginName();
-    writer.openAsset(assetUrl, "settings", "");
-    writer.openPlugin(getPluginName(), "settings");
-    writer.openParameters();
-    writer.writeInteger("img_width", img_width);
-    writer.writeInteger("img_height", img_height);
-    writer.closeParameters();
-    writer.closePlugin();
-    writer.closeAsset();
+    writeAsset(writer, assetUrl, "settings", getPluginName(), [&] {
+        writer.writeInteger("img_width", img_width);
+        writer.writeInteger("img_height", img_height);
+    });
 }
 
 bool RenderView::operator==(const RenderView& o) const {

@@ -1,10 +1,8 @@
 #pragma once
 // The physical camera (lens, shutter and film of a real camera) and the render
 // view (an animated camera transform and the image size).
-#include <array>
 #include <cstdint>
 #include <string>
-#include <variant>
 
 #include <boost/shared_ptr.hpp>
 
@@ -14,25 +12,6 @@
 #include "persistence/Types.h"
 
 namespace OrvaneLumoCore {
-
-class PhysicalCamera;
-
-// One row of the camera's record: its name (also the name of the camera's
-// settings parameter), the field it fills and the field's default. A bool
-// is stored as a bool32; a colour takes the default for r, g and b; an
-// animated value holds it as its key at time 0.
-struct CameraRow {
-    typedef std::variant<std::int32_t PhysicalCamera::*, float PhysicalCamera::*,
-                         bool PhysicalCamera::*, Color PhysicalCamera::*,
-                         AnimatedReal PhysicalCamera::*>
-        Field;
-    const char* name;
-    Field field;
-    float byDefault;
-};
-
-// The 28 rows of the record, in record order.
-extern const std::array<CameraRow, 28> kPhysicalCameraRows;
 
 class PhysicalCamera : public BaseCamera {
 public:

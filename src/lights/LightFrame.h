@@ -1,6 +1,6 @@
 #pragma once
-// What the light classes share: the operations that follow from a class's
-// tag and defaults, the record frame of a flat record, and the Asset frame.
+// What the light classes share: the family base with the operations that
+// follow from a class's tag and defaults, and the Asset of a light.
 #include <cstddef>
 #include <cstdint>
 #include <string>
@@ -8,65 +8,26 @@
 #include <boost/make_shared.hpp>
 
 #include "lights/BaseLight.h"
+#include "persistence/FamilyOf.h"
 #include "persistence/FieldRows.h"
 #include "persistence/Record.h"
-#include "xml/AssetXmlWriter.h"
+#include "xml/AssetScope.h"
+#include "xml/ParamRows.h"
 
 namespace OrvaneLumoCore {
 
 // Base of a light class `Derived` with type tag `Tag`. The class's defaults
-// are its member initialisers: `reset` assigns a new default object, and
-// `clone` copies (lights hold no shared children).
+// are its member initialisers, so the family's `reset` serves, and `clone`
+// copies (lights hold no shared children).
 template <class Derived, std::uint32_t Tag>
-class LightOf : public BaseLight {
-public:
-    static constexpr std::uint32_t kType = Tag;
-
-    std::uint32_t getType() const override { return Tag; }
-    LightPtr clone() const override { return boost::make_shared<Derived>(self()); }
-    void reset() override { static_cast<Derived&>(*this) = Derived(); }
-
-protected:
-    const Derived& self() const { return static_cast<const Derived&>(*this); }
-
-    // `other` as a Derived, or null if it is null or of another class.
-    const Derived* sameClass(const LightPtr& other) const {
-        if (!other || other->getType() != Tag) return nullptr;
-        return static_cast<const Derived*>(other.get());
-    }
-};
-
-// Resets `light` and reads a version tag of 1 to `newest`, then the fields
-// of `rows` that the version holds. Returns the version, or -1 for a tag
-// that isn't listed.
-template <class L, std::size_t N>
-int loadFlatRecord(L& light, QuickArchive& ar, const RecordRow<L> (&rows)[N], int newest) {
-    light.reset();
-    const int v = readVersion(ar, 1, newest);
-    if (v < 0) return -1;
-    readFields(ar, light, rows, v);
-    return v;
-}
-
-// Writes the tag of version `newest` and the fields of that version.
-template <class L, std::size_t N>
-void saveFlatRecord(const L& light, QuickArchive& ar, const RecordRow<L> (&rows)[N], int newest) {
-    writeVersion(ar, newest);
-    writeFields(ar, light, rows, newest);
-}
+using LightOf = FamilyOf<Derived, Tag, BaseLight>;
 
 // The Asset of a light under `url`: Asset, plugin and parameters opened,
 // `writeParams()` called, everything closed again.
 template <class WriteParams>
 void writeLightAsset(AssetXmlWriter& w, const std::u16string& url, const std::u16string& plugin,
                      WriteParams writeParams) {
-    w.openAsset(url, "light", "");
-    w.openPlugin(plugin, "light");
-    w.openParameters();
-    writeParams();
-    w.closeParameters();
-    w.closePlugin();
-    w.closeAsset();
+    writeAsset(w, url, "light", plugin, writeParams);
 }
 
 }  // namespace OrvaneLumoCore

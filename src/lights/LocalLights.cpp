@@ -223,9 +223,8 @@ bool MayaDirectLight::load(QuickArchive& ar) {
     return true;
 }
 
-bool MayaDirectLight::isEqual(const LightPtr& other) const {
-    const Dir* o = sameClass(other);
-    return o && fieldsEqual(*this, *o, kDirectRecord) && transform == o->transform;
+bool MayaDirectLight::sameContent(const MayaDirectLight& o) const {
+    return fieldsEqual(*this, o, kDirectRecord) && transform == o.transform;
 }
 
 void MayaDirectLight::writeXml(AssetXmlWriter& writer, std::u16string url) {
@@ -234,17 +233,7 @@ void MayaDirectLight::writeXml(AssetXmlWriter& writer, std::u16string url) {
 
 // ---- OmniLight ----
 
-bool OmniLight::save(QuickArchive& ar) const {
-    saveFlatRecord(*this, ar, kOmniRecord, kNewest);
-    return true;
-}
-
-bool OmniLight::load(QuickArchive& ar) { return loadFlatRecord(*this, ar, kOmniRecord, kNewest) > 0; }
-
-bool OmniLight::isEqual(const LightPtr& other) const {
-    const OmniLight* o = sameClass(other);
-    return o && fieldsEqual(*this, *o, kOmniRecord);
-}
+RowSpan<RecordRow<OmniLight>> OmniLight::record() { return rowSpan(kOmniRecord); }
 
 void OmniLight::writeXml(AssetXmlWriter& writer, std::u16string url) {
     writeParamAsset(writer, url, *this, kOmniParams);
@@ -252,17 +241,7 @@ void OmniLight::writeXml(AssetXmlWriter& writer, std::u16string url) {
 
 // ---- SpotLight ----
 
-bool SpotLight::save(QuickArchive& ar) const {
-    saveFlatRecord(*this, ar, kSpotRecord, kNewest);
-    return true;
-}
-
-bool SpotLight::load(QuickArchive& ar) { return loadFlatRecord(*this, ar, kSpotRecord, kNewest) > 0; }
-
-bool SpotLight::isEqual(const LightPtr& other) const {
-    const SpotLight* o = sameClass(other);
-    return o && fieldsEqual(*this, *o, kSpotRecord);
-}
+RowSpan<RecordRow<SpotLight>> SpotLight::record() { return rowSpan(kSpotRecord); }
 
 void SpotLight::writeXml(AssetXmlWriter& writer, std::u16string url) {
     writeLightAsset(writer, url + u"/" + getPluginName(), getPluginName(), [&] {
@@ -274,19 +253,7 @@ void SpotLight::writeXml(AssetXmlWriter& writer, std::u16string url) {
 
 // ---- RectangleLight ----
 
-bool RectangleLight::save(QuickArchive& ar) const {
-    saveFlatRecord(*this, ar, kRectangleRecord, kNewest);
-    return true;
-}
-
-bool RectangleLight::load(QuickArchive& ar) {
-    return loadFlatRecord(*this, ar, kRectangleRecord, kNewest) > 0;
-}
-
-bool RectangleLight::isEqual(const LightPtr& other) const {
-    const RectLight* o = sameClass(other);
-    return o && fieldsEqual(*this, *o, kRectangleRecord);
-}
+RowSpan<RecordRow<RectangleLight>> RectangleLight::record() { return rowSpan(kRectangleRecord); }
 
 void RectangleLight::writeXml(AssetXmlWriter& writer, std::u16string url) {
     writeParamAsset(writer, url, *this, kRectangleParams);
@@ -322,16 +289,15 @@ bool SphereLight::load(QuickArchive& ar) {
     return true;
 }
 
-bool SphereLight::isEqual(const LightPtr& other) const {
-    const SphereLight* o = sameClass(other);
-    if (!o || transform != o->transform || color != o->color || shadowColor != o->shadowColor)
+bool SphereLight::sameContent(const SphereLight& o) const {
+    if (transform != o.transform || color != o.color || shadowColor != o.shadowColor)
         return false;
     for (int k = 0; k < kRealCount; ++k)
-        if (reals[k] != o->reals[k]) return false;
+        if (reals[k] != o.reals[k]) return false;
     for (int k = 0; k < kIntCount; ++k)
-        if (ints[k] != o->ints[k]) return false;
+        if (ints[k] != o.ints[k]) return false;
     for (int k = 0; k < kFlagCount; ++k)
-        if (flags[k] != o->flags[k]) return false;
+        if (flags[k] != o.flags[k]) return false;
     return true;
 }
 

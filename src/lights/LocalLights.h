@@ -15,7 +15,7 @@ class MayaDirectLight : public LightOf<MayaDirectLight, 0> {
 public:
     bool save(QuickArchive& ar) const override;
     bool load(QuickArchive& ar) override;
-    bool isEqual(const LightPtr& other) const override;
+    bool sameContent(const MayaDirectLight& o) const;
     void writeXml(AssetXmlWriter& writer, std::u16string url) override;
     std::u16string getPluginName() const override { return u"MayaLightDirect"; }
 
@@ -60,22 +60,22 @@ struct PointLightFields : PlacedLightFields {
     std::int32_t shadowSubdivs = 8;
 };
 
-class OmniLight : public LightOf<OmniLight, 2>, public PointLightFields {
+class OmniLight : public FlatFamilyOf<OmniLight, 2, BaseLight>, public PointLightFields {
 public:
-    bool save(QuickArchive& ar) const override;
-    bool load(QuickArchive& ar) override;
-    bool isEqual(const LightPtr& other) const override;
+    static constexpr int kRecordVersion = 4;
+    static RowSpan<RecordRow<OmniLight>> record();
+
     void writeXml(AssetXmlWriter& writer, std::u16string url) override;
     std::u16string getPluginName() const override { return u"LightOmni"; }
 
     float intensity = 30.0f;
 };
 
-class SpotLight : public LightOf<SpotLight, 4>, public PointLightFields {
+class SpotLight : public FlatFamilyOf<SpotLight, 4, BaseLight>, public PointLightFields {
 public:
-    bool save(QuickArchive& ar) const override;
-    bool load(QuickArchive& ar) override;
-    bool isEqual(const LightPtr& other) const override;
+    static constexpr int kRecordVersion = 4;
+    static RowSpan<RecordRow<SpotLight>> record();
+
     void writeXml(AssetXmlWriter& writer, std::u16string url) override;
     std::u16string getPluginName() const override { return u"LightSpot"; }
 
@@ -89,11 +89,11 @@ public:
     bool barnDoor = false;
 };
 
-class RectangleLight : public LightOf<RectangleLight, 3>, public PlacedLightFields {
+class RectangleLight : public FlatFamilyOf<RectangleLight, 3, BaseLight>, public PlacedLightFields {
 public:
-    bool save(QuickArchive& ar) const override;
-    bool load(QuickArchive& ar) override;
-    bool isEqual(const LightPtr& other) const override;
+    static constexpr int kRecordVersion = 4;
+    static RowSpan<RecordRow<RectangleLight>> record();
+
     void writeXml(AssetXmlWriter& writer, std::u16string url) override;
     std::u16string getPluginName() const override { return u"LightRectangle"; }
 
@@ -121,7 +121,7 @@ public:
 
     bool save(QuickArchive& ar) const override;
     bool load(QuickArchive& ar) override;
-    bool isEqual(const LightPtr& other) const override;
+    bool sameContent(const SphereLight& o) const;
 
     Color color{1, 1, 1};
     Color shadowColor{0, 0, 0};

@@ -84,7 +84,6 @@ const ParamRow<IESLight> kIesParams[] = {
 };
 
 constexpr int kSunNewest = 4;
-constexpr int kIesNewest = 3;
 
 }  // namespace
 
@@ -144,16 +143,13 @@ bool SunLight::load(QuickArchive& ar) {
     return true;
 }
 
-LightPtr SunLight::clone() const {
-    boost::shared_ptr<SunLight> copy = boost::make_shared<SunLight>(*this);
-    copy->id = platform::newUuidString();
-    return copy;
+void SunLight::finishClone() {
+    id = platform::newUuidString();
 }
 
-bool SunLight::isEqual(const LightPtr& other) const {
-    const SunLight* o = sameClass(other);
-    return o && id == o->id && name == o->name && transform == o->transform &&
-           sunSettingsEqual(*this, *o) && enabled == o->enabled && invisible == o->invisible;
+bool SunLight::sameContent(const SunLight& o) const {
+    return id == o.id && name == o.name && transform == o.transform &&
+           sunSettingsEqual(*this, o) && enabled == o.enabled && invisible == o.invisible;
 }
 
 void SunLight::writeXml(AssetXmlWriter& writer, std::u16string url) {
@@ -187,17 +183,7 @@ namespace {
 
 // ---- IESLight ----
 
-bool IESLight::save(QuickArchive& ar) const {
-    saveFlatRecord(*this, ar, kIesRecord, kIesNewest);
-    return true;
-}
-
-bool IESLight::load(QuickArchive& ar) { return loadFlatRecord(*this, ar, kIesRecord, kIesNewest) > 0; }
-
-bool IESLight::isEqual(const LightPtr& other) const {
-    const IESLight* o = sameClass(other);
-    return o && fieldsEqual(*this, *o, kIesRecord);
-}
+RowSpan<RecordRow<IESLight>> IESLight::record() { return rowSpan(kIesRecord); }
 
 void IESLight::writeXml(AssetXmlWriter& writer, std::u16string url) {
     writeLightAsset(writer, url + u"/" + getPluginName(), getPluginName(),

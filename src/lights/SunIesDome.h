@@ -47,10 +47,10 @@ public:
 
     bool save(QuickArchive& ar) const override;
     bool load(QuickArchive& ar) override;
-    // A copy with a new id.
-    LightPtr clone() const override;
+    // A copy gets a new id.
+    void finishClone();
     // Id and name compare exactly.
-    bool isEqual(const LightPtr& other) const override;
+    bool sameContent(const SunLight& o) const;
 
     // Writes the sun once per writer and records its url in the writer's
     // sunRegistry. An empty url stands for "/" and the id; the document sun
@@ -79,12 +79,11 @@ void resetDocumentSun();
 // True if `id` is the document sun's id, ignoring case.
 bool isDocumentSunId(const std::u16string& id);
 
-class IESLight : public LightOf<IESLight, 6> {
+class IESLight : public FlatFamilyOf<IESLight, 6, BaseLight> {
 public:
-    bool save(QuickArchive& ar) const override;
-    bool load(QuickArchive& ar) override;
-    // The file path compares without regard to case.
-    bool isEqual(const LightPtr& other) const override;
+    static constexpr int kRecordVersion = 3;
+    static RowSpan<RecordRow<IESLight>> record();  // the file path compares without regard to case
+
     void writeXml(AssetXmlWriter& writer, std::u16string url) override;
     std::u16string getPluginName() const override { return u"LightIES"; }
 
@@ -112,7 +111,7 @@ public:
     bool save(QuickArchive& ar) const override;
     // Reads the version tag that `save` writes.
     bool load(QuickArchive& ar) override;
-    bool isEqual(const LightPtr& other) const override { return sameClass(other) != nullptr; }
+    bool sameContent(const DomeLight&) const { return true; }
 };
 
 }  // namespace OrvaneLumoCore

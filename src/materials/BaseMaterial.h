@@ -82,13 +82,6 @@ protected:
         if (newName) copy->name = uniqueMaterialName(source.name);
         return copy;
     }
-
-    // The other material, if it is of this class; null otherwise.
-    template <class T>
-    static const T* sameClass(const T& self, const boost::shared_ptr<BaseMaterial>& other) {
-        if (!other || other->getType() != self.getType()) return nullptr;
-        return dynamic_cast<const T*>(other.get());
-    }
 };
 
 typedef boost::shared_ptr<BaseMaterial> MaterialPtr;

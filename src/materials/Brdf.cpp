@@ -5,8 +5,6 @@
 
 #include <algorithm>
 #include <initializer_list>
-#include <optional>
-#include <variant>
 #include <vector>
 
 #include <boost/any.hpp>
@@ -17,42 +15,35 @@
 #include "platform/WideChar.h"
 #include "textures/Bitmaps.h"
 #include "textures/BasicTextures.h"
-#include "xml/AssetXmlWriter.h"
+#include "xml/AssetScope.h"
+#include "xml/ParamRows.h"
 
 namespace OrvaneLumoCore {
 
 namespace {
 
 // ---- record rows -----------------------------------------------------------------
+//
+// A layer's record is one list of rows per version, in the one record row
+// form. Plain fields are written as bare member pointers; a texture member is
+// an optional texture member. The rows that need code are hook rows:
 
-enum class RowKind : std::uint8_t {
-    Field,          // a plain field, in the encoding of its type
-    Texture,        // optional texture member
-    Path,           // `wstring` path of old records, made into a bitmap texture
-    FresnelIor,     // `f32` index of refraction of the old Fresnel pair
-    FresnelSwitch,  // `i32` switch of the old Fresnel pair
-    FresnelRule,    // no bytes: applies the Fresnel pair to `transparency_tex`
-    BaseRecord      // the base record of Base_BRDF
+enum LayerHook {
+    kTextureMember = 0,  // optional texture member (a row of a texture field)
+    kPathCode,           // `wstring` path of old records, made into a bitmap texture
+    kFresnelIorCode,     // `f32` index of refraction of the old Fresnel pair
+    kFresnelSwitchCode,  // `i32` switch of the old Fresnel pair
+    kFresnelRuleCode,    // no bytes: applies the Fresnel pair to the Fresnel target
+    kBaseCode,           // the base record of Base_BRDF
 };
 
-// One field of a record. A row is made from a pointer to the field: a plain
-// field becomes a FieldRef, which reads, writes and compares it; the kinds
-// without a field of their own are made from the kind (and, for a path, the
-// texture it fills).
-template <class L>
-struct Row {
-    RowKind kind;
-    std::optional<FieldRef<L>> field;
-    TexturePtr L::*texture = nullptr;
-
-    template <class T>
-    Row(T L::*p) : kind(RowKind::Field), field(FieldRef<L>(p)) {}
-    Row(TexturePtr L::*p) : kind(RowKind::Texture), texture(p) {}
-    Row(RowKind k, TexturePtr L::*p = nullptr) : kind(k), texture(p) {}
-};
+const RowHook kBase{kBaseCode};
+const RowHook kFresnelIor{kFresnelIorCode};
+const RowHook kFresnelSwitch{kFresnelSwitchCode};
+const RowHook kFresnelRule{kFresnelRuleCode};
 
 template <class L>
-using Rows = std::vector<Row<L>>;
+using Rows = std::vector<RecordRow<L>>;
 
 // Rows of several groups, one after the other: a version of a record reads
 // like its table ("rows 1 to 3; rows 5 to 7").
@@ -64,35 +55,27 @@ Rows<L> join(std::initializer_list<Rows<L>> groups) {
 }
 
 template <class L>
-Row<L> path(TexturePtr L::*texture) { return Row<L>(RowKind::Path, texture); }
+RecordRow<L> path(TexturePtr L::*texture) {
+    RecordRow<L> row(texture);
+    row.hook = kPathCode;
+    return row;
+}
 
 // ---- XML parameters --------------------------------------------------------------
+//
+// Plain fields in the form of their type; a texture is referred to by its slot
+// url; two parameters are derived from a field:
 
-// 1 - reflection per component, 0 where negative.
-template <class L>
-struct FromReflection {
-    Color L::*reflection;
-};
-
-// An integer field tested against 0.
-template <class L>
-struct BoolFromInt {
-    std::int32_t L::*integer;
+enum ParamHook {
+    kFromReflection = 1,  // colour: 1 - reflection per component, 0 where negative
+    kBoolFromInt,         // bool: an integer field tested against 0
 };
 
 template <class L>
-FromReflection<L> fromReflection(Color L::*p) { return {p}; }
+ParamRow<L> fromReflection(const char* name, Color L::*p) { return {name, p, "", false, kFromReflection}; }
 
 template <class L>
-BoolFromInt<L> boolFromInt(std::int32_t L::*p) { return {p}; }
-
-// A parameter: a plain field in the form of its type, a texture referred to
-// by its slot url, or one of the two derived forms.
-template <class L>
-struct Param {
-    const char* name;
-    std::variant<FieldRef<L>, TexturePtr L::*, FromReflection<L>, BoolFromInt<L>> field;
-};
+ParamRow<L> boolFromInt(const char* name, std::int32_t L::*p) { return {name, p, "", false, kBoolFromInt}; }
 
 // A texture slot: the field and the word of its url.
 template <class L>
@@ -101,13 +84,15 @@ struct Slot {
     const char16_t* word;
 };
 
+// What a layer class describes: its records by version, its slots and its
+// parameters.
 template <class L>
-struct LayerTable {
+struct LayerLayout {
     int currentVersion;
-    std::vector<Rows<L>> records;  // by version; entry 0 unused
-    std::vector<Slot<L>> slots;    // in the order their Assets are written
-    std::vector<Param<L>> params;  // in XML order
-    TexturePtr L::*fresnelTarget;  // what the Fresnel rule fills
+    std::vector<Rows<L>> records;     // by version; entry 0 unused
+    std::vector<Slot<L>> slots;       // in the order their Assets are written
+    std::vector<ParamRow<L>> params;  // in XML order
+    TexturePtr L::*fresnelTarget;     // what the Fresnel rule fills
 };
 
 // ---- the walks -----------------------------------------------------------------------
@@ -124,87 +109,79 @@ TexturePtr makeFresnelTexture(float ior) {
     return fresnel;
 }
 
+// The texture field of a row or parameter.
+template <class L, class Row>
+TexturePtr& textureOf(L& layer, const Row& row) {
+    return row.field.template get<TexturePtr>(layer);
+}
+template <class L, class Row>
+const TexturePtr& textureOf(const L& layer, const Row& row) {
+    return row.field.template get<TexturePtr>(layer);
+}
+
 template <class L>
-bool saveRows(const L& layer, QuickArchive& ar, const LayerTable<L>& table) {
+bool saveRows(const L& layer, QuickArchive& ar, const LayerLayout<L>& table) {
     writeVersion(ar, table.currentVersion);
-    for (const Row<L>& row : table.records[table.currentVersion]) {
-        switch (row.kind) {
-        case RowKind::Field: row.field->write(ar, layer); break;
-        case RowKind::Texture:
-            if (!saveOptionalMember(ar, layer.*row.texture)) return false;
-            break;
-        case RowKind::BaseRecord:
-            if (!layer.Base_BRDF::save(ar)) return false;
-            break;
-        default:  // old forms are never written
-            return false;
-        }
-    }
-    return true;
+    return writeFields(ar, layer, table.records[table.currentVersion], table.currentVersion,
+                       [&](const RecordRow<L>& row) {
+                           switch (row.hook) {
+                           case kTextureMember: return saveOptionalMember(ar, textureOf(layer, row));
+                           case kBaseCode: return layer.Base_BRDF::save(ar);
+                           default: return false;  // old forms are never written
+                           }
+                       });
 }
 
 // Reads the rows of the version that the tag names. The caller has reset
 // the layer as its class requires.
 template <class L>
-bool loadRows(L& layer, QuickArchive& ar, const LayerTable<L>& table, bool emptyFresnelTarget) {
+bool loadRows(L& layer, QuickArchive& ar, const LayerLayout<L>& table, bool emptyFresnelTarget) {
     const int version = readVersion(ar, 1, table.currentVersion);
     if (version < 0) return false;
     // The default Fresnel texture of a new layer survives in no loaded one.
     if (emptyFresnelTarget) (layer.*table.fresnelTarget).reset();
     FresnelPair fresnel;
-    for (const Row<L>& row : table.records[version]) {
-        switch (row.kind) {
-        case RowKind::Field: row.field->read(ar, layer); break;
-        case RowKind::Texture:
-            if (!loadOptionalMember(ar, layer.*row.texture, &createTexture)) return false;
-            break;
-        case RowKind::Path: {
+    return readFields(ar, layer, table.records[version], version, [&](const RecordRow<L>& row) {
+        switch (row.hook) {
+        case kTextureMember: return loadOptionalMember(ar, textureOf(layer, row), &createTexture);
+        case kPathCode: {
             std::u16string file;
             ar.readWString(file);
-            layer.*row.texture = makeBitmapTextureFromPath(file);
-            break;
+            textureOf(layer, row) = makeBitmapTextureFromPath(file);
+            return true;
         }
-        case RowKind::FresnelIor: ar.readFloat(fresnel.ior); break;
-        case RowKind::FresnelSwitch: ar.readInt(fresnel.enabled); break;
-        case RowKind::FresnelRule:
+        case kFresnelIorCode: ar.readFloat(fresnel.ior); return true;
+        case kFresnelSwitchCode: ar.readInt(fresnel.enabled); return true;
+        case kFresnelRuleCode:
             if (fresnel.enabled != 0) layer.*table.fresnelTarget = makeFresnelTexture(fresnel.ior);
-            break;
-        case RowKind::BaseRecord:
-            if (!layer.Base_BRDF::load(ar)) return false;
-            break;
+            return true;
+        case kBaseCode: return layer.Base_BRDF::load(ar);
         }
-    }
-    return true;
+        return false;
+    });
 }
 
 // Every field of the current record but the base record: textures through
 // their own isEqual, colours per component, numbers exactly.
 template <class L>
-bool fieldsEqual(const L& a, const BrdfPtr& other, const LayerTable<L>& table) {
-    if (!other || other->getType() != a.getType()) return false;
-    const L* b = dynamic_cast<const L*>(other.get());
-    if (!b) return false;
-    for (const Row<L>& row : table.records[table.currentVersion]) {
-        bool same = true;
-        switch (row.kind) {
-        case RowKind::Field: same = row.field->equal(a, *b); break;
-        case RowKind::Texture: same = childrenEqual(a.*row.texture, b->*row.texture); break;
-        default: break;
-        }
-        if (!same) return false;
+bool fieldsEqual(const L& a, const L& b, const LayerLayout<L>& table) {
+    const Rows<L>& rows = table.records[table.currentVersion];
+    for (const RecordRow<L>& row : rows) {
+        const bool isTexture = row.field.kind() == FieldRef<L>::Kind::Texture;
+        if (isTexture && !childrenEqual(textureOf(a, row), textureOf(b, row))) return false;
     }
-    return true;
+    return fieldsEqual(a, b, rows);
 }
 
 template <class L>
-void cloneSlots(L& copy, const LayerTable<L>& table) {
+void cloneSlots(L& copy, const LayerLayout<L>& table) {
     for (const Slot<L>& slot : table.slots) copy.*slot.texture = cloneChild(copy.*slot.texture);
 }
 
 template <class L>
-const char16_t* slotWord(TexturePtr L::*texture, const LayerTable<L>& table) {
+const char16_t* slotWord(const L& layer, const TexturePtr& texture, const LayerLayout<L>& table) {
     for (const Slot<L>& slot : table.slots) {
-        if (slot.texture == texture) return slot.word;
+        if (&(layer.*slot.texture) == &texture) return slot.word;
     }
     return u"";
 }
@@ -216,7 +193,7 @@ Color colorFromReflection(const Color& reflection) {
 
 template <class L>
 void writeLayer(const L& layer, AssetXmlWriter& writer, std::u16string url,
-                const LayerTable<L>& table) {
+                const LayerLayout<L>& table) {
     url += u'/';
     url += layer.name;
     const std::u16string slotPrefix = url + u'/';
@@ -224,35 +201,27 @@ void writeLayer(const L& layer, AssetXmlWriter& writer, std::u16string url,
         const TexturePtr& texture = layer.*slot.texture;
         if (texture) texture->writeXml(writer, slotPrefix + slot.word);
     }
-    writer.openAsset(url, layer.getAssetType(), "");
-    writer.openPlugin(layer.getPluginName(), layer.getAssetType());
-    writer.openParameters();
-    for (const Param<L>& p : table.params) {
-        if (auto f = std::get_if<FieldRef<L>>(&p.field)) {
-            f->writeParam(writer, p.name, "", false, layer);
-        } else if (auto t = std::get_if<TexturePtr L::*>(&p.field)) {
-            writer.writePluginRef(p.name, boost::any(layer.**t), slotPrefix + slotWord(*t, table));
-        } else if (auto r = std::get_if<FromReflection<L>>(&p.field)) {
-            writer.writeColor(p.name, colorFromReflection(layer.*r->reflection));
-        } else if (auto i = std::get_if<BoolFromInt<L>>(&p.field)) {
-            writer.writeBool(p.name, layer.*i->integer != 0);
+    openPluginAsset(writer, url, layer.getAssetType(), layer.getPluginName(), "");
+    writeParams(writer, layer, table.params, [&](const ParamRow<L>& p) {
+        switch (p.hook) {
+        case kFromReflection:
+            writer.writeColor(p.name, colorFromReflection(p.field.template get<Color>(layer)));
+            break;
+        case kBoolFromInt: writer.writeBool(p.name, p.field.template get<std::int32_t>(layer) != 0); break;
+        default: {
+            const TexturePtr& texture = textureOf(layer, p);
+            writer.writePluginRef(p.name, boost::any(texture), slotPrefix + slotWord(layer, texture, table));
         }
-    }
-    writer.closeParameters();
-    writer.closePlugin();
-    writer.closeAsset();
+        }
+    });
+    closePluginAsset(writer);
 }
-
-const RowKind kBase = RowKind::BaseRecord;
-const RowKind kFresnelIor = RowKind::FresnelIor;
-const RowKind kFresnelSwitch = RowKind::FresnelSwitch;
-const RowKind kFresnelRule = RowKind::FresnelRule;
 
 // ---- Glass_BRDF ------------------------------------------------------------------------
 
-const LayerTable<Glass_BRDF>& glassTable() {
+const LayerLayout<Glass_BRDF>& glassTable() {
     typedef Glass_BRDF G;
-    static const LayerTable<G> table = [] {
+    static const LayerLayout<G> table = [] {
         // The rows of the current record, numbered as old versions name them.
         const Rows<G> r1 = {&G::color, &G::fog_color};
         const Rows<G> r2 = {&G::ior, &G::ior_second, &G::cutoff, &G::fog_color_mult, &G::glossiness};
@@ -273,7 +242,7 @@ const LayerTable<Glass_BRDF>& glassTable() {
         const Rows<G> v2Paths = {path(&G::transparency_tex), path(&G::glossiness_tex),
                                  path(&G::ior_tex)};
 
-        LayerTable<G> s;
+        LayerLayout<G> s;
         s.currentVersion = 6;
         s.records = {
             {},
@@ -297,9 +266,9 @@ const LayerTable<Glass_BRDF>& glassTable() {
             {"transparency", &G::transparency},
             {"fog_color", &G::fog_color},
             {"translucency", &G::translucency},
-            {"affect_shadows", boolFromInt(&G::affect_shadows)},
-            {"affect_alpha", boolFromInt(&G::affect_alpha)},
-            {"translucency_on", boolFromInt(&G::translucency_on)},
+            boolFromInt("affect_shadows", &G::affect_shadows),
+            boolFromInt("affect_alpha", &G::affect_alpha),
+            boolFromInt("translucency_on", &G::translucency_on),
             {"ior", &G::ior},
             {"fog_color_mult", &G::fog_color_mult},
             {"glossiness", &G::glossiness},
@@ -327,9 +296,9 @@ const LayerTable<Glass_BRDF>& glassTable() {
 
 // ---- Phong_BRDF, Blinn_BRDF ------------------------------------------------------------
 
-const LayerTable<BaseGlossy_BRDF>& glossyTable() {
+const LayerLayout<BaseGlossy_BRDF>& glossyTable() {
     typedef BaseGlossy_BRDF P;
-    static const LayerTable<P> table = [] {
+    static const LayerLayout<P> table = [] {
         // The head that all old records share, with the Fresnel pair inside.
         const Rows<P> head = {&P::color, &P::reflection, &P::hilightGlossiness,
                               &P::reflectionGlossiness, kFresnelIor, &P::cutoff, &P::subdivs,
@@ -342,7 +311,7 @@ const LayerTable<BaseGlossy_BRDF>& glossyTable() {
                                  &P::reflectionGlossiness_tex};
         const Rows<P> anisotropy = {&P::anisotropy, &P::anisotropy_rotation};
 
-        LayerTable<P> s;
+        LayerLayout<P> s;
         s.currentVersion = 6;
         s.records = {
             {},
@@ -369,7 +338,7 @@ const LayerTable<BaseGlossy_BRDF>& glossyTable() {
         };
         s.params = {
             {"color", &P::color},
-            {"transparency", fromReflection(&P::reflection)},
+            fromReflection("transparency", &P::reflection),
             {"hilightGlossiness", &P::hilightGlossiness},
             {"reflectionGlossiness", &P::reflectionGlossiness},
             {"cutoff", &P::cutoff},
@@ -394,15 +363,15 @@ const LayerTable<BaseGlossy_BRDF>& glossyTable() {
 
 // ---- Mirror_BRDF -----------------------------------------------------------------------
 
-const LayerTable<Mirror_BRDF>& mirrorTable() {
+const LayerLayout<Mirror_BRDF>& mirrorTable() {
     typedef Mirror_BRDF M;
-    static const LayerTable<M> table = [] {
+    static const LayerLayout<M> table = [] {
         // Version 1 up to `mirror_value`, with the Fresnel pair inside.
         const Rows<M> head = {&M::color, &M::reflection, &M::transparency_tex_mult, kFresnelIor,
                               &M::cutoff, kFresnelSwitch, &M::mirror_value};
         const Rows<M> members = {&M::color_tex_mult, &M::transparency_tex, &M::color_tex};
 
-        LayerTable<M> s;
+        LayerLayout<M> s;
         s.currentVersion = 5;
         s.records = {
             {},
@@ -420,7 +389,7 @@ const LayerTable<Mirror_BRDF>& mirrorTable() {
         };
         s.params = {
             {"color", &M::color},
-            {"transparency", fromReflection(&M::reflection)},
+            fromReflection("transparency", &M::reflection),
             {"color_tex_mult", &M::color_tex_mult},
             {"transparency_tex_mult", &M::transparency_tex_mult},
             {"cutoff", &M::cutoff},
@@ -435,14 +404,14 @@ const LayerTable<Mirror_BRDF>& mirrorTable() {
 
 // ---- Diffuse_BRDF ----------------------------------------------------------------------
 
-const LayerTable<Diffuse_BRDF>& diffuseTable() {
+const LayerLayout<Diffuse_BRDF>& diffuseTable() {
     typedef Diffuse_BRDF D;
-    static const LayerTable<D> table = [] {
+    static const LayerLayout<D> table = [] {
         const Rows<D> head = {&D::color, &D::transparency, &D::color_tex_mult,
                               &D::transparency_tex_mult};
         const Rows<D> members = {&D::color_tex, &D::transparency_tex};
 
-        LayerTable<D> s;
+        LayerLayout<D> s;
         s.currentVersion = 4;
         s.records = {
             {},
@@ -472,14 +441,14 @@ const LayerTable<Diffuse_BRDF>& diffuseTable() {
 
 // ---- Light_BRDF ------------------------------------------------------------------------
 
-const LayerTable<Light_BRDF>& lightTable() {
+const LayerLayout<Light_BRDF>& lightTable() {
     typedef Light_BRDF E;
-    static const LayerTable<E> table = [] {
+    static const LayerLayout<E> table = [] {
         const Rows<E> head = {&E::color, &E::transparency, &E::intensity, &E::light_value,
                               &E::color_tex_mult, &E::transparency_tex_mult};
         const Rows<E> members = {&E::color_tex, &E::transparency_tex};
 
-        LayerTable<E> s;
+        LayerLayout<E> s;
         s.currentVersion = 5;
         s.records = {
             {},
@@ -499,7 +468,7 @@ const LayerTable<Light_BRDF>& lightTable() {
             {"intensity", &E::intensity},
             {"transparency_tex_mult", &E::transparency_tex_mult},
             {"color_tex_mult", &E::color_tex_mult},
-            {"doubleSided", boolFromInt(&E::doubleSided)},
+            boolFromInt("doubleSided", &E::doubleSided),
             {"color_tex", &E::color_tex},
             {"transparency_tex", &E::transparency_tex},
         };
@@ -602,15 +571,9 @@ bool Glass_BRDF::load(QuickArchive& ar) {
     return loadRows(*this, ar, glassTable(), false);
 }
 
-BrdfPtr Glass_BRDF::clone() const {
-    boost::shared_ptr<Glass_BRDF> copy(new Glass_BRDF(*this));
-    cloneSlots(*copy, glassTable());
-    return copy;
-}
+void Glass_BRDF::finishClone() { cloneSlots(*this, glassTable()); }
 
-bool Glass_BRDF::isEqual(const BrdfPtr& other) const {
-    return fieldsEqual(*this, other, glassTable());
-}
+bool Glass_BRDF::sameContent(const Glass_BRDF& o) const { return fieldsEqual(*this, o, glassTable()); }
 
 void Glass_BRDF::writeXml(AssetXmlWriter& writer, std::u16string url) {
     writeLayer(*this, writer, url, glassTable());
@@ -647,31 +610,17 @@ bool BaseGlossy_BRDF::load(QuickArchive& ar) {
     return loadRows(*this, ar, glossyTable(), true);
 }
 
-void BaseGlossy_BRDF::cloneTextures() { cloneSlots(*this, glossyTable()); }
+void BaseGlossy_BRDF::finishClone() { cloneSlots(*this, glossyTable()); }
 
-bool BaseGlossy_BRDF::isEqual(const BrdfPtr& other) const {
-    return fieldsEqual(*this, other, glossyTable());
-}
+bool BaseGlossy_BRDF::sameContent(const BaseGlossy_BRDF& o) const { return fieldsEqual(*this, o, glossyTable()); }
 
 void BaseGlossy_BRDF::writeXml(AssetXmlWriter& writer, std::u16string url) {
     writeLayer(*this, writer, url, glossyTable());
 }
 
-Phong_BRDF::Phong_BRDF() { reset(); }
+Phong_BRDF::Phong_BRDF() { BaseGlossy_BRDF::reset(); }
 
-BrdfPtr Phong_BRDF::clone() const {
-    boost::shared_ptr<Phong_BRDF> copy(new Phong_BRDF(*this));
-    copy->cloneTextures();
-    return copy;
-}
-
-Blinn_BRDF::Blinn_BRDF() { reset(); }
-
-BrdfPtr Blinn_BRDF::clone() const {
-    boost::shared_ptr<Blinn_BRDF> copy(new Blinn_BRDF(*this));
-    copy->cloneTextures();
-    return copy;
-}
+Blinn_BRDF::Blinn_BRDF() { BaseGlossy_BRDF::reset(); }
 
 // ---- Mirror_BRDF -----------------------------------------------------------------------
 
@@ -696,15 +645,9 @@ bool Mirror_BRDF::load(QuickArchive& ar) {
     return loadRows(*this, ar, mirrorTable(), true);
 }
 
-BrdfPtr Mirror_BRDF::clone() const {
-    boost::shared_ptr<Mirror_BRDF> copy(new Mirror_BRDF(*this));
-    cloneSlots(*copy, mirrorTable());
-    return copy;
-}
+void Mirror_BRDF::finishClone() { cloneSlots(*this, mirrorTable()); }
 
-bool Mirror_BRDF::isEqual(const BrdfPtr& other) const {
-    return fieldsEqual(*this, other, mirrorTable());
-}
+bool Mirror_BRDF::sameContent(const Mirror_BRDF& o) const { return fieldsEqual(*this, o, mirrorTable()); }
 
 void Mirror_BRDF::writeXml(AssetXmlWriter& writer, std::u16string url) {
     writeLayer(*this, writer, url, mirrorTable());
@@ -732,15 +675,9 @@ bool Diffuse_BRDF::load(QuickArchive& ar) {
     return loadRows(*this, ar, diffuseTable(), false);
 }
 
-BrdfPtr Diffuse_BRDF::clone() const {
-    boost::shared_ptr<Diffuse_BRDF> copy(new Diffuse_BRDF(*this));
-    cloneSlots(*copy, diffuseTable());
-    return copy;
-}
+void Diffuse_BRDF::finishClone() { cloneSlots(*this, diffuseTable()); }
 
-bool Diffuse_BRDF::isEqual(const BrdfPtr& other) const {
-    return fieldsEqual(*this, other, diffuseTable());
-}
+bool Diffuse_BRDF::sameContent(const Diffuse_BRDF& o) const { return fieldsEqual(*this, o, diffuseTable()); }
 
 void Diffuse_BRDF::writeXml(AssetXmlWriter& writer, std::u16string url) {
     writeLayer(*this, writer, url, diffuseTable());
@@ -770,15 +707,9 @@ bool Light_BRDF::load(QuickArchive& ar) {
     return loadRows(*this, ar, lightTable(), false);
 }
 
-BrdfPtr Light_BRDF::clone() const {
-    boost::shared_ptr<Light_BRDF> copy(new Light_BRDF(*this));
-    cloneSlots(*copy, lightTable());
-    return copy;
-}
+void Light_BRDF::finishClone() { cloneSlots(*this, lightTable()); }
 
-bool Light_BRDF::isEqual(const BrdfPtr& other) const {
-    return fieldsEqual(*this, other, lightTable());
-}
+bool Light_BRDF::sameContent(const Light_BRDF& o) const { return fieldsEqual(*this, o, lightTable()); }
 
 void Light_BRDF::writeXml(AssetXmlWriter& writer, std::u16string url) {
     writeLayer(*this, writer, url, lightTable());

@@ -6,23 +6,23 @@
 #include <string>
 
 #include "materials/Base_BRDF.h"
+#include "persistence/FamilyOf.h"
 #include "persistence/Types.h"
 #include "textures/BaseTexture.h"
 
 namespace OrvaneLumoCore {
 
 // Refraction layer, plugin "BRDFRefraction".
-class Glass_BRDF : public Base_BRDF {
+class Glass_BRDF : public FamilyOf<Glass_BRDF, kGlassBrdf, Base_BRDF> {
 public:
     Glass_BRDF();
 
     bool save(QuickArchive& ar) const override;
     // Resets only the base part before reading.
     bool load(QuickArchive& ar) override;
-    std::uint32_t getType() const override { return kGlassBrdf; }
     void reset() override;
-    BrdfPtr clone() const override;
-    bool isEqual(const BrdfPtr& other) const override;
+    void finishClone();
+    bool sameContent(const Glass_BRDF& o) const;
     void writeXml(AssetXmlWriter& writer, std::u16string url) override;
     std::u16string getPluginName() const override { return u"BRDFRefraction"; }
 
@@ -63,7 +63,8 @@ public:
     bool save(QuickArchive& ar) const override;
     bool load(QuickArchive& ar) override;
     void reset() override;
-    bool isEqual(const BrdfPtr& other) const override;
+    void finishClone();
+    bool sameContent(const BaseGlossy_BRDF& o) const;
     void writeXml(AssetXmlWriter& writer, std::u16string url) override;
     std::u16string getPluginName() const override { return u"BRDFReflection"; }
 
@@ -90,34 +91,28 @@ public:
 
 protected:
     BaseGlossy_BRDF() = default;
-    void cloneTextures();
 };
 
-class Phong_BRDF : public BaseGlossy_BRDF {
+class Phong_BRDF : public FamilyOf<Phong_BRDF, kPhongBrdf, BaseGlossy_BRDF> {
 public:
     Phong_BRDF();
-    std::uint32_t getType() const override { return kPhongBrdf; }
-    BrdfPtr clone() const override;
 };
 
-class Blinn_BRDF : public BaseGlossy_BRDF {
+class Blinn_BRDF : public FamilyOf<Blinn_BRDF, kBlinnBrdf, BaseGlossy_BRDF> {
 public:
     Blinn_BRDF();
-    std::uint32_t getType() const override { return kBlinnBrdf; }
-    BrdfPtr clone() const override;
 };
 
 // Mirror layer, plugin "BRDFReflection".
-class Mirror_BRDF : public Base_BRDF {
+class Mirror_BRDF : public FamilyOf<Mirror_BRDF, kMirrorBrdf, Base_BRDF> {
 public:
     Mirror_BRDF();
 
     bool save(QuickArchive& ar) const override;
     bool load(QuickArchive& ar) override;
-    std::uint32_t getType() const override { return kMirrorBrdf; }
     void reset() override;
-    BrdfPtr clone() const override;
-    bool isEqual(const BrdfPtr& other) const override;
+    void finishClone();
+    bool sameContent(const Mirror_BRDF& o) const;
     void writeXml(AssetXmlWriter& writer, std::u16string url) override;
     std::u16string getPluginName() const override { return u"BRDFReflection"; }
 
@@ -132,16 +127,15 @@ public:
 };
 
 // Diffuse layer, plugin "BRDFDiffuse".
-class Diffuse_BRDF : public Base_BRDF {
+class Diffuse_BRDF : public FamilyOf<Diffuse_BRDF, kDiffuseBrdf, Base_BRDF> {
 public:
     Diffuse_BRDF();
 
     bool save(QuickArchive& ar) const override;
     bool load(QuickArchive& ar) override;
-    std::uint32_t getType() const override { return kDiffuseBrdf; }
     void reset() override;
-    BrdfPtr clone() const override;
-    bool isEqual(const BrdfPtr& other) const override;
+    void finishClone();
+    bool sameContent(const Diffuse_BRDF& o) const;
     void writeXml(AssetXmlWriter& writer, std::u16string url) override;
     std::u16string getPluginName() const override { return u"BRDFDiffuse"; }
 
@@ -155,16 +149,15 @@ public:
 };
 
 // Emissive layer, plugin "BRDFLight".
-class Light_BRDF : public Base_BRDF {
+class Light_BRDF : public FamilyOf<Light_BRDF, kLightBrdf, Base_BRDF> {
 public:
     Light_BRDF();
 
     bool save(QuickArchive& ar) const override;
     bool load(QuickArchive& ar) override;
-    std::uint32_t getType() const override { return kLightBrdf; }
     void reset() override;
-    BrdfPtr clone() const override;
-    bool isEqual(const BrdfPtr& other) const override;
+    void finishClone();
+    bool sameContent(const Light_BRDF& o) const;
     void writeXml(AssetXmlWriter& writer, std::u16string url) override;
     std::u16string getPluginName() const override { return u"BRDFLight"; }
 

@@ -2,7 +2,7 @@
 
 #include "persistence/QuickArchive.h"
 #include "persistence/Record.h"
-#include "xml/AssetXmlWriter.h"
+#include "xml/AssetScope.h"
 
 namespace OrvaneLumoCore {
 
@@ -96,27 +96,14 @@ bool MaterialLayeredBRDF::load(QuickArchive& ar) {
     return baseLoaded;
 }
 
-void MaterialLayeredBRDF::cloneLayers() {
+void MaterialLayeredBRDF::copyChildren(bool) {
     for (std::size_t i = 0; i < brdfs.size(); ++i) brdfs[i] = cloneChild(brdfs[i]);
 }
 
-MaterialPtr MaterialLayeredBRDF::duplicate() const {
-    boost::shared_ptr<MaterialLayeredBRDF> copy = copyOf(*this, true);
-    copy->cloneLayers();
-    return copy;
-}
-
-MaterialPtr MaterialLayeredBRDF::clone() const {
-    boost::shared_ptr<MaterialLayeredBRDF> copy = copyOf(*this, false);
-    copy->cloneLayers();
-    return copy;
-}
-
-bool MaterialLayeredBRDF::isEqual(const MaterialPtr& other) const {
-    const MaterialLayeredBRDF* o = sameClass(*this, other);
-    return o && listsEqual(brdfs, o->brdfs) && double_sided == o->double_sided &&
-           layered_value_a == o->layered_value_a && layered_value_b == o->layered_value_b &&
-           layered_value_c == o->layered_value_c && layered_value_d == o->layered_value_d;
+bool MaterialLayeredBRDF::sameContent(const MaterialLayeredBRDF& o) const {
+    return listsEqual(brdfs, o.brdfs) && double_sided == o.double_sided &&
+           layered_value_a == o.layered_value_a && layered_value_b == o.layered_value_b &&
+           layered_value_c == o.layered_value_c && layered_value_d == o.layered_value_d;
 }
 
 void MaterialLayeredBRDF::writeLayerAssets(AssetXmlWriter& writer,
@@ -127,9 +114,7 @@ void MaterialLayeredBRDF::writeLayerAssets(AssetXmlWriter& writer,
 }
 
 void MaterialLayeredBRDF::openMainAsset(AssetXmlWriter& writer, const std::u16string& url) const {
-    writer.openAsset(url, getAssetType(), "deflumat");
-    writer.openPlugin(getPluginName(), getAssetType());
-    writer.openParameters();
+    openPluginAsset(writer, url, getAssetType(), getPluginName(), "deflumat");
 }
 
 void MaterialLayeredBRDF::writeOwnParameters(AssetXmlWriter& writer,
@@ -183,14 +168,9 @@ bool MaterialSingleBRDF::load(QuickArchive& ar) {
     return BaseMaterial::load(ar);
 }
 
-MaterialPtr MaterialSingleBRDF::duplicate() const { return copyOf(*this, true); }
-
-MaterialPtr MaterialSingleBRDF::clone() const { return copyOf(*this, false); }
-
-bool MaterialSingleBRDF::isEqual(const MaterialPtr& other) const {
-    const MaterialSingleBRDF* o = sameClass(*this, other);
-    return o && childrenEqual(brdf, o->brdf) && single_value_a == o->single_value_a &&
-           single_value_b == o->single_value_b;
+bool MaterialSingleBRDF::sameContent(const MaterialSingleBRDF& o) const {
+    return childrenEqual(brdf, o.brdf) && single_value_a == o.single_value_a &&
+           single_value_b == o.single_value_b;
 }
 
 // ---- MaterialMulti -------------------------------------------------------------
@@ -219,13 +199,8 @@ bool MaterialMulti::load(QuickArchive& ar) {
     return BaseMaterial::load(ar);
 }
 
-MaterialPtr MaterialMulti::duplicate() const { return copyOf(*this, true); }
-
-MaterialPtr MaterialMulti::clone() const { return copyOf(*this, false); }
-
-bool MaterialMulti::isEqual(const MaterialPtr& other) const {
-    const MaterialMulti* o = sameClass(*this, other);
-    return o && listsEqual(materials, o->materials);
+bool MaterialMulti::sameContent(const MaterialMulti& o) const {
+    return listsEqual(materials, o.materials);
 }
 
 }  // namespace OrvaneLumoCore

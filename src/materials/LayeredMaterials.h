@@ -6,22 +6,19 @@
 #include <cstdint>
 #include <vector>
 
-#include "materials/BaseMaterial.h"
+#include "materials/MaterialOf.h"
 #include "materials/Base_BRDF.h"
 
 namespace OrvaneLumoCore {
 
-class MaterialLayeredBRDF : public BaseMaterial {
+class MaterialLayeredBRDF : public MaterialOf<MaterialLayeredBRDF, kMaterialLayeredBRDF> {
 public:
     MaterialLayeredBRDF();
 
     bool save(QuickArchive& ar) const override;
     bool load(QuickArchive& ar) override;
-    std::uint32_t getType() const override { return kMaterialLayeredBRDF; }
     void reset() override;
-    MaterialPtr duplicate() const override;
-    MaterialPtr clone() const override;
-    bool isEqual(const MaterialPtr& other) const override;
+    bool sameContent(const MaterialLayeredBRDF& o) const;
 
     // The layers' Assets, then the material's with a "brdfs" list.
     void writeXml(AssetXmlWriter& writer, std::u16string url) override;
@@ -45,11 +42,11 @@ public:
     std::int32_t layered_value_c;
     std::int32_t layered_value_d;
 
-private:
-    void cloneLayers();
+    // On a fresh copy: every layer cloned.
+    void copyChildren(bool newName);
 };
 
-class MaterialSingleBRDF : public BaseMaterial {
+class MaterialSingleBRDF : public MaterialOf<MaterialSingleBRDF, kMaterialSingleBRDF> {
 public:
     MaterialSingleBRDF();
 
@@ -57,12 +54,9 @@ public:
     bool save(QuickArchive& ar) const override;
     // Does not reset first.
     bool load(QuickArchive& ar) override;
-    std::uint32_t getType() const override { return kMaterialSingleBRDF; }
     void reset() override;
-    // Both copies share the layer.
-    MaterialPtr duplicate() const override;
-    MaterialPtr clone() const override;
-    bool isEqual(const MaterialPtr& other) const override;
+    // duplicate() and clone() share the layer.
+    bool sameContent(const MaterialSingleBRDF& o) const;
     std::u16string getPluginName() const override { return u"MtlSingleBRDF"; }
 
     BrdfPtr brdf;
@@ -70,19 +64,16 @@ public:
     std::int32_t single_value_b;
 };
 
-class MaterialMulti : public BaseMaterial {
+class MaterialMulti : public MaterialOf<MaterialMulti, kMaterialMulti> {
 public:
     MaterialMulti();
 
     bool save(QuickArchive& ar) const override;
     // Does not reset first: a load into a used object appends to its list.
     bool load(QuickArchive& ar) override;
-    std::uint32_t getType() const override { return kMaterialMulti; }
     void reset() override;
-    // Both copies share the sub-materials.
-    MaterialPtr duplicate() const override;
-    MaterialPtr clone() const override;
-    bool isEqual(const MaterialPtr& other) const override;
+    // duplicate() and clone() share the sub-materials.
+    bool sameContent(const MaterialMulti& o) const;
     std::u16string getPluginName() const override { return u"MtlMulti"; }
 
     std::vector<MaterialPtr> materials;

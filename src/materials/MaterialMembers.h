@@ -9,7 +9,7 @@
 #include "materials/BaseMaterial.h"
 #include "persistence/Record.h"
 #include "textures/BaseTexture.h"
-#include "xml/AssetXmlWriter.h"
+#include "xml/AssetScope.h"
 
 namespace OrvaneLumoCore {
 
@@ -69,15 +69,9 @@ inline void writeTextureRef(AssetXmlWriter& writer, const WriterText& name, cons
 // openPlugin and openParameters.
 inline void openMaterialAsset(AssetXmlWriter& writer, const BaseMaterial& material,
                               const std::u16string& url, const WriterText& layout) {
-    writer.openAsset(url, material.getAssetType(), layout);
-    writer.openPlugin(material.getPluginName(), material.getAssetType());
-    writer.openParameters();
+    openPluginAsset(writer, url, material.getAssetType(), material.getPluginName(), layout);
 }
 
-inline void closeMaterialAsset(AssetXmlWriter& writer) {
-    writer.closeParameters();
-    writer.closePlugin();
-    writer.closeAsset();
-}
+inline void closeMaterialAsset(AssetXmlWriter& writer) { closePluginAsset(writer); }
 
 }  // namespace OrvaneLumoCore

@@ -80,14 +80,13 @@ MaterialPtr MaterialReference::clone() const {
     return c;
 }
 
-bool MaterialReference::isEqual(const MaterialPtr& other) const {
-    const MaterialReference* o = sameClass(*this, other);
-    if (!o || !platform::iequals(target_uuid, o->target_uuid)) return false;
+bool MaterialReference::sameContent(const MaterialReference& o) const {
+    if (!platform::iequals(target_uuid, o.target_uuid)) return false;
     TableDepthGuard guard;
     if (!guard.ok()) return false;
     const boost::shared_ptr<SceneMaterials> table = SceneMaterials::instance();
     const MaterialPtr mine = table->getMaterialByUuid(target_uuid);
-    const MaterialPtr theirs = table->getMaterialByUuid(o->target_uuid);
+    const MaterialPtr theirs = table->getMaterialByUuid(o.target_uuid);
     if (!mine || !theirs) return !mine && !theirs;
     return mine->isEqual(theirs) && theirs->isEqual(mine);
 }
@@ -123,9 +122,7 @@ bool MaterialInstance::load(QuickArchive& ar) {
 
 MaterialPtr MaterialInstance::duplicate() const { return clone(); }
 
-MaterialPtr MaterialInstance::clone() const { return copyOf(*this, false); }
-
-bool MaterialInstance::isEqual(const MaterialPtr& other) const { return false; }
+bool MaterialInstance::sameContent(const MaterialInstance&) const { return false; }
 
 // ---- MaterialLinked::IdData -------------------------------------------------------------
 
@@ -188,19 +185,12 @@ bool MaterialLinked::load(QuickArchive& ar) {
     return loadNested(ar, id) && loadBareMaterial(ar, linked_material) && BaseMaterial::load(ar);
 }
 
-MaterialPtr MaterialLinked::copyWith(bool newName) const {
-    boost::shared_ptr<MaterialLinked> c = copyOf(*this, newName);
-    c->linked_material = copyChild(linked_material, newName);
-    return c;
+void MaterialLinked::copyChildren(bool newName) {
+    linked_material = copyChild(linked_material, newName);
 }
 
-MaterialPtr MaterialLinked::duplicate() const { return copyWith(true); }
-
-MaterialPtr MaterialLinked::clone() const { return copyWith(false); }
-
-bool MaterialLinked::isEqual(const MaterialPtr& other) const {
-    const MaterialLinked* o = sameClass(*this, other);
-    return o && childrenEqual(linked_material, o->linked_material) && id.isEqual(o->id);
+bool MaterialLinked::sameContent(const MaterialLinked& o) const {
+    return childrenEqual(linked_material, o.linked_material) && id.isEqual(o.id);
 }
 
 // ---- the scene table's operations on references -------------------------------------------

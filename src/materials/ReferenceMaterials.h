@@ -10,11 +10,11 @@
 #include <cstdint>
 #include <string>
 
-#include "materials/BaseMaterial.h"
+#include "materials/MaterialOf.h"
 
 namespace OrvaneLumoCore {
 
-class MaterialReference : public BaseMaterial {
+class MaterialReference : public MaterialOf<MaterialReference, kMaterialReference> {
 public:
     MaterialReference();
 
@@ -23,7 +23,6 @@ public:
     bool save(QuickArchive& ar) const override;
     // Does not reset first. Version 1 has no embedded copy.
     bool load(QuickArchive& ar) override;
-    std::uint32_t getType() const override { return kMaterialReference; }
     // BaseMaterial's reset, then no target.
     void reset() override;
     // Both give a reference with the same name and target_uuid and no target.
@@ -31,14 +30,14 @@ public:
     MaterialPtr clone() const override;
     // Same target_uuid (ignoring case), and the scene table's materials of
     // both UUIDs both absent or equal, compared from either side.
-    bool isEqual(const MaterialPtr& other) const override;
+    bool sameContent(const MaterialReference& o) const;
 
     std::u16string target_uuid;
     // The embedded copy of the target; save replaces it.
     mutable MaterialPtr target;
 };
 
-class MaterialInstance : public BaseMaterial {
+class MaterialInstance : public MaterialOf<MaterialInstance, kMaterialInstance> {
 public:
     MaterialInstance();
     // An alias of `material`: its name, and instance_of set to it.
@@ -48,18 +47,16 @@ public:
     // The base record alone: instance_of is not stored.
     bool save(QuickArchive& ar) const override;
     bool load(QuickArchive& ar) override;
-    std::uint32_t getType() const override { return kMaterialInstance; }
     void reset() override;
-    // A plain copy that shares instance_of and keeps the name.
+    // A plain copy that shares instance_of and keeps the name, as clone().
     MaterialPtr duplicate() const override;
-    MaterialPtr clone() const override;
     // Always false, also with itself.
-    bool isEqual(const MaterialPtr& other) const override;
+    bool sameContent(const MaterialInstance& o) const;
 
     MaterialPtr instance_of;
 };
 
-class MaterialLinked : public BaseMaterial {
+class MaterialLinked : public MaterialOf<MaterialLinked, kMaterialLinked> {
 public:
     // The identifier of the outside object: a text (kinds 0 and 1) or a
     // number (kind 2). Any other kind is invalid and fails save and load.
@@ -86,19 +83,15 @@ public:
     // False, writing nothing, without linked_material.
     bool save(QuickArchive& ar) const override;
     bool load(QuickArchive& ar) override;
-    std::uint32_t getType() const override { return kMaterialLinked; }
     // BaseMaterial's reset, then no material and id kind 2, number 0.
     void reset() override;
-    // linked_material by its own duplicate()/clone(); id by value.
-    MaterialPtr duplicate() const override;
-    MaterialPtr clone() const override;
-    bool isEqual(const MaterialPtr& other) const override;
+    bool sameContent(const MaterialLinked& o) const;
 
     MaterialPtr linked_material;
     IdData id;
 
-private:
-    MaterialPtr copyWith(bool newName) const;
+    // linked_material by its own duplicate()/clone(); id by value.
+    void copyChildren(bool newName);
 };
 
 }  // namespace OrvaneLumoCore

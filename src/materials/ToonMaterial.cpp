@@ -9,8 +9,6 @@ namespace OrvaneLumoCore {
 
 namespace {
 
-const int kToonVersion = 2;
-
 // The line parameters in the order of both XML forms, with the word of the
 // material's own writeXml and the word of the conversion. A row without a
 // conversion word is left out there.
@@ -61,110 +59,42 @@ const ToonBool kToonBools[] = {
 
 }  // namespace
 
-MaterialToon::MaterialToon() { MaterialToon::reset(); }
-
-void MaterialToon::reset() {
-    base_mtl.reset();
-    lineColor = Color(0, 0, 0);
-    for (const ToonTexture& t : kToonTextures) (this->*t.field).reset();
-    lineColorTexMult = 1;
-    distort = 0;
-    distortTexMult = 1;
-    opacity = 1;
-    opacityTexMult = 1;
-    lineWidth = 1.5f;
-    lineWidthTexMult = 1;
-    zThreshold = 0.95f;
-    traceBias = 0.02f;
-    normalThreshold = 0.7f;
-    lineUnits = 1;
-    silhouetteMult = 1.5f;
-    doSecondary = true;
-    divideByDist = false;
-    doSilhouetteMult = false;
-}
-
-bool MaterialToon::save(QuickArchive& ar) const {
-    writeVersion(ar, kToonVersion);
-    if (!saveOptionalMember(ar, base_mtl)) return false;
-    ar.writeFloat(lineWidth);
-    ar.writeFloat(lineWidthTexMult);
-    if (!saveOptionalMember(ar, lineWidthTex)) return false;
-    ar.writeFloat(opacity);
-    ar.writeFloat(opacityTexMult);
-    if (!saveOptionalMember(ar, opacityTex)) return false;
-    ar.writeFloat(distort);
-    ar.writeFloat(distortTexMult);
-    if (!saveOptionalMember(ar, distortTex)) return false;
-    ar.writeColor(lineColor);
-    ar.writeFloat(lineColorTexMult);
-    if (!saveOptionalMember(ar, lineColorTex)) return false;
-    ar.writeFloat(zThreshold);
-    ar.writeFloat(traceBias);
-    ar.writeFloat(normalThreshold);
-    ar.writeFloat(lineUnits);
-    ar.writeByte(doSecondary);
-    ar.writeByte(divideByDist);
-    if (!BaseMaterial::save(ar)) return false;
-    ar.writeByte(doSilhouetteMult);
-    ar.writeFloat(silhouetteMult);
-    return true;
-}
+typedef RowsOf<Toon> ToonRow;
 
 // Version 1 ends behind the base record; version 2 adds doSilhouetteMult
 // and silhouetteMult.
-bool MaterialToon::load(QuickArchive& ar) {
-    const int v = readVersion(ar, 1, kToonVersion);
-    reset();  // also when the tag is refused
-    if (v < 0) return false;
-    if (!loadMaterialMember(ar, base_mtl)) return false;
-    ar.readFloat(lineWidth);
-    ar.readFloat(lineWidthTexMult);
-    if (!loadTextureMember(ar, lineWidthTex)) return false;
-    ar.readFloat(opacity);
-    ar.readFloat(opacityTexMult);
-    if (!loadTextureMember(ar, opacityTex)) return false;
-    ar.readFloat(distort);
-    ar.readFloat(distortTexMult);
-    if (!loadTextureMember(ar, distortTex)) return false;
-    ar.readColor(lineColor);
-    ar.readFloat(lineColorTexMult);
-    if (!loadTextureMember(ar, lineColorTex)) return false;
-    ar.readFloat(zThreshold);
-    ar.readFloat(traceBias);
-    ar.readFloat(normalThreshold);
-    ar.readFloat(lineUnits);
-    ar.readByte(doSecondary);
-    ar.readByte(divideByDist);
-    if (!BaseMaterial::load(ar)) return false;
-    if (v >= 2) {
-        ar.readByte(doSilhouetteMult);
-        ar.readFloat(silhouetteMult);
-    }
-    return true;
-}
+const RecordRow<Toon> kToonRecord[] = {
+    &Toon::base_mtl,
+    ToonRow::f32(&Toon::lineWidth, 1.5, 1),
+    ToonRow::f32(&Toon::lineWidthTexMult, 1, 1),
+    &Toon::lineWidthTex,
+    ToonRow::f32(&Toon::opacity, 1, 1),
+    ToonRow::f32(&Toon::opacityTexMult, 1, 1),
+    &Toon::opacityTex,
+    ToonRow::f32(&Toon::distort, 0, 1),
+    ToonRow::f32(&Toon::distortTexMult, 1, 1),
+    &Toon::distortTex,
+    ToonRow::color(&Toon::lineColor, Color(0, 0, 0), 1),
+    ToonRow::f32(&Toon::lineColorTexMult, 1, 1),
+    &Toon::lineColorTex,
+    ToonRow::f32(&Toon::zThreshold, 0.95, 1),
+    ToonRow::f32(&Toon::traceBias, 0.02, 1),
+    ToonRow::f32(&Toon::normalThreshold, 0.7, 1),
+    ToonRow::f32(&Toon::lineUnits, 1, 1),
+    ToonRow::b8(&Toon::doSecondary, true, 1),
+    ToonRow::b8(&Toon::divideByDist, false, 1),
+    kBaseRecord,
+    ToonRow::b8(&Toon::doSilhouetteMult, false, 2),
+    ToonRow::f32(&Toon::silhouetteMult, 1.5, 2),
+};
 
-MaterialPtr MaterialToon::copyWith(bool newName) const {
-    boost::shared_ptr<MaterialToon> c = copyOf(*this, newName);
-    c->base_mtl = copyChild(base_mtl, true);
-    for (const ToonTexture& t : kToonTextures) (*c).*t.field = cloneChild(this->*t.field);
-    return c;
-}
+MaterialToon::MaterialToon() { MaterialToon::reset(); }
 
-MaterialPtr MaterialToon::duplicate() const { return copyWith(true); }
+RowSpan<RecordRow<MaterialToon>> MaterialToon::record() { return rowSpan(kToonRecord); }
 
-MaterialPtr MaterialToon::clone() const { return copyWith(false); }
-
-bool MaterialToon::isEqual(const MaterialPtr& other) const {
-    const MaterialToon* o = sameClass(*this, other);
-    if (!o || !childrenEqual(base_mtl, o->base_mtl) || lineColor != o->lineColor) return false;
-    for (const ToonTexture& t : kToonTextures)
-        if (!childrenEqual(this->*t.field, o->*t.field)) return false;
-    for (const ToonFloat& f : kToonFloats)
-        if (this->*f.field != o->*f.field) return false;
-    for (const ToonBool& b : kToonBools)
-        if (this->*b.field != o->*b.field) return false;
-    return true;
+void MaterialToon::copyChildren(bool newName) {
+    base_mtl = copyChild(base_mtl, true);
+    for (const ToonTexture& t : kToonTextures) this->*t.field = cloneChild(this->*t.field);
 }
 
 void MaterialToon::writeTextureAssets(AssetXmlWriter& writer, const std::u16string& url) const {

@@ -10,31 +10,21 @@
 #include <cstdint>
 #include <string>
 
-#include "materials/BaseMaterial.h"
+#include "materials/MaterialRows.h"
 #include "persistence/Types.h"
 #include "textures/BaseTexture.h"
 
 namespace OrvaneLumoCore {
 
-class MaterialToon : public BaseMaterial {
+class MaterialToon : public TableMaterialOf<MaterialToon, kMaterialToon> {
 public:
     // Which words the line parameters go out under.
     enum class Words { Own, Conversion };
 
-    MaterialToon();
+    static constexpr int kRecordVersion = 2;
+    static RowSpan<RecordRow<MaterialToon>> record();
 
-    bool save(QuickArchive& ar) const override;
-    // Resets right behind reading the version tag.
-    bool load(QuickArchive& ar) override;
-    std::uint32_t getType() const override { return kMaterialToon; }
-    // The defaults of the fields below; name and uuid stay.
-    void reset() override;
-    // base_mtl by its duplicate(), the textures by their clone(), new name.
-    MaterialPtr duplicate() const override;
-    // The textures by their clone() and the same name; base_mtl, too, by its
-    // duplicate(), so that the base material of a clone gets a new name.
-    MaterialPtr clone() const override;
-    bool isEqual(const MaterialPtr& other) const override;
+    MaterialToon();
 
     void writeXml(AssetXmlWriter& writer, std::u16string url) override;
     std::u16string getPluginName() const override { return u"MtlToon"; }
@@ -68,8 +58,11 @@ public:
     bool divideByDist;
     bool doSilhouetteMult;
 
-private:
-    MaterialPtr copyWith(bool newName) const;
+    // duplicate(): base_mtl by its duplicate(), the textures by their clone(),
+    // new name. clone(): the textures by their clone() and the same name;
+    // base_mtl, too, by its duplicate(), so that the base material of a clone
+    // gets a new name.
+    void copyChildren(bool newName);
 };
 
 }  // namespace OrvaneLumoCore

@@ -67,24 +67,17 @@ bool Material2Sided::load(QuickArchive& ar) {
 }
 
 // The textures stay shared with the source.
-MaterialPtr Material2Sided::copyWith(bool newName) const {
-    boost::shared_ptr<Material2Sided> c = copyOf(*this, newName);
-    c->front = copyChild(front, newName);
-    c->back = copyChild(back, newName);
-    return c;
+void Material2Sided::copyChildren(bool newName) {
+    front = copyChild(front, newName);
+    back = copyChild(back, newName);
 }
 
-MaterialPtr Material2Sided::duplicate() const { return copyWith(true); }
-
-MaterialPtr Material2Sided::clone() const { return copyWith(false); }
-
-bool Material2Sided::isEqual(const MaterialPtr& other) const {
-    const Material2Sided* o = sameClass(*this, other);
-    return o && childrenEqual(front, o->front) && childrenEqual(back, o->back) &&
-           childrenEqual(translucency_tex, o->translucency_tex) &&
-           childrenEqual(transparency_tex, o->transparency_tex) && translucency == o->translucency &&
-           transparency == o->transparency && translucency_tex_mult == o->translucency_tex_mult &&
-           transparency_tex_mult == o->transparency_tex_mult && force_1sided == o->force_1sided;
+bool Material2Sided::sameContent(const Material2Sided& o) const {
+    return childrenEqual(front, o.front) && childrenEqual(back, o.back) &&
+           childrenEqual(translucency_tex, o.translucency_tex) &&
+           childrenEqual(transparency_tex, o.transparency_tex) && translucency == o.translucency &&
+           transparency == o.transparency && translucency_tex_mult == o.translucency_tex_mult &&
+           transparency_tex_mult == o.transparency_tex_mult && force_1sided == o.force_1sided;
 }
 
 void Material2Sided::writeXml(AssetXmlWriter& writer, std::u16string url) {
@@ -135,21 +128,14 @@ bool MaterialSkp2Sided::load(QuickArchive& ar) {
     return true;
 }
 
-MaterialPtr MaterialSkp2Sided::copyWith(bool newName) const {
-    boost::shared_ptr<MaterialSkp2Sided> c = copyOf(*this, newName);
-    c->front = copyChild(front, newName);
-    c->back = copyChild(back, newName);
-    return c;
+void MaterialSkp2Sided::copyChildren(bool newName) {
+    front = copyChild(front, newName);
+    back = copyChild(back, newName);
 }
 
-MaterialPtr MaterialSkp2Sided::duplicate() const { return copyWith(true); }
-
-MaterialPtr MaterialSkp2Sided::clone() const { return copyWith(false); }
-
-bool MaterialSkp2Sided::isEqual(const MaterialPtr& other) const {
-    const MaterialSkp2Sided* o = sameClass(*this, other);
-    return o && childrenEqual(front, o->front) && childrenEqual(back, o->back) &&
-           force_1sided == o->force_1sided;
+bool MaterialSkp2Sided::sameContent(const MaterialSkp2Sided& o) const {
+    return childrenEqual(front, o.front) && childrenEqual(back, o.back) &&
+           force_1sided == o.force_1sided;
 }
 
 void MaterialSkp2Sided::writeXml(AssetXmlWriter& writer, std::u16string url) {
@@ -210,21 +196,14 @@ bool MaterialBump::load(QuickArchive& ar) {
     return v == 2 || BaseMaterial::load(ar);
 }
 
-MaterialPtr MaterialBump::copyWith(bool newName) const {
-    boost::shared_ptr<MaterialBump> c = copyOf(*this, newName);
-    c->base_mtl = copyChild(base_mtl, newName);
-    c->bump_tex = cloneChild(bump_tex);
-    return c;
+void MaterialBump::copyChildren(bool newName) {
+    base_mtl = copyChild(base_mtl, newName);
+    bump_tex = cloneChild(bump_tex);
 }
 
-MaterialPtr MaterialBump::duplicate() const { return copyWith(true); }
-
-MaterialPtr MaterialBump::clone() const { return copyWith(false); }
-
-bool MaterialBump::isEqual(const MaterialPtr& other) const {
-    const MaterialBump* o = sameClass(*this, other);
-    return o && childrenEqual(base_mtl, o->base_mtl) && childrenEqual(bump_tex, o->bump_tex) &&
-           bump_tex_mult == o->bump_tex_mult;
+bool MaterialBump::sameContent(const MaterialBump& o) const {
+    return childrenEqual(base_mtl, o.base_mtl) && childrenEqual(bump_tex, o.bump_tex) &&
+           bump_tex_mult == o.bump_tex_mult;
 }
 
 void MaterialBump::writeXml(AssetXmlWriter& writer, std::u16string url) {

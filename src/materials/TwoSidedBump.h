@@ -6,26 +6,22 @@
 // from a parent's writeXml.
 #include <string>
 
-#include "materials/BaseMaterial.h"
+#include "materials/MaterialOf.h"
 #include "persistence/Types.h"
 #include "textures/BaseTexture.h"
 
 namespace OrvaneLumoCore {
 
-class Material2Sided : public BaseMaterial {
+class Material2Sided : public MaterialOf<Material2Sided, kMaterial2Sided> {
 public:
     Material2Sided();
 
     bool save(QuickArchive& ar) const override;
     // Does not reset first. Versions 1 and 2 leave the name as it was.
     bool load(QuickArchive& ar) override;
-    std::uint32_t getType() const override { return kMaterial2Sided; }
     // The defaults of the fields below; name and uuid stay.
     void reset() override;
-    // front and back by their own duplicate()/clone(); the textures are shared.
-    MaterialPtr duplicate() const override;
-    MaterialPtr clone() const override;
-    bool isEqual(const MaterialPtr& other) const override;
+    bool sameContent(const Material2Sided& o) const;
 
     // The children's Assets, the textures', then the material's own.
     void writeXml(AssetXmlWriter& writer, std::u16string url) override;
@@ -41,11 +37,11 @@ public:
     float transparency_tex_mult;
     bool force_1sided;
 
-private:
-    MaterialPtr copyWith(bool newName) const;
+    // front and back by their own duplicate()/clone(); the textures are shared.
+    void copyChildren(bool newName);
 };
 
-class MaterialSkp2Sided : public BaseMaterial {
+class MaterialSkp2Sided : public MaterialOf<MaterialSkp2Sided, kMaterialSkp2Sided> {
 public:
     MaterialSkp2Sided();
 
@@ -53,12 +49,9 @@ public:
     bool save(QuickArchive& ar) const override;
     // Does not reset first.
     bool load(QuickArchive& ar) override;
-    std::uint32_t getType() const override { return kMaterialSkp2Sided; }
     // The defaults of the fields below; name and uuid stay.
     void reset() override;
-    MaterialPtr duplicate() const override;
-    MaterialPtr clone() const override;
-    bool isEqual(const MaterialPtr& other) const override;
+    bool sameContent(const MaterialSkp2Sided& o) const;
 
     void writeXml(AssetXmlWriter& writer, std::u16string url) override;
     std::u16string getPluginName() const override { return u"MtlSkp2Sided"; }
@@ -67,11 +60,11 @@ public:
     MaterialPtr back;
     bool force_1sided;
 
-private:
-    MaterialPtr copyWith(bool newName) const;
+    // On a fresh copy: the children that are not to be shared.
+    void copyChildren(bool newName);
 };
 
-class MaterialBump : public BaseMaterial {
+class MaterialBump : public MaterialOf<MaterialBump, kMaterialBump> {
 public:
     MaterialBump();
 
@@ -79,13 +72,9 @@ public:
     bool save(QuickArchive& ar) const override;
     // Does not reset first.
     bool load(QuickArchive& ar) override;
-    std::uint32_t getType() const override { return kMaterialBump; }
     // BaseMaterial's reset (a new default name), then the defaults below.
     void reset() override;
-    // base_mtl by its own duplicate()/clone(), bump_tex by its clone().
-    MaterialPtr duplicate() const override;
-    MaterialPtr clone() const override;
-    bool isEqual(const MaterialPtr& other) const override;
+    bool sameContent(const MaterialBump& o) const;
 
     void writeXml(AssetXmlWriter& writer, std::u16string url) override;
     std::u16string getPluginName() const override { return u"MtlBump"; }
@@ -94,8 +83,8 @@ public:
     TexturePtr bump_tex;
     float bump_tex_mult;
 
-private:
-    MaterialPtr copyWith(bool newName) const;
+    // base_mtl by its own duplicate()/clone(), bump_tex by its clone().
+    void copyChildren(bool newName);
 };
 
 }  // namespace OrvaneLumoCore

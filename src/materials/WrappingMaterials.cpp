@@ -9,92 +9,40 @@
 namespace OrvaneLumoCore {
 
 namespace {
-
-const int kOverrideEnvironmentVersion = 1;
-const int kDisplacedVersion = 2;
 const int kObjectExclusionVersion = 3;
-const int kAngleBlendVersion = 1;
-const int kAlphaContributionVersion = 1;
-
-// The four environment groups of MaterialOverrideEnvironment in the order of
-// its record, which has the background first. Each row of the record
-// (textures, colours, multipliers, switches) walks this table.
-typedef MaterialOverrideEnvironment Env;
-struct EnvironmentGroup {
-    TexturePtr Env::*tex;
-    Color Env::*color;
-    float Env::*mult;
-    bool Env::*override_;
-};
-const EnvironmentGroup kEnvironmentRecordOrder[] = {
-    {&Env::bg_tex, &Env::bg_color, &Env::bg_tex_mult, &Env::override_bg},
-    {&Env::gi_tex, &Env::gi_color, &Env::gi_tex_mult, &Env::override_gi},
-    {&Env::reflect_tex, &Env::reflect_color, &Env::reflect_tex_mult, &Env::override_reflect},
-    {&Env::refract_tex, &Env::refract_color, &Env::refract_tex_mult, &Env::override_refract},
-};
-
 }  // namespace
 
 // ---- MaterialOverrideEnvironment ----------------------------------------------------------
 
 MaterialOverrideEnvironment::MaterialOverrideEnvironment() { MaterialOverrideEnvironment::reset(); }
 
-void MaterialOverrideEnvironment::reset() {
-    base_mtl.reset();
-    for (const EnvironmentGroup& g : kEnvironmentRecordOrder) {
-        (this->*g.tex).reset();
-        this->*g.color = Color(0, 0, 0);
-        this->*g.mult = 1;
-        this->*g.override_ = false;
-    }
-}
+typedef MaterialOverrideEnvironment Env;
+typedef RowsOf<Env> EnvRow;
 
-bool MaterialOverrideEnvironment::save(QuickArchive& ar) const {
-    writeVersion(ar, kOverrideEnvironmentVersion);
-    if (!BaseMaterial::save(ar) || !saveOptionalMember(ar, base_mtl)) return false;
-    for (const EnvironmentGroup& g : kEnvironmentRecordOrder)
-        if (!saveOptionalMember(ar, this->*g.tex)) return false;
-    for (const EnvironmentGroup& g : kEnvironmentRecordOrder) ar.writeColor(this->*g.color);
-    for (const EnvironmentGroup& g : kEnvironmentRecordOrder) ar.writeFloat(this->*g.mult);
-    for (const EnvironmentGroup& g : kEnvironmentRecordOrder) ar.writeByte(this->*g.override_);
-    return true;
-}
+// The four environment groups (background, GI, reflection, refraction), each
+// row of the record walking them in this order.
+const RecordRow<Env> kOverrideEnvironmentRecord[] = {
+    kBaseRecord,
+    &Env::base_mtl,
+    &Env::bg_tex,
+    &Env::gi_tex,
+    &Env::reflect_tex,
+    &Env::refract_tex,
+    EnvRow::color(&Env::bg_color, Color(0, 0, 0), 1),
+    EnvRow::color(&Env::gi_color, Color(0, 0, 0), 1),
+    EnvRow::color(&Env::reflect_color, Color(0, 0, 0), 1),
+    EnvRow::color(&Env::refract_color, Color(0, 0, 0), 1),
+    EnvRow::f32(&Env::bg_tex_mult, 1, 1),
+    EnvRow::f32(&Env::gi_tex_mult, 1, 1),
+    EnvRow::f32(&Env::reflect_tex_mult, 1, 1),
+    EnvRow::f32(&Env::refract_tex_mult, 1, 1),
+    EnvRow::b8(&Env::override_bg, false, 1),
+    EnvRow::b8(&Env::override_gi, false, 1),
+    EnvRow::b8(&Env::override_reflect, false, 1),
+    EnvRow::b8(&Env::override_refract, false, 1),
+};
 
-bool MaterialOverrideEnvironment::load(QuickArchive& ar) {
-    const int v = readVersion(ar, 1, kOverrideEnvironmentVersion);
-    reset();  // also when the tag is refused
-    if (v < 0) return false;
-    if (!BaseMaterial::load(ar) || !loadMaterialMember(ar, base_mtl)) return false;
-    for (const EnvironmentGroup& g : kEnvironmentRecordOrder)
-        if (!loadTextureMember(ar, this->*g.tex)) return false;
-    for (const EnvironmentGroup& g : kEnvironmentRecordOrder) ar.readColor(this->*g.color);
-    for (const EnvironmentGroup& g : kEnvironmentRecordOrder) ar.readFloat(this->*g.mult);
-    for (const EnvironmentGroup& g : kEnvironmentRecordOrder) ar.readByte(this->*g.override_);
-    return true;
-}
-
-MaterialPtr MaterialOverrideEnvironment::copyWith(bool newName) const {
-    boost::shared_ptr<MaterialOverrideEnvironment> c = copyOf(*this, newName);
-    c->base_mtl = copyChild(base_mtl, newName);
-    for (const EnvironmentGroup& g : kEnvironmentRecordOrder) (*c).*g.tex = cloneChild(this->*g.tex);
-    return c;
-}
-
-MaterialPtr MaterialOverrideEnvironment::duplicate() const { return copyWith(true); }
-
-MaterialPtr MaterialOverrideEnvironment::clone() const { return copyWith(false); }
-
-bool MaterialOverrideEnvironment::isEqual(const MaterialPtr& other) const {
-    const MaterialOverrideEnvironment* o = sameClass(*this, other);
-    if (!o || !childrenEqual(base_mtl, o->base_mtl)) return false;
-    for (const EnvironmentGroup& g : kEnvironmentRecordOrder)
-        if (!childrenEqual(this->*g.tex, o->*g.tex)) return false;
-    for (const EnvironmentGroup& g : kEnvironmentRecordOrder)
-        if (this->*g.color != o->*g.color || this->*g.mult != o->*g.mult ||
-            this->*g.override_ != o->*g.override_)
-            return false;
-    return true;
-}
+RowSpan<RecordRow<Env>> MaterialOverrideEnvironment::record() { return rowSpan(kOverrideEnvironmentRecord); }
 
 void MaterialOverrideEnvironment::writeXml(AssetXmlWriter& writer, std::u16string url) {
     if (base_mtl) base_mtl->writeXml(writer, url);
@@ -104,75 +52,25 @@ void MaterialOverrideEnvironment::writeXml(AssetXmlWriter& writer, std::u16strin
 
 MaterialDisplaced::MaterialDisplaced() { MaterialDisplaced::reset(); }
 
-void MaterialDisplaced::reset() {
-    base_mtl.reset();
-    displace_tex.reset();
-    displace_tex_mult = 1;
-    displace_shift = 0;
-    displace_edge_length = 4;
-    displace_max_subdivs = 256;
-    displace_continuity = 1;
-    displace_view_dependent = 1;
-    displace_use_globals = 1;
-}
-
-bool MaterialDisplaced::save(QuickArchive& ar) const {
-    writeVersion(ar, kDisplacedVersion);
-    if (!BaseMaterial::save(ar) || !saveOptionalMember(ar, base_mtl) ||
-        !saveOptionalMember(ar, displace_tex))
-        return false;
-    ar.writeFloat(displace_tex_mult);
-    ar.writeFloat(displace_shift);
-    ar.writeFloat(displace_edge_length);
-    ar.writeInt(displace_max_subdivs);
-    ar.writeInt(displace_continuity);
-    ar.writeInt(displace_view_dependent);
-    ar.writeInt(displace_use_globals);
-    return true;
-}
+typedef MaterialDisplaced Disp;
+typedef RowsOf<Disp> DispRow;
 
 // Version 1: base record, base_mtl, displace_tex, displace_tex_mult.
 // Version 2: as 1, then the shift, the edge length and the four integers.
-bool MaterialDisplaced::load(QuickArchive& ar) {
-    const int v = readVersion(ar, 1, kDisplacedVersion);
-    reset();  // also when the tag is refused
-    if (v < 0) return false;
-    if (!BaseMaterial::load(ar) || !loadMaterialMember(ar, base_mtl) ||
-        !loadTextureMember(ar, displace_tex))
-        return false;
-    ar.readFloat(displace_tex_mult);
-    if (v >= 2) {
-        ar.readFloat(displace_shift);
-        ar.readFloat(displace_edge_length);
-        ar.readInt(displace_max_subdivs);
-        ar.readInt(displace_continuity);
-        ar.readInt(displace_view_dependent);
-        ar.readInt(displace_use_globals);
-    }
-    return true;
-}
+const RecordRow<Disp> kDisplacedRecord[] = {
+    kBaseRecord,
+    &Disp::base_mtl,
+    &Disp::displace_tex,
+    DispRow::f32(&Disp::displace_tex_mult, 1, 1),
+    DispRow::f32(&Disp::displace_shift, 0, 2),
+    DispRow::f32(&Disp::displace_edge_length, 4, 2),
+    DispRow::i32(&Disp::displace_max_subdivs, 256, 2),
+    DispRow::i32(&Disp::displace_continuity, 1, 2),
+    DispRow::i32(&Disp::displace_view_dependent, 1, 2),
+    DispRow::i32(&Disp::displace_use_globals, 1, 2),
+};
 
-MaterialPtr MaterialDisplaced::copyWith(bool newName) const {
-    boost::shared_ptr<MaterialDisplaced> c = copyOf(*this, newName);
-    c->base_mtl = copyChild(base_mtl, newName);
-    c->displace_tex = cloneChild(displace_tex);
-    return c;
-}
-
-MaterialPtr MaterialDisplaced::duplicate() const { return copyWith(true); }
-
-MaterialPtr MaterialDisplaced::clone() const { return copyWith(false); }
-
-bool MaterialDisplaced::isEqual(const MaterialPtr& other) const {
-    const MaterialDisplaced* o = sameClass(*this, other);
-    return o && childrenEqual(base_mtl, o->base_mtl) && childrenEqual(displace_tex, o->displace_tex) &&
-           displace_tex_mult == o->displace_tex_mult && displace_shift == o->displace_shift &&
-           displace_edge_length == o->displace_edge_length &&
-           displace_max_subdivs == o->displace_max_subdivs &&
-           displace_continuity == o->displace_continuity &&
-           displace_view_dependent == o->displace_view_dependent &&
-           displace_use_globals == o->displace_use_globals;
-}
+RowSpan<RecordRow<MaterialDisplaced>> MaterialDisplaced::record() { return rowSpan(kDisplacedRecord); }
 
 void MaterialDisplaced::writeXml(AssetXmlWriter& writer, std::u16string url) {
     url = childUrl(url, name);
@@ -219,23 +117,16 @@ bool MaterialObjectExclusion::load(QuickArchive& ar) {
     return true;
 }
 
-MaterialPtr MaterialObjectExclusion::copyWith(bool newName) const {
-    boost::shared_ptr<MaterialObjectExclusion> c = copyOf(*this, newName);
-    c->base_mtl = copyChild(base_mtl, newName);
-    return c;
+void MaterialObjectExclusion::copyChildren(bool newName) {
+    base_mtl = copyChild(base_mtl, newName);
 }
 
-MaterialPtr MaterialObjectExclusion::duplicate() const { return copyWith(true); }
-
-MaterialPtr MaterialObjectExclusion::clone() const { return copyWith(false); }
-
-bool MaterialObjectExclusion::isEqual(const MaterialPtr& other) const {
-    const MaterialObjectExclusion* o = sameClass(*this, other);
-    if (!o || !childrenEqual(base_mtl, o->base_mtl) || mode != o->mode ||
-        short_circuit != o->short_circuit || objects.size() != o->objects.size())
+bool MaterialObjectExclusion::sameContent(const MaterialObjectExclusion& o) const {
+    if (!childrenEqual(base_mtl, o.base_mtl) || mode != o.mode ||
+        short_circuit != o.short_circuit || objects.size() != o.objects.size())
         return false;
     for (std::size_t i = 0; i < objects.size(); ++i)
-        if (!platform::iequals(objects[i], o->objects[i])) return false;
+        if (!platform::iequals(objects[i], o.objects[i])) return false;
     return true;
 }
 
@@ -256,49 +147,17 @@ void MaterialObjectExclusion::writeXml(AssetXmlWriter& writer, std::u16string ur
 
 MaterialAngleBlend::MaterialAngleBlend() { MaterialAngleBlend::reset(); }
 
-void MaterialAngleBlend::reset() {
-    mtl_one.reset();
-    mtl_two.reset();
-    start_angle = 75;
-    stop_angle = 150;
-}
+typedef MaterialAngleBlend Blend;
 
-bool MaterialAngleBlend::save(QuickArchive& ar) const {
-    writeVersion(ar, kAngleBlendVersion);
-    if (!BaseMaterial::save(ar) || !saveOptionalMember(ar, mtl_one) || !saveOptionalMember(ar, mtl_two))
-        return false;
-    ar.writeFloat(start_angle);
-    ar.writeFloat(stop_angle);
-    return true;
-}
+const RecordRow<Blend> kAngleBlendRecord[] = {
+    kBaseRecord,
+    &Blend::mtl_one,
+    &Blend::mtl_two,
+    RowsOf<Blend>::f32(&Blend::start_angle, 75, 1),
+    RowsOf<Blend>::f32(&Blend::stop_angle, 150, 1),
+};
 
-bool MaterialAngleBlend::load(QuickArchive& ar) {
-    const int v = readVersion(ar, 1, kAngleBlendVersion);
-    reset();  // also when the tag is refused
-    if (v < 0) return false;
-    if (!BaseMaterial::load(ar) || !loadMaterialMember(ar, mtl_one) || !loadMaterialMember(ar, mtl_two))
-        return false;
-    ar.readFloat(start_angle);
-    ar.readFloat(stop_angle);
-    return true;
-}
-
-MaterialPtr MaterialAngleBlend::copyWith(bool newName) const {
-    boost::shared_ptr<MaterialAngleBlend> c = copyOf(*this, newName);
-    c->mtl_one = copyChild(mtl_one, newName);
-    c->mtl_two = copyChild(mtl_two, newName);
-    return c;
-}
-
-MaterialPtr MaterialAngleBlend::duplicate() const { return copyWith(true); }
-
-MaterialPtr MaterialAngleBlend::clone() const { return copyWith(false); }
-
-bool MaterialAngleBlend::isEqual(const MaterialPtr& other) const {
-    const MaterialAngleBlend* o = sameClass(*this, other);
-    return o && childrenEqual(mtl_one, o->mtl_one) && childrenEqual(mtl_two, o->mtl_two) &&
-           start_angle == o->start_angle && stop_angle == o->stop_angle;
-}
+RowSpan<RecordRow<MaterialAngleBlend>> MaterialAngleBlend::record() { return rowSpan(kAngleBlendRecord); }
 
 void MaterialAngleBlend::writeXml(AssetXmlWriter& writer, std::u16string url) {
     url = childUrl(url, name);
@@ -316,51 +175,17 @@ void MaterialAngleBlend::writeXml(AssetXmlWriter& writer, std::u16string url) {
 
 MaterialAlphaContribution::MaterialAlphaContribution() { MaterialAlphaContribution::reset(); }
 
-void MaterialAlphaContribution::reset() {
-    base_mtl.reset();
-    alpha_tex.reset();
-    alpha_tex_mult = 1;
-    alpha = 1;
-}
+typedef MaterialAlphaContribution Alpha;
 
-bool MaterialAlphaContribution::save(QuickArchive& ar) const {
-    writeVersion(ar, kAlphaContributionVersion);
-    if (!BaseMaterial::save(ar) || !saveOptionalMember(ar, base_mtl) ||
-        !saveOptionalMember(ar, alpha_tex))
-        return false;
-    ar.writeFloat(alpha_tex_mult);
-    ar.writeFloat(alpha);
-    return true;
-}
+const RecordRow<Alpha> kAlphaContributionRecord[] = {
+    kBaseRecord,
+    &Alpha::base_mtl,
+    &Alpha::alpha_tex,
+    RowsOf<Alpha>::f32(&Alpha::alpha_tex_mult, 1, 1),
+    RowsOf<Alpha>::f32(&Alpha::alpha, 1, 1),
+};
 
-bool MaterialAlphaContribution::load(QuickArchive& ar) {
-    const int v = readVersion(ar, 1, kAlphaContributionVersion);
-    reset();  // also when the tag is refused
-    if (v < 0) return false;
-    if (!BaseMaterial::load(ar) || !loadMaterialMember(ar, base_mtl) ||
-        !loadTextureMember(ar, alpha_tex))
-        return false;
-    ar.readFloat(alpha_tex_mult);
-    ar.readFloat(alpha);
-    return true;
-}
-
-MaterialPtr MaterialAlphaContribution::copyWith(bool newName) const {
-    boost::shared_ptr<MaterialAlphaContribution> c = copyOf(*this, newName);
-    c->base_mtl = copyChild(base_mtl, newName);
-    c->alpha_tex = cloneChild(alpha_tex);
-    return c;
-}
-
-MaterialPtr MaterialAlphaContribution::duplicate() const { return copyWith(true); }
-
-MaterialPtr MaterialAlphaContribution::clone() const { return copyWith(false); }
-
-bool MaterialAlphaContribution::isEqual(const MaterialPtr& other) const {
-    const MaterialAlphaContribution* o = sameClass(*this, other);
-    return o && childrenEqual(base_mtl, o->base_mtl) && childrenEqual(alpha_tex, o->alpha_tex) &&
-           alpha_tex_mult == o->alpha_tex_mult && alpha == o->alpha;
-}
+RowSpan<RecordRow<MaterialAlphaContribution>> MaterialAlphaContribution::record() { return rowSpan(kAlphaContributionRecord); }
 
 void MaterialAlphaContribution::writeXml(AssetXmlWriter& writer, std::u16string url) {
     url = childUrl(url, name);

@@ -16,23 +16,19 @@
 #include <string>
 #include <vector>
 
-#include "materials/BaseMaterial.h"
+#include "materials/MaterialRows.h"
 #include "persistence/Types.h"
 #include "textures/BaseTexture.h"
 
 namespace OrvaneLumoCore {
 
-class MaterialOverrideEnvironment : public BaseMaterial {
+class MaterialOverrideEnvironment
+    : public TableMaterialOf<MaterialOverrideEnvironment, kMaterialOverrideEnvironment> {
 public:
-    MaterialOverrideEnvironment();
+    static constexpr int kRecordVersion = 1;
+    static RowSpan<RecordRow<MaterialOverrideEnvironment>> record();
 
-    bool save(QuickArchive& ar) const override;
-    bool load(QuickArchive& ar) override;
-    std::uint32_t getType() const override { return kMaterialOverrideEnvironment; }
-    void reset() override;
-    MaterialPtr duplicate() const override;
-    MaterialPtr clone() const override;
-    bool isEqual(const MaterialPtr& other) const override;
+    MaterialOverrideEnvironment();
 
     // No Asset of its own: base_mtl's Assets under the same url.
     void writeXml(AssetXmlWriter& writer, std::u16string url) override;
@@ -43,22 +39,14 @@ public:
     Color gi_color, bg_color, reflect_color, refract_color;
     float bg_tex_mult, gi_tex_mult, reflect_tex_mult, refract_tex_mult;
     bool override_bg, override_gi, override_reflect, override_refract;
-
-private:
-    MaterialPtr copyWith(bool newName) const;
 };
 
-class MaterialDisplaced : public BaseMaterial {
+class MaterialDisplaced : public TableMaterialOf<MaterialDisplaced, kMaterialDisplaced> {
 public:
-    MaterialDisplaced();
+    static constexpr int kRecordVersion = 2;
+    static RowSpan<RecordRow<MaterialDisplaced>> record();
 
-    bool save(QuickArchive& ar) const override;
-    bool load(QuickArchive& ar) override;
-    std::uint32_t getType() const override { return kMaterialDisplaced; }
-    void reset() override;
-    MaterialPtr duplicate() const override;
-    MaterialPtr clone() const override;
-    bool isEqual(const MaterialPtr& other) const override;
+    MaterialDisplaced();
 
     // No Asset of its own: base_mtl's Assets one step (the name) below.
     void writeXml(AssetXmlWriter& writer, std::u16string url) override;
@@ -73,24 +61,18 @@ public:
     std::int32_t displace_continuity;
     std::int32_t displace_view_dependent;
     std::int32_t displace_use_globals;
-
-private:
-    MaterialPtr copyWith(bool newName) const;
 };
 
-class MaterialObjectExclusion : public BaseMaterial {
+class MaterialObjectExclusion : public MaterialOf<MaterialObjectExclusion, kMaterialObjectExclusion> {
 public:
     MaterialObjectExclusion();
 
     bool save(QuickArchive& ar) const override;
     // Version 1 has no base record and keeps the name it had.
     bool load(QuickArchive& ar) override;
-    std::uint32_t getType() const override { return kMaterialObjectExclusion; }
     void reset() override;
-    MaterialPtr duplicate() const override;
-    MaterialPtr clone() const override;
     // `objects` agree entry by entry, ignoring case.
-    bool isEqual(const MaterialPtr& other) const override;
+    bool sameContent(const MaterialObjectExclusion& o) const;
 
     void writeXml(AssetXmlWriter& writer, std::u16string url) override;
     std::u16string getPluginName() const override { return u"MtlObjectExclusion"; }
@@ -100,21 +82,16 @@ public:
     std::vector<std::u16string> objects;
     bool short_circuit;
 
-private:
-    MaterialPtr copyWith(bool newName) const;
+    // On a fresh copy: the children that are not to be shared.
+    void copyChildren(bool newName);
 };
 
-class MaterialAngleBlend : public BaseMaterial {
+class MaterialAngleBlend : public TableMaterialOf<MaterialAngleBlend, kMaterialAngleBlend> {
 public:
-    MaterialAngleBlend();
+    static constexpr int kRecordVersion = 1;
+    static RowSpan<RecordRow<MaterialAngleBlend>> record();
 
-    bool save(QuickArchive& ar) const override;
-    bool load(QuickArchive& ar) override;
-    std::uint32_t getType() const override { return kMaterialAngleBlend; }
-    void reset() override;
-    MaterialPtr duplicate() const override;
-    MaterialPtr clone() const override;
-    bool isEqual(const MaterialPtr& other) const override;
+    MaterialAngleBlend();
 
     void writeXml(AssetXmlWriter& writer, std::u16string url) override;
     std::u16string getPluginName() const override { return u"MtlAngleBlend"; }
@@ -123,22 +100,14 @@ public:
     MaterialPtr mtl_two;
     float start_angle;
     float stop_angle;
-
-private:
-    MaterialPtr copyWith(bool newName) const;
 };
 
-class MaterialAlphaContribution : public BaseMaterial {
+class MaterialAlphaContribution : public TableMaterialOf<MaterialAlphaContribution, kMaterialAlphaContribution> {
 public:
-    MaterialAlphaContribution();
+    static constexpr int kRecordVersion = 1;
+    static RowSpan<RecordRow<MaterialAlphaContribution>> record();
 
-    bool save(QuickArchive& ar) const override;
-    bool load(QuickArchive& ar) override;
-    std::uint32_t getType() const override { return kMaterialAlphaContribution; }
-    void reset() override;
-    MaterialPtr duplicate() const override;
-    MaterialPtr clone() const override;
-    bool isEqual(const MaterialPtr& other) const override;
+    MaterialAlphaContribution();
 
     void writeXml(AssetXmlWriter& writer, std::u16string url) override;
     std::u16string getPluginName() const override { return u"MtlAlphaContribution"; }
@@ -147,9 +116,6 @@ public:
     TexturePtr alpha_tex;
     float alpha_tex_mult;
     float alpha;
-
-private:
-    MaterialPtr copyWith(bool newName) const;
 };
 
 }  // namespace OrvaneLumoCore

@@ -1,6 +1,6 @@
 #include "options/AllOptions.h"
 
-#include "options/RecordRows.h"
+#include "persistence/FieldRows.h"
 #include "persistence/QuickArchive.h"
 #include "persistence/Record.h"
 
@@ -9,10 +9,10 @@ namespace OrvaneLumoCore {
 namespace {
 
 typedef AllOptions D;
-typedef rows::Rows<D> DR;
+typedef RowsOf<D> DR;
 
-// Fields that the record's own code reads and writes.
-enum Special {
+// The hook rows: fields that the record's own code reads and writes.
+enum DocumentHook {
     kParams,
     kFrameData,
     kStampInfo,
@@ -25,21 +25,17 @@ enum Special {
     kPath,
 };
 
-rows::Row<D> path(std::u16string D::*member) {
-    rows::Row<D> r = DR::special(kPath, 0);
-    r.w = member;
-    return r;
-}
+constexpr RecordRow<D> path(std::u16string D::*member) { return DR::hook(kPath, 0, member); }
 
 // The record in file order. The number behind a builder is the first version
 // that holds the field; versions 10 to 15 don't exist.
-const rows::Row<D> kDocumentRows[] = {
-    DR::special(kParams, 0),                                              // 1
-    DR::special(kFrameData, 0),
-    DR::special(kStampInfo, 0),
-    DR::special(kCamera, 5),
-    DR::special(kBgTexture, 0),                                           // 5
-    DR::special(kGiTexture, 0),
+const RecordRow<D> kDocumentRows[] = {
+    DR::hook(kParams, 0),                                              // 1
+    DR::hook(kFrameData, 0),
+    DR::hook(kStampInfo, 0),
+    DR::hook(kCamera, 5),
+    DR::hook(kBgTexture, 0),                                           // 5
+    DR::hook(kGiTexture, 0),
     DR::color(&D::environment_bg_color, Color(0, 0, 0), 0),
     DR::color(&D::environment_gi_color, Color(0.8f, 0.8980392f, 1.0f), 0),
     DR::b32(&D::environment_use_gi, 0, 0),
@@ -68,7 +64,7 @@ const rows::Row<D> kDocumentRows[] = {
     DR::f32(&D::renderChannels_zdepth_black, 0, 4),
     DR::f32(&D::renderChannels_zdepth_white, 1000, 4),
     DR::b32(&D::renderChannels_zdepth_clamp, 1, 4),
-    DR::special(kChannels, 0),                                            // 35
+    DR::hook(kChannels, 0),                                            // 35
     path(&D::output_img_file),
     path(&D::output_luimg_file),
     path(&D::irradianceMap_file),
@@ -94,8 +90,8 @@ const rows::Row<D> kDocumentRows[] = {
     DR::f32(&D::refractTextureMult, 1, 9),
     DR::b32(&D::environment_use_reflect, 0, 9),
     DR::b32(&D::environment_use_refract, 0, 9),                           // 60
-    DR::special(kReflectTexture, 9),
-    DR::special(kRefractTexture, 9),
+    DR::hook(kReflectTexture, 9),
+    DR::hook(kRefractTexture, 9),
     DR::b32(&D::drOn, 0, 16),
     DR::keptF32(&D::keptFloat1, 17),
     DR::keptF32(&D::keptFloat2, 17),                                      // 65
@@ -154,8 +150,8 @@ void writeChannels(QuickArchive& ar, const std::vector<std::int32_t>& channels) 
     for (std::int32_t channel : channels) ar.writeLength(static_cast<std::uint32_t>(channel));
 }
 
-bool loadSpecial(QuickArchive& ar, AllOptions& o, const rows::Row<D>& r, int version) {
-    switch (r.special) {
+bool loadHookRow(QuickArchive& ar, AllOptions& o, const RecordRow<D>& r, int version) {
+    switch (r.hook) {
     case kParams: return loadNested(ar, o.params);
     case kFrameData: return loadNested(ar, o.frameData);
     case kStampInfo: return loadNested(ar, o.stampInfo);
@@ -163,20 +159,20 @@ bool loadSpecial(QuickArchive& ar, AllOptions& o, const rows::Row<D>& r, int ver
     case kBgTexture:
     case kGiTexture:
     case kReflectTexture:
-    case kRefractTexture: return loadOptionalMember(ar, textureOf(o, r.special), createTexture);
+    case kRefractTexture: return loadOptionalMember(ar, textureOf(o, r.hook), createTexture);
     case kChannels: return readChannels(ar, version, o.renderChannels);
     case kPath: {
         std::u16string text;
         ar.readWString(text);
-        o.*r.w = pathText(text);
+        r.field.get<std::u16string>(o) = pathText(text);
         return true;
     }
     }
     return false;
 }
 
-bool saveSpecial(QuickArchive& ar, const AllOptions& o, const rows::Row<D>& r) {
-    switch (r.special) {
+bool saveHookRow(QuickArchive& ar, const AllOptions& o, const RecordRow<D>& r) {
+    switch (r.hook) {
     case kParams: return o.params.save(ar);
     case kFrameData: return o.frameData.save(ar);
     case kStampInfo: return o.stampInfo.save(ar);
@@ -185,9 +181,9 @@ bool saveSpecial(QuickArchive& ar, const AllOptions& o, const rows::Row<D>& r) {
     case kGiTexture:
     case kReflectTexture:
     case kRefractTexture:
-        return saveOptionalMember(ar, textureOf(o, r.special));
+        return saveOptionalMember(ar, textureOf(o, r.hook));
     case kChannels: writeChannels(ar, o.renderChannels); return true;
-    case kPath: ar.writeWString(pathText(o.*r.w)); return true;
+    case kPath: ar.writeWString(pathText(r.field.get<std::u16string>(o))); return true;
     }
     return false;
 }
@@ -198,13 +194,8 @@ AllOptions::AllOptions() { reset(); }
 
 bool AllOptions::save(QuickArchive& ar) const {
     ar.writeUInt(versionTag(kVersion) | kTagLowHalf);
-    for (const rows::Row<D>& r : kDocumentRows) {
-        if (r.enc != rows::Enc::Special)
-            rows::writeRow(ar, *this, r);
-        else if (!saveSpecial(ar, *this, r))
-            return false;
-    }
-    return true;
+    return writeFields(ar, *this, kDocumentRows, kVersion,
+                       [&](const RecordRow<D>& r) { return saveHookRow(ar, *this, r); });
 }
 
 bool AllOptions::load(QuickArchive& ar) {
@@ -213,14 +204,8 @@ bool AllOptions::load(QuickArchive& ar) {
     ar.readUInt(tag);
     const int version = static_cast<int>(tag >> 16);
     if ((tag & 0xFFFF) != kTagLowHalf || !isKnownVersion(version)) return false;
-    for (const rows::Row<D>& r : kDocumentRows) {
-        if (!r.inVersion(version)) continue;
-        if (r.enc != rows::Enc::Special)
-            rows::readRow(ar, *this, r);
-        else if (!loadSpecial(ar, *this, r, version))
-            return false;
-    }
-    return true;
+    return readFields(ar, *this, kDocumentRows, version,
+                      [&](const RecordRow<D>& r) { return loadHookRow(ar, *this, r, version); });
 }
 
 void AllOptions::reset() {
@@ -237,12 +222,12 @@ void AllOptions::reset() {
     giTexture.reset();
     reflectTexture.reset();
     refractTexture.reset();
-    rows::resetRows(*this, kDocumentRows);
+    resetFields(*this, kDocumentRows);
     physicalCamera.reset();
     renderChannels.push_back(126);
     renderChannels.push_back(125);
-    for (const rows::Row<D>& r : kDocumentRows)
-        if (r.enc == rows::Enc::Special && r.special == kPath) (this->*r.w).clear();
+    for (const RecordRow<D>& r : kDocumentRows)
+        if (r.use == RowUse::Hook && r.hook == kPath) r.field.get<std::u16string>(*this).clear();
 }
 
 const char16_t* AllOptions::channelName(std::int32_t channel) {

@@ -236,11 +236,7 @@ struct LumoParams {
     Bool32 options_geom_backfaceCull;
 };
 
-// A transform whose offset is kept in double precision.
-struct TransformD {
-    OrvaneLumoCore::Matrix m;
-    double offs[3];
-};
+using OrvaneLumoCore::TransformD;
 
 struct LumoFrameData : public PluginBase {
     double t;

@@ -3,10 +3,11 @@
 #include <algorithm>
 #include <cstring>
 
-#include "options/RecordRows.h"
 #include "persistence/QuickArchive.h"
+#include "persistence/FieldRows.h"
 #include "persistence/Record.h"
-#include "xml/AssetXmlWriter.h"
+#include "xml/AssetScope.h"
+#include "xml/ParamRows.h"
 
 namespace OrvaneLumoCore {
 
@@ -21,9 +22,9 @@ namespace {
 // defaults are those of a document; OrvaneParams::reset differs in four.
 
 typedef LumoParams P;
-typedef rows::Rows<P> PR;
+typedef RowsOf<P> PR;
 
-const rows::Row<P> kParamsRows[] = {
+const RecordRow<P> kParamsRows[] = {
     PR::b32(&P::imageFilter_on, 1, 1),                               // 1
     PR::i32(&P::imageSampler_type, 2, 1),
     PR::i32(&P::imageSampler_fixed_subdivs, 1, 1),
@@ -203,57 +204,86 @@ const rows::Row<P> kParamsRows[] = {
 // ---- OrvaneFrameData ------------------------------------------------------------------
 
 typedef LumoFrameData F;
-typedef rows::Rows<F> FR;
+typedef RowsOf<F> FR;
 
-// Rows marked with xml() are the parameters of the FrameData asset, in order.
-const rows::Row<F> kFrameRows[] = {
-    FR::xml(FR::f64(&F::t, 0), "t"),                                    // 1
-    FR::xml(FR::f64(&F::frameStart, 0), "frameStart"),
-    FR::xml(FR::f64(&F::frameEnd, 1), "frameEnd"),
-    FR::xml(FR::i32(&F::currentFrame, 0), "currentFrame"),
-    FR::xml(FR::transformD(&F::worldToCam), "worldToCam"),              // 5
-    FR::xml(FR::transformD(&F::camToWorld), "camToWorld"),
-    FR::xml(FR::f32(&F::fov, 0), "fov"),
-    FR::xml(FR::f32(&F::nearRange, 0), "nearRange"),
-    FR::xml(FR::f32(&F::farRange, 0), "farRange"),
-    FR::f32(&F::cameraDof_focal_dist, 200),                             // 10
+const RecordRow<F> kFrameRows[] = {
+    FR::f64(&F::t, 0),                                              // 1
+    FR::f64(&F::frameStart, 0),
+    FR::f64(&F::frameEnd, 1),
+    FR::i32(&F::currentFrame, 0),
+    FR::transformD(&F::worldToCam),                                 // 5
+    FR::transformD(&F::camToWorld),
+    FR::f32(&F::fov, 0),
+    FR::f32(&F::nearRange, 0),
+    FR::f32(&F::farRange, 0),
+    FR::f32(&F::cameraDof_focal_dist, 200),                         // 10
     FR::f32(&F::cameraDof_aperture, 0.1),
     FR::f32(&F::cameraDof_rotation, 0),
-    FR::xml(FR::i32(&F::clippingPlanes, 0), "clippingPlanes"),
-    FR::xml(FR::f32(&F::clipNear, 0), "clipNear"),
-    FR::xml(FR::f32(&F::clipFar, 0), "clipFar"),                        // 15
-    FR::xml(FR::i32(&F::projType, 0), "projType"),
-    FR::xml(FR::f32(&F::zoomFractor, 1), "zoomFractor"),
-    FR::xml(FR::i32(&F::infiniteProj, 0), "infiniteProj"),
+    FR::i32(&F::clippingPlanes, 0),
+    FR::f32(&F::clipNear, 0),
+    FR::f32(&F::clipFar, 0),                                        // 15
+    FR::i32(&F::projType, 0),
+    FR::f32(&F::zoomFractor, 1),
+    FR::i32(&F::infiniteProj, 0),
     FR::f32(&F::camera_height, 400),
-    FR::b32(&F::camera_auto_fit, 1),                                    // 20
+    FR::b32(&F::camera_auto_fit, 1),                                // 20
     FR::f32(&F::camera_dist, 2),
     FR::f32(&F::camera_curve, 1),
-    FR::xml(FR::i32(&F::orthoAdjustToScene, 0), "orthoAdjustToScene"),
-    FR::xml(FR::color(&F::ambient, Color()), "ambient"),
-    FR::xml(FR::color(&F::background, Color()), "background"),          // 25
-    FR::xml(FR::color(&F::globalLightLevel, Color()), "globalLightLevel"),
-    FR::xml(FR::color(&F::lumoGIBackground, Color()), "lumoGIBackground"),
-    FR::xml(FR::color(&F::lumoRRBackground, Color()), "lumoRRBackground"),
-    FR::xml(FR::color(&F::lumoRefractBackground, Color()), "lumoRefractBackground"),
-    FR::f32(&F::output_rgn_left, 0),                                    // 30
+    FR::i32(&F::orthoAdjustToScene, 0),
+    FR::color(&F::ambient, Color()),
+    FR::color(&F::background, Color()),                             // 25
+    FR::color(&F::globalLightLevel, Color()),
+    FR::color(&F::lumoGIBackground, Color()),
+    FR::color(&F::lumoRRBackground, Color()),
+    FR::color(&F::lumoRefractBackground, Color()),
+    FR::f32(&F::output_rgn_left, 0),                                // 30
     FR::f32(&F::output_rgn_width, 0),
     FR::f32(&F::output_rgn_top, 0),
     FR::f32(&F::output_rgn_height, 0),
     FR::i32(&F::keptFrame34, 0),
-    FR::i32(&F::keptFrame35, 0),                                        // 35
+    FR::i32(&F::keptFrame35, 0),                                    // 35
     FR::i32(&F::output_bmp_width, 0),
     FR::i32(&F::output_bmp_height, 0),
     FR::i32(&F::output_r_left, 0),
     FR::i32(&F::output_r_width, 0),
-    FR::i32(&F::output_r_top, 0),                                       // 40
+    FR::i32(&F::output_r_top, 0),                                   // 40
     FR::i32(&F::output_r_height, 0),
-    FR::xml(FR::f32(&F::devAspect, 1), "devAspect"),
-    FR::xml(FR::i32(&F::fieldMask, 3), "fieldMask"),
-    FR::xml(FR::i32(&F::fieldOrder, 0), "fieldOrder"),
-    FR::xml(FR::i32(&F::firstField, 0), "firstField"),                  // 45
+    FR::f32(&F::devAspect, 1),
+    FR::i32(&F::fieldMask, 3),
+    FR::i32(&F::fieldOrder, 0),
+    FR::i32(&F::firstField, 0),                                     // 45
     FR::f32(&F::colorMapping_dark_mult, 1),
     FR::f32(&F::colorMapping_bright_mult, 1),
+};
+
+// The parameters of the FrameData asset, in order.
+const ParamRow<F> kFrameParams[] = {
+    {"t", &F::t},
+    {"frameStart", &F::frameStart},
+    {"frameEnd", &F::frameEnd},
+    {"currentFrame", &F::currentFrame},
+    {"worldToCam", &F::worldToCam},
+    {"camToWorld", &F::camToWorld},
+    {"fov", &F::fov},
+    {"nearRange", &F::nearRange},
+    {"farRange", &F::farRange},
+    {"clippingPlanes", &F::clippingPlanes},
+    {"clipNear", &F::clipNear},
+    {"clipFar", &F::clipFar},
+    {"projType", &F::projType},
+    {"zoomFractor", &F::zoomFractor},
+    {"infiniteProj", &F::infiniteProj},
+    {"orthoAdjustToScene", &F::orthoAdjustToScene},
+    {"ambient", &F::ambient},
+    {"background", &F::background},
+    {"globalLightLevel", &F::globalLightLevel},
+    {"lumoGIBackground", &F::lumoGIBackground},
+    {"lumoRRBackground", &F::lumoRRBackground},
+    {"lumoRefractBackground", &F::lumoRefractBackground},
+    {"devAspect", &F::devAspect},
+    {"fieldMask", &F::fieldMask},
+    {"fieldOrder", &F::fieldOrder},
+    {"firstField", &F::firstField},
 };
 
 }  // namespace
@@ -262,7 +292,7 @@ const rows::Row<F> kFrameRows[] = {
 
 bool OrvaneParams::save(QuickArchive& ar) const {
     writeVersion(ar, kVersion);
-    rows::writeRows(ar, static_cast<const LumoParams&>(*this), kParamsRows, kVersion);
+    writeFields(ar, static_cast<const LumoParams&>(*this), kParamsRows, kVersion);
     return true;
 }
 
@@ -270,12 +300,12 @@ bool OrvaneParams::load(QuickArchive& ar) {
     reset();
     const int version = readVersion(ar, 1, kVersion);
     if (version < 0) return false;
-    rows::readRows(ar, static_cast<LumoParams&>(*this), kParamsRows, version);
+    readFields(ar, static_cast<LumoParams&>(*this), kParamsRows, version);
     return true;
 }
 
 void OrvaneParams::reset() {
-    rows::resetRows(static_cast<LumoParams&>(*this), kParamsRows);
+    resetFields(static_cast<LumoParams&>(*this), kParamsRows);
     // A bare parameter set differs from a document's defaults in four fields.
     imageFilter_on = 0;
     imageSampler_type = 0;
@@ -304,7 +334,7 @@ void OrvaneParams::writeXml(AssetXmlWriter&, std::u16string) {}
 
 bool OrvaneFrameData::save(QuickArchive& ar) const {
     writeVersion(ar, kVersion);
-    rows::writeRows(ar, static_cast<const LumoFrameData&>(*this), kFrameRows, kVersion);
+    writeFields(ar, static_cast<const LumoFrameData&>(*this), kFrameRows, kVersion);
     return true;
 }
 
@@ -312,36 +342,15 @@ bool OrvaneFrameData::load(QuickArchive& ar) {
     reset();
     const int version = readVersion(ar, kVersion, kVersion);
     if (version < 0) return false;
-    rows::readRows(ar, static_cast<LumoFrameData&>(*this), kFrameRows, version);
+    readFields(ar, static_cast<LumoFrameData&>(*this), kFrameRows, version);
     return true;
 }
 
-void OrvaneFrameData::reset() { rows::resetRows(static_cast<LumoFrameData&>(*this), kFrameRows); }
+void OrvaneFrameData::reset() { resetFields(static_cast<LumoFrameData&>(*this), kFrameRows); }
 
 void OrvaneFrameData::writeXml(AssetXmlWriter& writer, std::u16string url) {
-    const LumoFrameData& data = *this;
-    writer.openAsset(url + u"/" + getPluginName(), getAssetType(), u"");
-    writer.openPlugin(getPluginName(), getAssetType());
-    writer.openParameters();
-    for (const rows::Row<F>& r : kFrameRows) {
-        if (!r.ownXml) continue;
-        switch (r.enc) {
-        case rows::Enc::F64: writer.writeFloat(r.name, static_cast<float>(data.*r.d)); break;
-        case rows::Enc::F32: writer.writeFloat(r.name, data.*r.f); break;
-        case rows::Enc::I32: writer.writeInteger(r.name, data.*r.i); break;
-        case rows::Enc::Color: writer.writeColor(r.name, data.*r.c); break;
-        case rows::Enc::TransformD: {
-            Transform narrow;
-            rows::narrowOffset(data.*r.t, narrow);
-            writer.writeTransform(r.name, narrow);
-            break;
-        }
-        default: break;
-        }
-    }
-    writer.closeParameters();
-    writer.closePlugin();
-    writer.closeAsset();
+    writeAsset(writer, url + u"/" + getPluginName(), getAssetType(), getPluginName(),
+               [&] { writeParams(writer, static_cast<const LumoFrameData&>(*this), kFrameParams); });
 }
 
 // ---- OrvaneLFBStampInfo ----------------------------------------------------------------

@@ -7,7 +7,7 @@
 #include <boost/any.hpp>
 
 #include "options/AllOptions.h"
-#include "xml/AssetXmlWriter.h"
+#include "xml/AssetScope.h"
 
 namespace OrvaneLumoCore {
 
@@ -515,13 +515,9 @@ void writeBlock(AssetXmlWriter& w, const AllOptions& o, const Block& b, const st
         const Value v = b.params[k].source(o);
         if (*v.texture) (*v.texture)->writeXml(w, slotUrl(blockUrl, v));
     }
-    w.openAsset(blockUrl, assetType, u"");
-    w.openPlugin(b.name, assetType);
-    w.openParameters();
-    for (std::size_t k = 0; k < b.count; ++k) writeParam(w, o, b.params[k], blockUrl);
-    w.closeParameters();
-    w.closePlugin();
-    w.closeAsset();
+    writeAsset(w, blockUrl, assetType, b.name, [&] {
+        for (std::size_t k = 0; k < b.count; ++k) writeParam(w, o, b.params[k], blockUrl);
+    });
     w.closeAssets();
 }
 

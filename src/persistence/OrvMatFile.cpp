@@ -159,8 +159,8 @@ bool OrvMatFile::load(const platform::ByteSource& bytes) {
             stream.reset(new RangeBlocks(bytes, 8, size - 8, RangeBlocks::blocksFor(size - 8)));
             break;
         case 1:
-            textMode = new TextModeBlocks(bytes, 8, size);
-            stream.reset(textMode);
+            stream.reset(new TextModeBlocks(bytes, 8, size));
+            textMode = static_cast<const TextModeBlocks*>(stream.get());
             break;
         default:
             return loadNote.fail(LoadRule::BadHeader, 0, tag, "unknown container version tag");

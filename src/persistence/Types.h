@@ -7,7 +7,7 @@ namespace OrvaneLumoCore {
 struct Vector {
     float x = 0, y = 0, z = 0;
     Vector() = default;
-    Vector(float x_, float y_, float z_) : x(x_), y(y_), z(z_) {}
+    constexpr Vector(float x_, float y_, float z_) : x(x_), y(y_), z(z_) {}
     float& operator[](int i) { return (&x)[i]; }
     float operator[](int i) const { return (&x)[i]; }
     bool operator==(const Vector& o) const { return x == o.x && y == o.y && z == o.z; }
@@ -17,7 +17,7 @@ struct Vector {
 struct Color {
     float r = 0, g = 0, b = 0;
     Color() = default;
-    Color(float r_, float g_, float b_) : r(r_), g(g_), b(b_) {}
+    constexpr Color(float r_, float g_, float b_) : r(r_), g(g_), b(b_) {}
     bool operator==(const Color& o) const { return r == o.r && g == o.g && b == o.b; }
     bool operator!=(const Color& o) const { return !(*this == o); }
 };
@@ -25,7 +25,7 @@ struct Color {
 struct AColor {
     float r = 0, g = 0, b = 0, a = 0;
     AColor() = default;
-    AColor(float r_, float g_, float b_, float a_) : r(r_), g(g_), b(b_), a(a_) {}
+    constexpr AColor(float r_, float g_, float b_, float a_) : r(r_), g(g_), b(b_), a(a_) {}
     bool operator==(const AColor& o) const { return r == o.r && g == o.g && b == o.b && a == o.a; }
     bool operator!=(const AColor& o) const { return !(*this == o); }
 };
@@ -61,6 +61,13 @@ struct Rect {
         return x0 == o.x0 && y0 == o.y0 && x1 == o.x1 && y1 == o.y1;
     }
     bool operator!=(const Rect& o) const { return !(*this == o); }
+};
+
+// A transform whose offset is kept in double precision; records hold it as a
+// transform of f32.
+struct TransformD {
+    Matrix m;
+    double offs[3];
 };
 
 }  // namespace OrvaneLumoCore

@@ -1,22 +1,16 @@
 #include "textures/BasicTextures.h"
 
 #include <algorithm>
-#include <cstring>
 
 #include "persistence/QuickArchive.h"
 #include "persistence/Record.h"
 #include "textures/TextureFrame.h"
+#include "textures/TextureRows.h"
 #include "xml/AssetXmlWriter.h"
 
 namespace OrvaneLumoCore {
 
 namespace {
-
-float floatFromBits(std::uint32_t bits) {
-    float f;
-    std::memcpy(&f, &bits, sizeof f);
-    return f;
-}
 
 // The colour that XML shows for a stored complement: max(0, 1 - c) per channel.
 Color complement(const Color& c) {
@@ -28,76 +22,30 @@ Color complement(const Color& c) {
 
 // ---- FresnelTexture ------------------------------------------------------------
 
-void FresnelTexture::reset() {
-    reflection_tex.reset();
-    refraction_tex.reset();
-    fresnel_ior_tex.reset();
-    refract_ior_tex.reset();
-    whiteInverse = Color(1, 1, 1);
-    const float black = floatFromBits(0x3E828283u);  // 0.25490198
-    blackInverse = Color(black, black, black);
-    fresnel_ior = 1.55f;
-    refract_ior = 1.55f;
-    black_color_tex_mult = 1.0f;
-    white_color_tex_mult = 1.0f;
-    fresnel_ior_tex_mult = 1.0f;
-    refract_ior_tex_mult = 1.0f;
-}
+typedef FresnelTexture Fr;
 
-bool FresnelTexture::save(QuickArchive& ar) const {
-    writeVersion(ar, 2);
-    ar.writeColor(whiteInverse);
-    ar.writeColor(blackInverse);
-    ar.writeFloat(fresnel_ior);
-    ar.writeFloat(refract_ior);
-    ar.writeFloat(black_color_tex_mult);
-    ar.writeFloat(white_color_tex_mult);
-    ar.writeFloat(fresnel_ior_tex_mult);
-    ar.writeFloat(refract_ior_tex_mult);
-    return saveOptionalMember(ar, reflection_tex) && saveOptionalMember(ar, refraction_tex) &&
-           saveOptionalMember(ar, fresnel_ior_tex) && saveOptionalMember(ar, refract_ior_tex);
-}
+const RecordRow<Fr> kFresnelRecord[] = {
+    &Fr::whiteInverse,
+    &Fr::blackInverse,
+    &Fr::fresnel_ior,
+    &Fr::refract_ior,
+    {&Fr::black_color_tex_mult, 2},
+    {&Fr::white_color_tex_mult, 2},
+    {&Fr::fresnel_ior_tex_mult, 2},
+    {&Fr::refract_ior_tex_mult, 2},
+    {&Fr::reflection_tex, 2},
+    {&Fr::refraction_tex, 2},
+    {&Fr::fresnel_ior_tex, 2},
+    {&Fr::refract_ior_tex, 2},
+};
 
-bool FresnelTexture::load(QuickArchive& ar) {
-    reset();
-    const int v = readVersion(ar, 1, 2);
-    if (v < 0) return false;
-    ar.readColor(whiteInverse);
-    ar.readColor(blackInverse);
-    ar.readFloat(fresnel_ior);
-    ar.readFloat(refract_ior);
-    if (v < 2) return true;
-    ar.readFloat(black_color_tex_mult);
-    ar.readFloat(white_color_tex_mult);
-    ar.readFloat(fresnel_ior_tex_mult);
-    ar.readFloat(refract_ior_tex_mult);
-    return loadOptionalMember(ar, reflection_tex, createTexture) &&
-           loadOptionalMember(ar, refraction_tex, createTexture) &&
-           loadOptionalMember(ar, fresnel_ior_tex, createTexture) &&
-           loadOptionalMember(ar, refract_ior_tex, createTexture);
-}
+bool FresnelTexture::save(QuickArchive& ar) const { return saveTextureRecord(*this, ar, kFresnelRecord, 2); }
 
-TexturePtr FresnelTexture::clone() const {
-    boost::shared_ptr<FresnelTexture> copy(new FresnelTexture(*this));
-    copy->reflection_tex = cloneChild(reflection_tex);
-    copy->refraction_tex = cloneChild(refraction_tex);
-    copy->fresnel_ior_tex = cloneChild(fresnel_ior_tex);
-    copy->refract_ior_tex = cloneChild(refract_ior_tex);
-    return copy;
-}
+bool FresnelTexture::load(QuickArchive& ar) { return loadTextureRecord(*this, ar, kFresnelRecord, 2); }
 
-bool FresnelTexture::isEqual(const TexturePtr& other) const {
-    const FresnelTexture* o = sameClass(*this, other);
-    return o && childrenEqual(reflection_tex, o->reflection_tex) &&
-           childrenEqual(refraction_tex, o->refraction_tex) &&
-           childrenEqual(fresnel_ior_tex, o->fresnel_ior_tex) &&
-           childrenEqual(refract_ior_tex, o->refract_ior_tex) && whiteInverse == o->whiteInverse &&
-           blackInverse == o->blackInverse && fresnel_ior == o->fresnel_ior &&
-           refract_ior == o->refract_ior && black_color_tex_mult == o->black_color_tex_mult &&
-           white_color_tex_mult == o->white_color_tex_mult &&
-           fresnel_ior_tex_mult == o->fresnel_ior_tex_mult &&
-           refract_ior_tex_mult == o->refract_ior_tex_mult;
-}
+void FresnelTexture::finishClone() { cloneTextureRows(*this, kFresnelRecord); }
+
+bool FresnelTexture::sameContent(const FresnelTexture& o) const { return rowsEqual(*this, o, kFresnelRecord); }
 
 void FresnelTexture::writeXml(AssetXmlWriter& w, std::u16string url) {
     TextureFrame frame(w, *this, url);
@@ -155,18 +103,15 @@ bool BlendTexture::load(QuickArchive& ar) {
     return true;
 }
 
-TexturePtr BlendTexture::clone() const {
-    boost::shared_ptr<BlendTexture> copy(new BlendTexture(*this));
-    copy->color_a = cloneChild(color_a);
-    copy->color_b = cloneChild(color_b);
-    return copy;
+void BlendTexture::finishClone() {
+    color_a = cloneChild(color_a);
+    color_b = cloneChild(color_b);
 }
 
-bool BlendTexture::isEqual(const TexturePtr& other) const {
-    const BlendTexture* o = sameClass(*this, other);
-    return o && childrenEqual(color_a, o->color_a) && childrenEqual(color_b, o->color_b) &&
-           colorAMult == o->colorAMult && colorBMult == o->colorBMult &&
-           blend_amount == o->blend_amount;
+bool BlendTexture::sameContent(const BlendTexture& o) const {
+    return childrenEqual(color_a, o.color_a) && childrenEqual(color_b, o.color_b) &&
+           colorAMult == o.colorAMult && colorBMult == o.colorBMult &&
+           blend_amount == o.blend_amount;
 }
 
 void BlendTexture::writeXml(AssetXmlWriter& w, std::u16string url) {
@@ -203,15 +148,12 @@ bool InvertTexture::load(QuickArchive& ar) {
     return true;
 }
 
-TexturePtr InvertTexture::clone() const {
-    boost::shared_ptr<InvertTexture> copy(new InvertTexture(*this));
-    copy->texture = cloneChild(texture);
-    return copy;
+void InvertTexture::finishClone() {
+    texture = cloneChild(texture);
 }
 
-bool InvertTexture::isEqual(const TexturePtr& other) const {
-    const InvertTexture* o = sameClass(*this, other);
-    return o && childrenEqual(texture, o->texture) && invert_alpha == o->invert_alpha;
+bool InvertTexture::sameContent(const InvertTexture& o) const {
+    return childrenEqual(texture, o.texture) && invert_alpha == o.invert_alpha;
 }
 
 void InvertTexture::writeXml(AssetXmlWriter& w, std::u16string url) {
@@ -225,27 +167,9 @@ void InvertTexture::writeXml(AssetXmlWriter& w, std::u16string url) {
 
 // ---- AColorTexture -------------------------------------------------------------
 
-void AColorTexture::reset() { color = AColor(1, 1, 1, 1); }
+const RecordRow<AColorTexture> kAColorRecord[] = {&AColorTexture::color};
 
-bool AColorTexture::save(QuickArchive& ar) const {
-    writeVersion(ar, 1);
-    ar.writeAColor(color);
-    return true;
-}
-
-bool AColorTexture::load(QuickArchive& ar) {
-    reset();
-    if (readVersion(ar, 1, 1) < 0) return false;
-    ar.readAColor(color);
-    return true;
-}
-
-TexturePtr AColorTexture::clone() const { return TexturePtr(new AColorTexture(*this)); }
-
-bool AColorTexture::isEqual(const TexturePtr& other) const {
-    const AColorTexture* o = sameClass(*this, other);
-    return o && color == o->color;
-}
+RowSpan<RecordRow<AColorTexture>> AColorTexture::record() { return rowSpan(kAColorRecord); }
 
 void AColorTexture::writeXml(AssetXmlWriter& w, std::u16string url) {
     TextureFrame frame(w, *this, url);

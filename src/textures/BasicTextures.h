@@ -4,23 +4,19 @@
 #include <string>
 
 #include "persistence/Types.h"
+#include "persistence/FamilyOf.h"
 #include "textures/BaseTexture.h"
 
 namespace OrvaneLumoCore {
 
 // Mixes two colours or textures by the angle of view. The colours are kept
 // as their complements; XML writes them back as max(0, 1 - c).
-class FresnelTexture : public BaseTexture {
+class FresnelTexture : public FamilyOf<FresnelTexture, 1, BaseTexture> {
 public:
-    static const std::uint32_t kType = 1;
-    FresnelTexture() { reset(); }
-
     bool save(QuickArchive& ar) const override;
     bool load(QuickArchive& ar) override;
-    void reset() override;
-    std::uint32_t getType() const override { return kType; }
-    TexturePtr clone() const override;
-    bool isEqual(const TexturePtr& other) const override;
+    void finishClone();
+    bool sameContent(const FresnelTexture& o) const;
     void writeXml(AssetXmlWriter& writer, std::u16string url) override;
     std::u16string getPluginName() const override { return u"TexFresnel"; }
 
@@ -28,28 +24,26 @@ public:
     TexturePtr refraction_tex;
     TexturePtr fresnel_ior_tex;
     TexturePtr refract_ior_tex;
-    Color whiteInverse;
-    Color blackInverse;
-    float fresnel_ior;
-    float refract_ior;
-    float black_color_tex_mult;
-    float white_color_tex_mult;
-    float fresnel_ior_tex_mult;
-    float refract_ior_tex_mult;
+    Color whiteInverse{1, 1, 1};
+    Color blackInverse{0x1.050506p-2f, 0x1.050506p-2f, 0x1.050506p-2f};  // 0.25490198
+    float fresnel_ior = 1.55f;
+    float refract_ior = 1.55f;
+    float black_color_tex_mult = 1.0f;
+    float white_color_tex_mult = 1.0f;
+    float fresnel_ior_tex_mult = 1.0f;
+    float refract_ior_tex_mult = 1.0f;
 };
 
 // Mixes two textures by a fixed amount.
-class BlendTexture : public BaseTexture {
+class BlendTexture : public FamilyOf<BlendTexture, 10, BaseTexture> {
 public:
-    static const std::uint32_t kType = 10;
     BlendTexture() { reset(); }
 
     bool save(QuickArchive& ar) const override;
     bool load(QuickArchive& ar) override;
     void reset() override;
-    std::uint32_t getType() const override { return kType; }
-    TexturePtr clone() const override;
-    bool isEqual(const TexturePtr& other) const override;
+    void finishClone();
+    bool sameContent(const BlendTexture& o) const;
     void writeXml(AssetXmlWriter& writer, std::u16string url) override;
     std::u16string getPluginName() const override { return u"TexBlend"; }
 
@@ -61,17 +55,15 @@ public:
 };
 
 // Inverts one texture.
-class InvertTexture : public BaseTexture {
+class InvertTexture : public FamilyOf<InvertTexture, 9, BaseTexture> {
 public:
-    static const std::uint32_t kType = 9;
     InvertTexture() { reset(); }
 
     bool save(QuickArchive& ar) const override;  // false without `texture`
     bool load(QuickArchive& ar) override;
     void reset() override;
-    std::uint32_t getType() const override { return kType; }
-    TexturePtr clone() const override;
-    bool isEqual(const TexturePtr& other) const override;
+    void finishClone();
+    bool sameContent(const InvertTexture& o) const;
     void writeXml(AssetXmlWriter& writer, std::u16string url) override;
     std::u16string getPluginName() const override { return u"TexInvert"; }
 
@@ -80,22 +72,18 @@ public:
 };
 
 // A constant colour with alpha.
-class AColorTexture : public BaseTexture {
+class AColorTexture : public FlatFamilyOf<AColorTexture, 5, BaseTexture> {
 public:
-    static const std::uint32_t kType = 5;
-    AColorTexture() { reset(); }
+    static constexpr int kRecordVersion = 1;
+    static RowSpan<RecordRow<AColorTexture>> record();
+
+    AColorTexture() = default;
     explicit AColorTexture(const AColor& c) : color(c) {}
 
-    bool save(QuickArchive& ar) const override;
-    bool load(QuickArchive& ar) override;
-    void reset() override;
-    std::uint32_t getType() const override { return kType; }
-    TexturePtr clone() const override;
-    bool isEqual(const TexturePtr& other) const override;
     void writeXml(AssetXmlWriter& writer, std::u16string url) override;
     std::u16string getPluginName() const override { return u"TexAColor"; }
 
-    AColor color;
+    AColor color{1, 1, 1, 1};
 };
 
 }  // namespace OrvaneLumoCore

@@ -4,7 +4,8 @@
 #include "persistence/Record.h"
 #include "platform/WideChar.h"
 #include "textures/TextureFrame.h"
-#include "xml/AssetXmlWriter.h"
+#include "persistence/FieldRows.h"
+#include "xml/ParamRows.h"
 
 namespace OrvaneLumoCore {
 
@@ -12,47 +13,28 @@ const char16_t* const kFilterLabels[3] = {u"No filter", u"Mip-map", u"Summed-are
 
 // ---- BitmapBuffer --------------------------------------------------------------
 
-void BitmapBuffer::reset() {
-    file.clear();
-    filter_type = 1;
-    filter_blur = 0.15f;
-    gamma = 1.0f;
-}
+typedef BitmapBuffer B;
 
-bool BitmapBuffer::save(QuickArchive& ar) const {
-    writeVersion(ar, 1);
-    ar.writeInt(filter_type);
-    ar.writeFloat(filter_blur);
-    ar.writeFloat(gamma);
-    ar.writeWString(file);
-    return true;
-}
+const RecordRow<B> kBufferRecord[] = {
+    &B::filter_type,
+    &B::filter_blur,
+    &B::gamma,
+    FieldRef<B>::path(&B::file),
+};
 
-bool BitmapBuffer::load(QuickArchive& ar) {
-    reset();
-    if (readVersion(ar, 1, 1) < 0) return false;
-    ar.readInt(filter_type);
-    ar.readFloat(filter_blur);
-    ar.readFloat(gamma);
-    ar.readWString(file);
-    return true;
-}
+const ParamRow<B> kBufferParams[] = {
+    {"filter_type", &B::filter_type},
+    {"filter_blur", &B::filter_blur},
+    {"gamma", &B::gamma},
+    {"file", FieldRef<B>::path(&B::file)},
+};
 
-BitmapPtr BitmapBuffer::clone() const { return BitmapPtr(new BitmapBuffer(*this)); }
-
-bool BitmapBuffer::isEqual(const BitmapPtr& other) const {
-    const BitmapBuffer* o = sameClass(*this, other);
-    return o && platform::iequals(file, o->file) && filter_type == o->filter_type &&
-           filter_blur == o->filter_blur && gamma == o->gamma;
-}
+RowSpan<RecordRow<BitmapBuffer>> BitmapBuffer::record() { return rowSpan(kBufferRecord); }
 
 void BitmapBuffer::writeXml(AssetXmlWriter& w, std::u16string url) {
     TextureFrame frame(w, *this, url);
     frame.open();
-    w.writeInteger("filter_type", filter_type);
-    w.writeFloat("filter_blur", filter_blur);
-    w.writeFloat("gamma", gamma);
-    w.writeFileName("file", file);
+    writeParams(w, *this, kBufferParams);
     frame.close();
 }
 
@@ -80,16 +62,13 @@ bool BitmapTexture::load(QuickArchive& ar) {
     return true;
 }
 
-TexturePtr BitmapTexture::clone() const {
-    boost::shared_ptr<BitmapTexture> copy(new BitmapTexture(*this));
-    copy->uvw = cloneChild(uvw);
-    copy->bitmap = cloneChild(bitmap);
-    return copy;
+void BitmapTexture::finishClone() {
+    uvw = cloneChild(uvw);
+    bitmap = cloneChild(bitmap);
 }
 
-bool BitmapTexture::isEqual(const TexturePtr& other) const {
-    const BitmapTexture* o = sameClass(*this, other);
-    return o && childrenEqual(uvw, o->uvw) && childrenEqual(bitmap, o->bitmap) && tile == o->tile;
+bool BitmapTexture::sameContent(const BitmapTexture& o) const {
+    return childrenEqual(uvw, o.uvw) && childrenEqual(bitmap, o.bitmap) && tile == o.tile;
 }
 
 void BitmapTexture::writeXml(AssetXmlWriter& w, std::u16string url) {

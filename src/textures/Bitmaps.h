@@ -4,47 +4,40 @@
 #include <cstdint>
 #include <string>
 
+#include "persistence/FamilyOf.h"
 #include "textures/BaseBitmap.h"
 #include "textures/BaseTexture.h"
 #include "textures/BaseUVW.h"
 
 namespace OrvaneLumoCore {
 
-class BitmapBuffer : public BaseBitmap {
+class BitmapBuffer : public FlatFamilyOf<BitmapBuffer, 0, BaseBitmap> {
 public:
-    static const std::uint32_t kType = 0;
-    BitmapBuffer() { reset(); }
+    static constexpr int kRecordVersion = 1;
+    static RowSpan<RecordRow<BitmapBuffer>> record();  // `file` ignores case
 
-    bool save(QuickArchive& ar) const override;
-    bool load(QuickArchive& ar) override;
-    void reset() override;
-    std::uint32_t getType() const override { return kType; }
-    BitmapPtr clone() const override;
-    bool isEqual(const BitmapPtr& other) const override;  // `file` ignores case
     void writeXml(AssetXmlWriter& writer, std::u16string url) override;
     std::u16string getPluginName() const override { return u"BitmapBuffer"; }
 
     std::u16string file;
-    std::int32_t filter_type;  // index into kFilterLabels
-    float filter_blur;
-    float gamma;
+    std::int32_t filter_type = 1;  // index into kFilterLabels
+    float filter_blur = 0.15f;
+    float gamma = 1.0f;
 };
 
 // Display names of the filter types, by `filter_type`; XML writes the index.
 extern const char16_t* const kFilterLabels[3];
 
-class BitmapTexture : public BaseTexture {
+class BitmapTexture : public FamilyOf<BitmapTexture, 0, BaseTexture> {
 public:
-    static const std::uint32_t kType = 0;
     BitmapTexture() { reset(); }
 
     // False, writing nothing, unless both children are set.
     bool save(QuickArchive& ar) const override;
     bool load(QuickArchive& ar) override;
     void reset() override;
-    std::uint32_t getType() const override { return kType; }
-    TexturePtr clone() const override;
-    bool isEqual(const TexturePtr& other) const override;
+    void finishClone();
+    bool sameContent(const BitmapTexture& o) const;
     void writeXml(AssetXmlWriter& writer, std::u16string url) override;
     std::u16string getPluginName() const override { return u"TexBitmap"; }
 

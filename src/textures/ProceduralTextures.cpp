@@ -8,7 +8,7 @@
 #include "persistence/Record.h"
 #include "textures/BasicTextures.h"
 #include "textures/TextureFrame.h"
-#include "xml/AssetXmlWriter.h"
+#include "xml/ParamRows.h"
 
 namespace OrvaneLumoCore {
 
@@ -242,7 +242,7 @@ bool ProceduralTexture<D, Tag>::save(QuickArchive& ar) const {
 
 template <class D, std::uint32_t Tag>
 bool ProceduralTexture<D, Tag>::load(QuickArchive& ar) {
-    reset();
+    this->reset();
     const ProceduralLayout<D>& l = layoutOf<D>();
     const int v = readVersion(ar, 1, l.newest);
     if (v < 0) return false;
@@ -261,33 +261,24 @@ bool ProceduralTexture<D, Tag>::load(QuickArchive& ar) {
 }
 
 template <class D, std::uint32_t Tag>
-void ProceduralTexture<D, Tag>::reset() {
-    self() = D();
-}
-
-template <class D, std::uint32_t Tag>
-TexturePtr ProceduralTexture<D, Tag>::clone() const {
-    boost::shared_ptr<D> copy = boost::make_shared<D>(self());
+void ProceduralTexture<D, Tag>::finishClone() {
     for (const TextureSlot<D>& s : layoutOf<D>().slots) {
         if (s.generator)
-            (*copy).*s.generator = cloneChild(self().*s.generator);
+            self().*s.generator = cloneChild(self().*s.generator);
         else
-            (*copy).*s.texture = cloneChild(self().*s.texture);
+            self().*s.texture = cloneChild(self().*s.texture);
     }
-    return copy;
 }
 
 template <class D, std::uint32_t Tag>
-bool ProceduralTexture<D, Tag>::isEqual(const TexturePtr& other) const {
-    const D* o = sameClass(self(), other);
-    if (!o) return false;
+bool ProceduralTexture<D, Tag>::sameContent(const D& o) const {
     const ProceduralLayout<D>& l = layoutOf<D>();
     for (const TextureSlot<D>& s : l.slots) {
-        const bool same = s.generator ? childrenEqual(self().*s.generator, o->*s.generator)
-                                      : childrenEqual(self().*s.texture, o->*s.texture);
+        const bool same = s.generator ? childrenEqual(self().*s.generator, o.*s.generator)
+                                      : childrenEqual(self().*s.texture, o.*s.texture);
         if (!same) return false;
     }
-    return fieldsEqual(self(), *o, l.record);
+    return fieldsEqual(self(), o, l.record);
 }
 
 template <class D, std::uint32_t Tag>

@@ -13,6 +13,7 @@
 #include <cstdint>
 #include <string>
 
+#include "persistence/FamilyOf.h"
 #include "persistence/FieldRows.h"
 #include "persistence/Types.h"
 #include "textures/BaseTexture.h"
@@ -21,18 +22,13 @@
 namespace OrvaneLumoCore {
 
 template <class Derived, std::uint32_t Tag>
-class ProceduralTexture : public BaseTexture {
+class ProceduralTexture : public FamilyOf<Derived, Tag, BaseTexture> {
 public:
-    static constexpr std::uint32_t kType = Tag;
-
     bool save(QuickArchive& ar) const override;
     bool load(QuickArchive& ar) override;
-    // Back to the member initialisers of Derived.
-    void reset() override;
-    std::uint32_t getType() const override { return Tag; }
-    TexturePtr clone() const override;
-    bool isEqual(const TexturePtr& other) const override;
     void writeXml(AssetXmlWriter& writer, std::u16string url) override;
+    void finishClone();
+    bool sameContent(const Derived& o) const;
 
 private:
     const Derived& self() const { return static_cast<const Derived&>(*this); }

@@ -80,17 +80,14 @@ bool SkyTexture::load(QuickArchive& ar) {
     return true;
 }
 
-TexturePtr SkyTexture::clone() const {
-    boost::shared_ptr<SkyTexture> copy = boost::make_shared<SkyTexture>(*this);
-    copy->sun = cloneChild(sun);
-    copy->skyId = platform::newUuidString();
-    return copy;
+void SkyTexture::finishClone() {
+    sun = cloneChild(sun);
+    skyId = platform::newUuidString();
 }
 
-bool SkyTexture::isEqual(const TexturePtr& other) const {
-    const SkyTexture* o = sameClass(*this, other);
-    return o && platform::iequals(skyId, o->skyId) && childrenEqual(sun, o->sun) &&
-           transform == o->transform && sunSettingsEqual(*this, *o) && skyFlag == o->skyFlag;
+bool SkyTexture::sameContent(const SkyTexture& o) const {
+    return platform::iequals(skyId, o.skyId) && childrenEqual(sun, o.sun) &&
+           transform == o.transform && sunSettingsEqual(*this, o) && skyFlag == o.skyFlag;
 }
 
 void SkyTexture::writeXml(AssetXmlWriter& w, std::u16string url) {

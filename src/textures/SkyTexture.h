@@ -7,14 +7,13 @@
 
 #include "animation/Animated.h"
 #include "lights/SunIesDome.h"
+#include "persistence/FamilyOf.h"
 #include "textures/BaseTexture.h"
 
 namespace OrvaneLumoCore {
 
-class SkyTexture : public BaseTexture, public SunSettings {
+class SkyTexture : public FamilyOf<SkyTexture, 12, BaseTexture>, public SunSettings {
 public:
-    static constexpr std::uint32_t kType = 12;
-
     // Defaults: the document sun and a new UUID string as skyId.
     SkyTexture();
 
@@ -23,12 +22,11 @@ public:
     // sun in place, for every sky of the process.
     bool load(QuickArchive& ar) override;
     void reset() override;
-    std::uint32_t getType() const override { return kType; }
-    // A copy with a clone of the sun (which has an id of its own) and a new
+    // A copy gets a clone of the sun (which has an id of its own) and a new
     // skyId: never equal to its source.
-    TexturePtr clone() const override;
+    void finishClone();
     // skyId compares without regard to case.
-    bool isEqual(const TexturePtr& other) const override;
+    bool sameContent(const SkyTexture& o) const;
     // The Asset with the one parameter "sun". No Asset of the sun itself is
     // written: the reference names one the consumer already knows.
     void writeXml(AssetXmlWriter& writer, std::u16string url) override;

@@ -2,6 +2,8 @@
 
 #include <cassert>
 
+#include "xml/AssetScope.h"
+
 namespace OrvaneLumoCore {
 
 TextureFrame::TextureFrame(AssetXmlWriter& writer, const OrvaneXMLSerializable& self,
@@ -25,9 +27,7 @@ void TextureFrame::open() {
     assert(state_ == State::Slots);
     state_ = State::Open;
     const std::u16string assetType = self_.getAssetType();
-    writer_.openAsset(ownUrl_, assetType, u"");
-    writer_.openPlugin(self_.getPluginName(), assetType);
-    writer_.openParameters();
+    openPluginAsset(writer_, ownUrl_, assetType, self_.getPluginName(), u"");
 }
 
 void TextureFrame::writeRef(const WriterText& name, const SlotRef& slot) {
@@ -38,9 +38,7 @@ void TextureFrame::writeRef(const WriterText& name, const SlotRef& slot) {
 void TextureFrame::close() {
     assert(state_ == State::Open);
     state_ = State::Closed;
-    writer_.closeParameters();
-    writer_.closePlugin();
-    writer_.closeAsset();
+    closePluginAsset(writer_);
 }
 
 }  // namespace OrvaneLumoCore

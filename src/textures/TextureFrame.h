@@ -43,8 +43,9 @@
 //
 // The records of children use the member helpers of persistence/Record.h
 // (loadRequiredMember / loadOptionalMember with createTexture, createUVW or
-// createBitmap, and their save twins); clone uses cloneChild, and isEqual
-// starts with sameClass below, then childrenEqual for each slot.
+// createBitmap, and their save twins); the family base (persistence/FamilyOf.h)
+// gives clone and isEqual, and a class's finishClone and sameContent use
+// cloneChild and childrenEqual for each slot.
 #include <string>
 #include <type_traits>
 
@@ -118,17 +119,5 @@ private:
     std::u16string ownUrl_;
     State state_ = State::Slots;
 };
-
-}  // namespace OrvaneLumoCore
-
-namespace OrvaneLumoCore {
-
-// `other` as an object of the class of `self` for isEqual: null when `other`
-// is null or has another type tag.
-template <class T, class Root>
-const T* sameClass(const T& self, const boost::shared_ptr<Root>& other) {
-    if (!other || other->getType() != self.getType()) return nullptr;
-    return dynamic_cast<const T*>(other.get());
-}
 
 }  // namespace OrvaneLumoCore

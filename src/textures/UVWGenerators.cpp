@@ -111,13 +111,10 @@ void GenChannelUVW::syncTransforms() {
     texTransform = composeTransform(texComponents);
 }
 
-UVWPtr GenChannelUVW::clone() const { return UVWPtr(new GenChannelUVW(*this)); }
-
-bool GenChannelUVW::isEqual(const UVWPtr& other) const {
-    const GenChannelUVW* o = sameClass(*this, other);
-    return o && uvwTransform == o->uvwTransform && texTransform == o->texTransform &&
-           uvwComponents == o->uvwComponents && texComponents == o->texComponents &&
-           wrap_u == o->wrap_u && wrap_v == o->wrap_v && uvw_channel == o->uvw_channel;
+bool GenChannelUVW::sameContent(const GenChannelUVW& o) const {
+    return uvwTransform == o.uvwTransform && texTransform == o.texTransform &&
+           uvwComponents == o.uvwComponents && texComponents == o.texComponents &&
+           wrap_u == o.wrap_u && wrap_v == o.wrap_v && uvw_channel == o.uvw_channel;
 }
 
 void GenChannelUVW::writeXml(AssetXmlWriter& w, std::u16string url) {
@@ -172,12 +169,9 @@ bool GenEnvironmentUVW::load(QuickArchive& ar) {
 
 void GenEnvironmentUVW::syncTransforms() { uvw_matrix = composeMatrix(uvwComponents); }
 
-UVWPtr GenEnvironmentUVW::clone() const { return UVWPtr(new GenEnvironmentUVW(*this)); }
-
-bool GenEnvironmentUVW::isEqual(const UVWPtr& other) const {
-    const GenEnvironmentUVW* o = sameClass(*this, other);
-    return o && mapping_type == o->mapping_type && uvw_matrix == o->uvw_matrix &&
-           uvwComponents == o->uvwComponents;
+bool GenEnvironmentUVW::sameContent(const GenEnvironmentUVW& o) const {
+    return mapping_type == o.mapping_type && uvw_matrix == o.uvw_matrix &&
+           uvwComponents == o.uvwComponents;
 }
 
 void GenEnvironmentUVW::writeXml(AssetXmlWriter& w, std::u16string url) {
@@ -211,9 +205,8 @@ bool GenPlacementUVW::load(QuickArchive& ar) {
 
 void GenPlacementUVW::syncTransforms() { uvwTransform = composeTransform(uvwComponents); }
 
-bool GenPlacementUVW::isEqual(const UVWPtr& other) const {
-    const GenPlacementUVW* o = sameClass(*this, other);
-    return o && uvwTransform == o->uvwTransform && uvwComponents == o->uvwComponents;
+bool GenPlacementUVW::sameContent(const GenPlacementUVW& o) const {
+    return uvwTransform == o.uvwTransform && uvwComponents == o.uvwComponents;
 }
 
 void GenPlacementUVW::writeXml(AssetXmlWriter& w, std::u16string url) {
@@ -240,15 +233,12 @@ bool UVWTexture::load(QuickArchive& ar) {
     return loadRequiredMember(ar, uvw, createUVW);
 }
 
-TexturePtr UVWTexture::clone() const {
-    boost::shared_ptr<UVWTexture> copy(new UVWTexture(*this));
-    copy->uvw = cloneChild(uvw);
-    return copy;
+void UVWTexture::finishClone() {
+    uvw = cloneChild(uvw);
 }
 
-bool UVWTexture::isEqual(const TexturePtr& other) const {
-    const UVWTexture* o = sameClass(*this, other);
-    return o && childrenEqual(uvw, o->uvw);
+bool UVWTexture::sameContent(const UVWTexture& o) const {
+    return childrenEqual(uvw, o.uvw);
 }
 
 void UVWTexture::writeXml(AssetXmlWriter& w, std::u16string url) {

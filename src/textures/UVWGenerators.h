@@ -9,6 +9,7 @@
 
 #include "animation/TransformComponents.h"
 #include "persistence/Types.h"
+#include "persistence/FamilyOf.h"
 #include "textures/BaseTexture.h"
 #include "textures/BaseUVW.h"
 
@@ -26,18 +27,15 @@ Matrix composeMatrix(const TransformComponents& c);
 Transform composeTransform(const TransformComponents& c);
 
 // Channel mapping: a transform of the uvw channel and one of the texture.
-class GenChannelUVW : public BaseUVW {
+class GenChannelUVW : public FamilyOf<GenChannelUVW, 4, BaseUVW> {
 public:
-    static const std::uint32_t kType = 4;
     GenChannelUVW() { reset(); }
 
     bool save(QuickArchive& ar) const override;
     bool load(QuickArchive& ar) override;
     void reset() override;
-    std::uint32_t getType() const override { return kType; }
     void syncTransforms() override;
-    UVWPtr clone() const override;
-    bool isEqual(const UVWPtr& other) const override;
+    bool sameContent(const GenChannelUVW& o) const;
     void writeXml(AssetXmlWriter& writer, std::u16string url) override;
     std::u16string getPluginName() const override { return u"UVWGenChannel"; }
 
@@ -51,18 +49,15 @@ public:
 };
 
 // Environment mapping; `mapping_type` indexes kMappingTypeLabels.
-class GenEnvironmentUVW : public BaseUVW {
+class GenEnvironmentUVW : public FamilyOf<GenEnvironmentUVW, 3, BaseUVW> {
 public:
-    static const std::uint32_t kType = 3;
     GenEnvironmentUVW() { reset(); }
 
     bool save(QuickArchive& ar) const override;
     bool load(QuickArchive& ar) override;
     void reset() override;
-    std::uint32_t getType() const override { return kType; }
     void syncTransforms() override;
-    UVWPtr clone() const override;
-    bool isEqual(const UVWPtr& other) const override;
+    bool sameContent(const GenEnvironmentUVW& o) const;
     void writeXml(AssetXmlWriter& writer, std::u16string url) override;
     std::u16string getPluginName() const override { return u"UVWGenEnvironment"; }
 
@@ -85,7 +80,7 @@ public:
     bool load(QuickArchive& ar) override;
     void reset() override;
     void syncTransforms() override;
-    bool isEqual(const UVWPtr& other) const override;
+    bool sameContent(const GenPlacementUVW& o) const;
     void writeXml(AssetXmlWriter& writer, std::u16string url) override;
 
     Transform uvwTransform;
@@ -95,36 +90,28 @@ protected:
     GenPlacementUVW() = default;
 };
 
-class GenPlanarWorldUVW : public GenPlacementUVW {
+class GenPlanarWorldUVW : public FamilyOf<GenPlanarWorldUVW, 0, GenPlacementUVW> {
 public:
-    static const std::uint32_t kType = 0;
-    GenPlanarWorldUVW() { reset(); }
-    std::uint32_t getType() const override { return kType; }
-    UVWPtr clone() const override { return UVWPtr(new GenPlanarWorldUVW(*this)); }
+    GenPlanarWorldUVW() { GenPlacementUVW::reset(); }
     std::u16string getPluginName() const override { return u"UVWGenPlanarWorld"; }
 };
 
-class GenObjectUVW : public GenPlacementUVW {
+class GenObjectUVW : public FamilyOf<GenObjectUVW, 1, GenPlacementUVW> {
 public:
-    static const std::uint32_t kType = 1;
-    GenObjectUVW() { reset(); }
-    std::uint32_t getType() const override { return kType; }
-    UVWPtr clone() const override { return UVWPtr(new GenObjectUVW(*this)); }
+    GenObjectUVW() { GenPlacementUVW::reset(); }
     std::u16string getPluginName() const override { return u"UVWGenObject"; }
 };
 
 // A texture that only shows its generator.
-class UVWTexture : public BaseTexture {
+class UVWTexture : public FamilyOf<UVWTexture, 2, BaseTexture> {
 public:
-    static const std::uint32_t kType = 2;
     UVWTexture() { reset(); }
 
     bool save(QuickArchive& ar) const override;  // false, writing nothing, without `uvw`
     bool load(QuickArchive& ar) override;
     void reset() override;
-    std::uint32_t getType() const override { return kType; }
-    TexturePtr clone() const override;
-    bool isEqual(const TexturePtr& other) const override;
+    void finishClone();
+    bool sameContent(const UVWTexture& o) const;
     void writeXml(AssetXmlWriter& writer, std::u16string url) override;
     std::u16string getPluginName() const override { return u"TexUVW"; }
 

@@ -3,13 +3,14 @@
 
 #include <cmath>
 
-#include "RecordBytes.h"
+#include "support/Golden.h"
+#include "support/RecordBytes.h"
 #include "animation/Camera.h"
 #include "animation/TransformComponents.h"
 #include "xml/AssetXmlWriter.h"
 
 using namespace OrvaneLumoCore;
-using namespace animtest;
+using namespace testsupport;
 
 namespace {
 

@@ -2,9 +2,10 @@
 // the sun's registry per writer, copies and comparisons.
 #include <gtest/gtest.h>
 
-#include "LightFixtures.h"
 #include "lights/LocalLights.h"
 #include "lights/SunIesDome.h"
+#include "support/Golden.h"
+#include "support/LightFixtures.h"
 
 using namespace OrvaneLumoCore;
 using namespace lighttest;
@@ -13,7 +14,7 @@ namespace {
 
 struct Newest {
     std::int32_t tag;
-    Bytes bytes;
+    RecordBytes bytes;
     const char* golden;
 };
 
@@ -26,7 +27,7 @@ const std::vector<Newest>& newest() {
 }
 
 // `bytes` without their last `drop` bytes, under `version`.
-Bytes cut(Bytes bytes, std::size_t drop, int version) {
+RecordBytes cut(RecordBytes bytes, std::size_t drop, int version) {
     bytes.data.resize(bytes.data.size() - drop);
     return bytes.with(0, std::uint32_t(version) << 16);
 }
@@ -36,7 +37,7 @@ Bytes cut(Bytes bytes, std::size_t drop, int version) {
 TEST(LightXml, GoldenAssets) {
     for (const Newest& n : newest()) {
         SCOPED_TRACE(n.golden);
-        LightPtr light = loaded<BaseLight>(n.bytes, createLight(n.tag));
+        LightPtr light = loadedInto(createLight(n.tag), n.bytes);
         // A sun under an empty url stands at "/" and its id.
         EXPECT_EQ(golden(std::string("lights/golden/") + n.golden), xmlOf(*light, n.tag == 5 ? u"" : u"/Scene", true));
     }
@@ -104,34 +105,34 @@ TEST(LightFactory, TagsWithoutAClassGiveNull) {
 TEST(LightRecords, NewestVersionsGoBackByteForByte) {
     for (const Newest& n : newest()) {
         SCOPED_TRACE(n.tag);
-        LightPtr light = loaded<BaseLight>(n.bytes, createLight(n.tag));
+        LightPtr light = loadedInto(createLight(n.tag), n.bytes);
         EXPECT_EQ(savedBytes(*light), n.bytes.data);
         EXPECT_TRUE(light->isEqual(light->clone()) || n.tag == 5);  // a sun's clone has a new id
         EXPECT_FALSE(light->isEqual(createLight(n.tag)) || light->isEqual(LightPtr()));
     }
     for (std::int32_t tag : {0, 2, 3, 4, 5, 6, 7}) {
         LightPtr light = createLight(tag);
-        EXPECT_TRUE(light->isEqual(loaded<BaseLight>(Bytes{savedBytes(*light)}, createLight(tag)))) << tag;
+        EXPECT_TRUE(light->isEqual(loadedInto(createLight(tag), RecordBytes{savedBytes(*light)}))) << tag;
     }
     DomeLight dome;
     EXPECT_EQ(savedBytes(dome), (std::vector<std::uint8_t>{0, 0, 1, 0}));
-    EXPECT_TRUE(loads(dome, Bytes().version(1), true));
+    EXPECT_TRUE(loads(dome, RecordBytes().version(1), true));
     EXPECT_TRUE(dome.isEqual(dome.clone()));
     EXPECT_FALSE(dome.isEqual(createLight(7)));
 }
 
 TEST(LightRecords, RefusedRecords) {
     std::vector<Newest> records = newest();
-    records.push_back({7, Bytes{savedBytes(SphereLight())}, ""});
+    records.push_back({7, RecordBytes{savedBytes(SphereLight())}, ""});
     for (const Newest& n : records) {
         const std::uint32_t tag = std::uint32_t(n.bytes.data[2]) << 16;
         for (std::uint32_t bad : {0u, tag | 1, tag + 0x10000})
             EXPECT_FALSE(loads(*createLight(n.tag), n.bytes.with(0, bad))) << n.tag << " " << bad;
         auto make = [&] { return createLight(n.tag); };
-        expectDamageHandled(loaded<BaseLight>(n.bytes, make()), n.bytes, make);
+        expectDamageHandled(loadedInto(make(), n.bytes), n.bytes, make);
     }
     DomeLight dome;
-    EXPECT_FALSE(loads(dome, Bytes()));
+    EXPECT_FALSE(loads(dome, RecordBytes()));
     // Transform records that don't load: a direct light's whose tag is of a
     // version 2, one that announces more keys than the archive holds, and a
     // sun's of version 2.
@@ -148,57 +149,57 @@ TEST(LightRecords, OldVersionsSaveAsTheNewest) {
     // SpotLight 1: color, shadowBias, decay, intensity, storedFactor,
     // photonSubdivs, causticSubdivs, storedMode, enabled. 2: then shadows,
     // shadowSubdivs, shadowRadius, transform, coneAngle, penumbraAngle.
-    const Bytes spot = Bytes().floats({0.5f, 0.5f, 0.25f, 0.1f, 2, 7, 0.5f}).ints({11, 12, 1}).u8(0);
-    const Bytes spot4 = Bytes().version(4).floats({0.5f, 0.5f, 0.25f, 0, 0, 0, 0.005f, 20, 20, 20, 20})
+    const RecordBytes spot = RecordBytes().floats({0.5f, 0.5f, 0.25f, 0.1f, 2, 7, 0.5f}).ints({11, 12, 1}).u8(0);
+    const RecordBytes spot4 = RecordBytes().version(4).floats({0.5f, 0.5f, 0.25f, 0, 0, 0, 0.005f, 20, 20, 20, 20})
                             .floats({0.1f, 2, 7, 0.5f}).ints({0, 11, 12, 1}).flags({0, 0});
     // RectangleLight 2: color, shadowBias, intensity, storedFactor, subdivs,
     // causticSubdivs, photonSubdivs, storedMode, doubleSided, invisible,
     // lightPortal, noDecay, enabled, storeWithIrradianceMap,
     // ignoreLightNormals, shadows, transform, u_size, v_size. 1: up to
     // ignoreLightNormals.
-    const Bytes rect = Bytes().floats({0.5f, 0.5f, 0.5f, 0.01f, 40, 1.5f}).ints({6, 1001, 501, 2});
-    const Bytes rect4 =
-        Bytes().version(4).floats({0.5f, 0.5f, 0.5f, 0, 0, 0, 0.005f, 0.01f, 40, 1.5f}).ints({0, 6, 1001, 501, 2});
+    const RecordBytes rect = RecordBytes().floats({0.5f, 0.5f, 0.5f, 0.01f, 40, 1.5f}).ints({6, 1001, 501, 2});
+    const RecordBytes rect4 =
+        RecordBytes().version(4).floats({0.5f, 0.5f, 0.5f, 0, 0, 0, 0.005f, 0.01f, 40, 1.5f}).ints({0, 6, 1001, 501, 2});
     // MayaDirectLight 1: color, shadowBias, intensity, storedFactor,
     // causticSubdivs, photonSubdivs, storedMode, enabled. 2: then shadows,
     // shadowSubdivs, shadowRadius and a plain transform, which becomes the key
     // at time 0. 3: the same with the AnimatedTransform record.
-    const Bytes direct = Bytes().floats({0.5f, 0.25f, 1, 0.1f, 4, 2}).ints({30, 40, 1}).u8(1);
-    const Bytes direct4 = Bytes().version(4).floats({0.5f, 0.25f, 1, 0, 0, 0, 0.1f, 4, 2}).ints({30, 40, 1}).u8(1);
+    const RecordBytes direct = RecordBytes().floats({0.5f, 0.25f, 1, 0.1f, 4, 2}).ints({30, 40, 1}).u8(1);
+    const RecordBytes direct4 = RecordBytes().version(4).floats({0.5f, 0.25f, 1, 0, 0, 0, 0.1f, 4, 2}).ints({30, 40, 1}).u8(1);
     // SunLight 1: transform, up_vector, the eight reals, three ints, shadows.
     // 2: then id and name. 3: then enabled and invisible.
-    const Bytes sunSet = Bytes().floats({1, 0, 0, 0.5f, 5, 3, 2, 1.5f, 10, 20, 0.25f}).ints({1, 2, 3});
-    const Bytes sun = Bytes(sunSet).u8(1).wstr("abc").wstr("Evening");
+    const RecordBytes sunSet = RecordBytes().floats({1, 0, 0, 0.5f, 5, 3, 2, 1.5f, 10, 20, 0.25f}).ints({1, 2, 3});
+    const RecordBytes sun = RecordBytes(sunSet).u8(1).wstr("abc").wstr("Evening");
     // SphereLight 1: transform, color, shadowColor, four reals, four ints,
     // five flags; 2 holds all eight.
-    const Bytes sphere =
-        Bytes().transform(ct2).floats({0.5f, 0.5f, 0.5f, 0.1f, 0.1f, 0.1f, 1, 2, 3, 4}).ints({5, 6, 7, 8});
-    const struct { std::int32_t tag; Bytes old, saved; } cases[] = {
-        {4, Bytes().version(1).append(spot),
-         Bytes(spot4).flags({1}).i32(8).f32(0).transform(Transform()).floats({1, 0}).flags({1, 1})},
-        {4, Bytes().version(2).append(spot).u8(0).i32(4).f32(0.25f).transform(ct3).floats({0.5f, 0.1f}),
-         Bytes(spot4).flags({0}).i32(4).f32(0.25f).transform(ct3).floats({0.5f, 0.1f}).flags({1, 1})},
-        {3, Bytes().version(1).append(rect).flags({0, 1, 0, 1, 0, 0, 1}),
-         Bytes(rect4).flags({0, 1, 0, 1, 0, 0, 1, 1}).transform(Transform()).floats({1, 1}).flags({1, 1, 1})},
-        {3, Bytes().version(2).append(rect).flags({1, 0, 1, 0, 1, 1, 0, 0}).transform(ct1).floats({4, 5}),
-         Bytes(rect4).flags({1, 0, 1, 0, 1, 1, 0, 0}).transform(ct1).floats({4, 5}).flags({1, 1, 1})},
+    const RecordBytes sphere =
+        RecordBytes().transform(ct2).floats({0.5f, 0.5f, 0.5f, 0.1f, 0.1f, 0.1f, 1, 2, 3, 4}).ints({5, 6, 7, 8});
+    const struct { std::int32_t tag; RecordBytes old, saved; } cases[] = {
+        {4, RecordBytes().version(1).append(spot),
+         RecordBytes(spot4).flags({1}).i32(8).f32(0).transform(Transform()).floats({1, 0}).flags({1, 1})},
+        {4, RecordBytes().version(2).append(spot).u8(0).i32(4).f32(0.25f).transform(ct3).floats({0.5f, 0.1f}),
+         RecordBytes(spot4).flags({0}).i32(4).f32(0.25f).transform(ct3).floats({0.5f, 0.1f}).flags({1, 1})},
+        {3, RecordBytes().version(1).append(rect).flags({0, 1, 0, 1, 0, 0, 1}),
+         RecordBytes(rect4).flags({0, 1, 0, 1, 0, 0, 1, 1}).transform(Transform()).floats({1, 1}).flags({1, 1, 1})},
+        {3, RecordBytes().version(2).append(rect).flags({1, 0, 1, 0, 1, 1, 0, 0}).transform(ct1).floats({4, 5}),
+         RecordBytes(rect4).flags({1, 0, 1, 0, 1, 1, 0, 0}).transform(ct1).floats({4, 5}).flags({1, 1, 1})},
         // OmniLight 3: version 4 without affectDiffuse and affectSpecular.
         {2, cut(omniV4(), 2, 3), cut(omniV4(), 2, 4).flags({1, 1})},
-        {0, Bytes().version(1).append(direct), Bytes(direct4).u8(1).i32(8).f32(0).animated({{0, Transform()}})},
-        {0, Bytes().version(2).append(direct).u8(0).i32(3).f32(0.5f).transform(ct4),
-         Bytes(direct4).u8(0).i32(3).f32(0.5f).animated({{0, ct4}})},
-        {0, Bytes().version(3).append(direct).u8(1).i32(3).f32(0.5f).animated({{1, ct4}, {2, countingTransform(8)}}),
-         Bytes(direct4).u8(1).i32(3).f32(0.5f).animated({{1, ct4}, {2, countingTransform(8)}})},
-        {5, Bytes().version(2).transform(ct5).append(sun),
-         Bytes().version(4).append(sun).flags({1, 0}).animated({{0, ct5}})},
-        {5, Bytes().version(3).transform(ct5).append(sun).flags({0, 1}),
-         Bytes().version(4).append(sun).flags({0, 1}).animated({{0, ct5}})},
+        {0, RecordBytes().version(1).append(direct), RecordBytes(direct4).u8(1).i32(8).f32(0).animated({{0, Transform()}})},
+        {0, RecordBytes().version(2).append(direct).u8(0).i32(3).f32(0.5f).transform(ct4),
+         RecordBytes(direct4).u8(0).i32(3).f32(0.5f).animated({{0, ct4}})},
+        {0, RecordBytes().version(3).append(direct).u8(1).i32(3).f32(0.5f).animated({{1, ct4}, {2, countingTransform(8)}}),
+         RecordBytes(direct4).u8(1).i32(3).f32(0.5f).animated({{1, ct4}, {2, countingTransform(8)}})},
+        {5, RecordBytes().version(2).transform(ct5).append(sun),
+         RecordBytes().version(4).append(sun).flags({1, 0}).animated({{0, ct5}})},
+        {5, RecordBytes().version(3).transform(ct5).append(sun).flags({0, 1}),
+         RecordBytes().version(4).append(sun).flags({0, 1}).animated({{0, ct5}})},
         // IESLight 1: version 3 without affectDiffuse, affectSpecular and
         // intensity; 2: without intensity.
         {6, cut(iesV3(), 6, 1), cut(iesV3(), 6, 3).flags({1, 1}).f32(1)},
         {6, cut(iesV3(), 4, 2), cut(iesV3(), 4, 3).f32(1)},
-        {7, Bytes().version(1).append(sphere).flags({0, 0, 1, 1, 1}),
-         Bytes().version(2).append(sphere).flags({0, 0, 1, 1, 1, 1, 1, 1})},
+        {7, RecordBytes().version(1).append(sphere).flags({0, 0, 1, 1, 1}),
+         RecordBytes().version(2).append(sphere).flags({0, 0, 1, 1, 1, 1, 1, 1})},
     };
     for (const auto& c : cases) {
         SCOPED_TRACE(c.tag);
@@ -209,9 +210,9 @@ TEST(LightRecords, OldVersionsSaveAsTheNewest) {
         EXPECT_EQ(savedBytes(*light), c.saved.data);
     }
     // A version 1 sun keeps the fresh id of reset and an empty name.
-    boost::shared_ptr<SunLight> s1 = loaded<SunLight>(Bytes().version(1).transform(ct5).append(sunSet).u8(0));
+    boost::shared_ptr<SunLight> s1 = loaded<SunLight>(RecordBytes().version(1).transform(ct5).append(sunSet).u8(0));
     EXPECT_EQ(s1->id.size(), 36u);
-    EXPECT_EQ(savedBytes(*s1), Bytes().version(4).append(sunSet).u8(0).wstr(wideToUtf8(s1->id)).wstr("").flags({1, 0})
+    EXPECT_EQ(savedBytes(*s1), RecordBytes().version(4).append(sunSet).u8(0).wstr(wideToUtf8(s1->id)).wstr("").flags({1, 0})
                                    .animated({{0, ct5}}).data);
 }
 

@@ -45,69 +45,69 @@ const std::vector<Record>& layerRecords() {
         {kGlassBrdf, glassHead(1), false},
         // Glass 2: rows 1 to 3; transparency_tex_mult, glossiness_tex_mult, ior_tex_mult; paths of transparency_tex,
         // glossiness_tex, ior_tex (empty: no texture).
-        {kGlassBrdf, glassHead(2).f32(0.11f).f32(0.22f).f32(0.33f).str("t.png").str("").str("i.png"), false},
+        {kGlassBrdf, glassHead(2).f32(0.11f).f32(0.22f).f32(0.33f).wstr("t.png").wstr("").wstr("i.png"), false},
         // Glass 3: as 2; rows 5 to 7; path of translucency_tex.
-        {kGlassBrdf, translucency(glassHead(3).f32(0.11f).f32(0.22f).f32(0.33f).str("").str("g.png").str(""))
-                         .str("tl.png"), false},
+        {kGlassBrdf, translucency(glassHead(3).f32(0.11f).f32(0.22f).f32(0.33f).wstr("").wstr("g.png").wstr(""))
+                         .wstr("tl.png"), false},
         // Glass 4: the three multipliers of 2; rows 5 to 7; members transparency_tex, glossiness_tex, ior_tex,
         // translucency_tex.
-        {kGlassBrdf, translucency(glassHead(4).f32(0.11f).f32(0.22f).f32(0.33f)).acolor(0.1f).b8(false).acolor(0.3f)
-                         .acolor(0.4f), false},
+        {kGlassBrdf, translucency(glassHead(4).f32(0.11f).f32(0.22f).f32(0.33f)).acolorMember(0.1f).b8(false).acolorMember(0.3f)
+                         .acolorMember(0.4f), false},
         // Glass 5: rows 1 to 3; color_tex_mult, glossiness_tex_mult, ior_tex_mult; rows 5 to 7; members color_tex,
         // glossiness_tex, ior_tex, translucency_tex; transparency; transparency_tex_mult; member transparency_tex.
-        {kGlassBrdf, translucency(glassHead(5).f32(0.55f).f32(0.22f).f32(0.33f)).acolor(0.5f).b8(false).b8(false).acolor(0.4f)
-                         .color(0.3f, 0.2f, 0.1f).f32(0.66f).acolor(0.6f), false},
+        {kGlassBrdf, translucency(glassHead(5).f32(0.55f).f32(0.22f).f32(0.33f)).acolorMember(0.5f).b8(false).b8(false).acolorMember(0.4f)
+                         .color(0.3f, 0.2f, 0.1f).f32(0.66f).acolorMember(0.6f), false},
         // Glass 6 (current): as 5, then the base record version 4 (name, three flags).
-        {kGlassBrdf, translucency(glassHead(6).f32(0.55f).f32(0.22f).f32(0.33f)).acolor(0.5f).b8(false).b8(false).b8(false)
-                         .color(0.3f, 0.2f, 0.1f).f32(0.66f).b8(false).version(4).str("Clear").b8(false).b8(true).b8(true), true},
+        {kGlassBrdf, translucency(glassHead(6).f32(0.55f).f32(0.22f).f32(0.33f)).acolorMember(0.5f).b8(false).b8(false).b8(false)
+                         .color(0.3f, 0.2f, 0.1f).f32(0.66f).b8(false).version(4).wstr("Clear").b8(false).b8(true).b8(true), true},
         // Glossy 1: H, then the Fresnel rule (on, off: the default Fresnel texture is gone).
         {kPhongBrdf, glossyHead(1, 1.8f, 1), false},
         {kPhongBrdf, glossyHead(1, 1.8f, 0), false},
         // Glossy 2: H; color_tex_mult, hilightGlossiness_tex_mult, reflectionGlossiness_tex_mult; paths of color_tex,
         // hilightGlossiness_tex, reflectionGlossiness_tex; Fresnel rule (on: any switch but 0).
-        {kPhongBrdf, glossyHead(2, 2.0f, -1).f32(0.1f).f32(0.2f).f32(0.3f).str("c.png").str("h.png").str(""), false},
+        {kPhongBrdf, glossyHead(2, 2.0f, -1).f32(0.1f).f32(0.2f).f32(0.3f).wstr("c.png").wstr("h.png").wstr(""), false},
         // Glossy 3: as 2; anisotropy, anisotropy_rotation; Fresnel rule.
-        {kPhongBrdf, glossyHead(3, 2.0f, 0).f32(0.1f).f32(0.2f).f32(0.3f).str("").str("").str("r.png").f32(0.75f).f32(45), false},
+        {kPhongBrdf, glossyHead(3, 2.0f, 0).f32(0.1f).f32(0.2f).f32(0.3f).wstr("").wstr("").wstr("r.png").f32(0.75f).f32(45), false},
         // Glossy 4: H; the three multipliers; members color_tex, hilightGlossiness_tex, reflectionGlossiness_tex;
         // anisotropy, anisotropy_rotation; Fresnel rule.
-        {kPhongBrdf, glossyHead(4, 1.3f, 1).f32(0.1f).f32(0.2f).f32(0.3f).acolor(0.1f).b8(false).acolor(0.3f)
+        {kPhongBrdf, glossyHead(4, 1.3f, 1).f32(0.1f).f32(0.2f).f32(0.3f).acolorMember(0.1f).b8(false).acolorMember(0.3f)
                          .f32(0.75f).f32(45), false},
         // Glossy 5: as 4; base record (here version 2: name, layer_flag_a); Fresnel rule.
         {kPhongBrdf, glossyHead(5, 1.3f, 0).f32(0.1f).f32(0.2f).f32(0.3f).b8(false).b8(false).b8(false).f32(0.75f).f32(45)
-                         .version(2).str("Gloss").b8(false), false},
+                         .version(2).wstr("Gloss").b8(false), false},
         // Glossy 6 (current): color, reflection; hilightGlossiness, reflectionGlossiness, cutoff; subdivs, back_side,
         // depth_value; the four multipliers (transparency_tex_mult last); members color_tex, hilightGlossiness_tex,
         // reflectionGlossiness_tex, transparency_tex; anisotropy, anisotropy_rotation; base record version 4.
         {kPhongBrdf, RecordBytes().version(6).color(0.9f, 0.8f, 0.7f).color(0.6f, 0.5f, 0.4f).f32(0.3f).f32(0.35f).f32(0.02f)
-                         .i32(9).i32(1).i32(6).f32(0.1f).f32(0.2f).f32(0.3f).f32(0.4f).b8(false).acolor(0.2f).b8(false).b8(false)
-                         .f32(0.75f).f32(45).version(4).str("Gloss").b8(true).b8(false).b8(true), true},
+                         .i32(9).i32(1).i32(6).f32(0.1f).f32(0.2f).f32(0.3f).f32(0.4f).b8(false).acolorMember(0.2f).b8(false).b8(false)
+                         .f32(0.75f).f32(45).version(4).wstr("Gloss").b8(true).b8(false).b8(true), true},
         // Mirror 1: head; path of transparency_tex; Fresnel rule (on: the Fresnel texture replaces the path).
-        {kMirrorBrdf, mirrorHead(1, 1.7f, 0).str("m.png"), false},
-        {kMirrorBrdf, mirrorHead(1, 1.7f, 3).str("m.png"), false},
+        {kMirrorBrdf, mirrorHead(1, 1.7f, 0).wstr("m.png"), false},
+        {kMirrorBrdf, mirrorHead(1, 1.7f, 3).wstr("m.png"), false},
         // Mirror 2: head; path of transparency_tex; color_tex_mult; path of color_tex.
-        {kMirrorBrdf, mirrorHead(2, 1.7f, 0).str("first.png").f32(0.9f).str("second.png"), false},
+        {kMirrorBrdf, mirrorHead(2, 1.7f, 0).wstr("first.png").f32(0.9f).wstr("second.png"), false},
         // Mirror 3: head; color_tex_mult; members transparency_tex, color_tex; Fresnel rule.
-        {kMirrorBrdf, mirrorHead(3, 1.25f, 1).f32(0.9f).acolor(0.1f).acolor(0.2f), false},
+        {kMirrorBrdf, mirrorHead(3, 1.25f, 1).f32(0.9f).acolorMember(0.1f).acolorMember(0.2f), false},
         // Mirror 4: as 3; base record version 3 (name, layer_flag_a, layer_flag_b).
-        {kMirrorBrdf, mirrorHead(4, 1.25f, 0).f32(0.9f).acolor(0.1f).b8(false).version(3).str("Shiny").b8(true).b8(true), false},
+        {kMirrorBrdf, mirrorHead(4, 1.25f, 0).f32(0.9f).acolorMember(0.1f).b8(false).version(3).wstr("Shiny").b8(true).b8(true), false},
         // Mirror 5 (current): color, reflection; transparency_tex_mult, cutoff; mirror_value; color_tex_mult; members
         // transparency_tex, color_tex; base record.
         {kMirrorBrdf, RecordBytes().version(5).color(0.2f, 0.3f, 0.4f).color(0.5f, 0.6f, 0.7f).f32(0.8f).f32(0.03f).i32(4)
-                          .f32(0.9f).b8(false).acolor(0.2f).version(4).str("Shiny").b8(true).b8(false).b8(false), true},
+                          .f32(0.9f).b8(false).acolorMember(0.2f).version(4).wstr("Shiny").b8(true).b8(false).b8(false), true},
         // Diffuse 1: head; paths of color_tex, transparency_tex. 2: head; members color_tex, transparency_tex. 3: as
         // 2; base record (version 1: name only). 4 (current): as 3; use_color_tex_alpha_as_transparency.
-        {kDiffuseBrdf, diffuseHead(1).str("").str("alpha.png"), false},
-        {kDiffuseBrdf, diffuseHead(2).acolor(0.3f).b8(false), false},
-        {kDiffuseBrdf, diffuseHead(3).b8(false).acolor(0.4f).version(1).str("Matte"), false},
-        {kDiffuseBrdf, diffuseHead(4).b8(false).b8(false).version(4).str("Matte").b8(true).b8(false).b8(false).b8(true), true},
+        {kDiffuseBrdf, diffuseHead(1).wstr("").wstr("alpha.png"), false},
+        {kDiffuseBrdf, diffuseHead(2).acolorMember(0.3f).b8(false), false},
+        {kDiffuseBrdf, diffuseHead(3).b8(false).acolorMember(0.4f).version(1).wstr("Matte"), false},
+        {kDiffuseBrdf, diffuseHead(4).b8(false).b8(false).version(4).wstr("Matte").b8(true).b8(false).b8(false).b8(true), true},
         // Light 1: color; intensity, transparency_tex_mult; path of transparency_tex.
-        {kLightBrdf, RecordBytes().version(1).color(0.9f, 0.8f, 0.7f).f32(3).f32(0.5f).str("glow.png"), false},
+        {kLightBrdf, RecordBytes().version(1).color(0.9f, 0.8f, 0.7f).f32(3).f32(0.5f).wstr("glow.png"), false},
         // Light 2: head; paths of color_tex, transparency_tex. 3: head; members color_tex, transparency_tex. 4: as 3;
         // base record. 5 (current): as 4; doubleSided as i32.
-        {kLightBrdf, lightHead(2).str("c.png").str("t.png"), false},
-        {kLightBrdf, lightHead(3).b8(false).acolor(0.6f), false},
-        {kLightBrdf, lightHead(4).acolor(0.6f).b8(false).version(4).str("Lamp").b8(false).b8(false).b8(false), false},
-        {kLightBrdf, lightHead(5).b8(false).b8(false).version(4).str("Lamp").b8(true).b8(false).b8(false).i32(0), true},
+        {kLightBrdf, lightHead(2).wstr("c.png").wstr("t.png"), false},
+        {kLightBrdf, lightHead(3).b8(false).acolorMember(0.6f), false},
+        {kLightBrdf, lightHead(4).acolorMember(0.6f).b8(false).version(4).wstr("Lamp").b8(false).b8(false).b8(false), false},
+        {kLightBrdf, lightHead(5).b8(false).b8(false).version(4).wstr("Lamp").b8(true).b8(false).b8(false).i32(0), true},
     };
     return all;
 }
@@ -127,14 +127,14 @@ TEST(LayerRecords, EveryVersionLoads) {
     // Each record loaded into a new layer and written under a url that names the record and what no XML shows: the
     // golden tells where every value landed. Blinn_BRDF reads the glossy records as Phong_BRDF does.
     auto show = [](const BrdfPtr& l, const std::string& what, const RecordBytes& bytes) {
-        auto xml = [&what](const BrdfPtr& layer) { return ownXml(*layer, utf8ToWide("/" + what + " " + hidden(*layer))); };
+        auto xml = [&what](const BrdfPtr& layer) { return xmlOf(*layer, utf8ToWide("/" + what + " " + hidden(*layer))); };
         EXPECT_TRUE(l->clone()->isEqual(l));  // a clone copies every field
         const BrdfPtr blinn = createBrdf(kBlinnBrdf);
         QuickArchive again = bytes.archive();
         EXPECT_TRUE(l->getType() != kPhongBrdf || (blinn->load(again) && xml(blinn) == xml(l)));
         return xml(l);
     };
-    expectGolden("layer_records.xml", loadEach<BrdfPtr>(layerRecords(), createBrdf, show));
+    expectGolden("materials/golden/layer_records.xml", loadEach<BrdfPtr>(layerRecords(), createBrdf, show));
 
     // Glass resets only the base part before reading.
     Glass_BRDF used;
@@ -248,7 +248,7 @@ TEST(LayerRecords, BadTagsAndChildrenFail) {
     loaded<Diffuse_BRDF>(diffuseHead(3).b8(false).b8(false), false);
     loaded<Diffuse_BRDF>(diffuseHead(3).b8(false).b8(false).version(5), false);
     // The base record's name loses its control characters.
-    EXPECT_EQ(loaded<Diffuse_BRDF>(diffuseHead(3).b8(false).b8(false).version(1).str("\tLine\nFeed"))->name, u"LineFeed");
+    EXPECT_EQ(loaded<Diffuse_BRDF>(diffuseHead(3).b8(false).b8(false).version(1).wstr("\tLine\nFeed"))->name, u"LineFeed");
 }
 
 }  // namespace

@@ -72,14 +72,14 @@ std::vector<MaterialPtr> goldenLibrary() {
 
 TEST_F(Conversion, DocumentsThroughTheFileDriver) {
     const std::vector<MaterialPtr> library = goldenLibrary();
-    expectGolden("library.xml", throughAFile(library));
+    expectGolden("materials/golden/library.xml", throughAFile(library));
     // A layered material's own writeXml gives the layers and the main Asset with the same urls as the conversion,
     // from an empty url; MaterialMulti and MaterialSingleBRDF write nothing of their own.
     std::u16string converted;
     AssetXmlWriter convertedWriter(converted);
     writeLayeredAsset(convertedWriter, library[0]);
-    EXPECT_EQ(ownXml(*library[0]), wideToUtf8(converted));
-    EXPECT_EQ(ownXml(*library[1]) + ownXml(*library[3]), "");
+    EXPECT_EQ(xmlOf(*library[0]), wideToUtf8(converted));
+    EXPECT_EQ(xmlOf(*library[1]) + xmlOf(*library[3]), "");
 
     // Wall: a bump over a two-sided material over two layered materials.
     auto sheet = sided<Material2Sided>(u"Sheet", layered(u"Front", u"Face"), layered(u"Back", u"Paint"));
@@ -97,7 +97,7 @@ TEST_F(Conversion, DocumentsThroughTheFileDriver) {
     // Outer: an angle blend whose first child is another angle blend.
     auto outer = blend(u"Outer", blend(u"Inner", layered(u"Red", u"R"), layered(u"Blue", u"B")), layered(u"Green", u"G"));
     outer->start_angle = 30, outer->stop_angle = 120;
-    expectGolden("wrapped_trees.xml", throughAFile({wall, referenceTo(stone->uuid), ink, outer}, true));
+    expectGolden("materials/golden/wrapped_trees.xml", throughAFile({wall, referenceTo(stone->uuid), ink, outer}, true));
 }
 
 // Five folded wrappers over one layered material, bump outermost or innermost.
@@ -177,7 +177,7 @@ TEST_F(Conversion, TopLevelTrees) {
                                    referenceTo(u"no-such-uuid"), MaterialPtr(), wrap<MaterialBump>(MaterialPtr()),
                                    wrap<MaterialToon>(MaterialPtr())};
     for (const MaterialPtr& m : empties) xml += conversion(m);
-    expectGolden("top_level_trees.xml", xml);
+    expectGolden("materials/golden/top_level_trees.xml", xml);
 }
 
 // A tree with every wrapping class, each texture a bitmap:
@@ -236,14 +236,14 @@ TEST_F(Conversion, OwnForms) {
     // The two-sided material whole, its textures first.
     auto two = sided<Material2Sided>(u"Two", MaterialPtr(), MaterialPtr());
     two->transparency_tex = acolor(1, 0.5f, 0), two->translucency_tex_mult = 2;
-    expectGolden("own_two_sided.xml", ownXml(*two, u"/Lib"));
+    expectGolden("materials/golden/own_two_sided.xml", xmlOf(*two, u"/Lib"));
     // Every class: a parent writes its children's Assets first, below its own url, and refers to them there. The
     // environment override writes only its base, under its own url; the displaced material its base one step (the
     // name) below. The object list has an empty list type and string entries, unescaped. The toon's own form uses the
     // lower-case words.
-    expectGolden("own_forms.xml", ownXml(*everyWrapperTree(), u"/Lib"));
+    expectGolden("materials/golden/own_forms.xml", xmlOf(*everyWrapperTree(), u"/Lib"));
     // Without a base the environment override writes nothing at all.
-    EXPECT_EQ(ownXml(*wrap<MaterialOverrideEnvironment>(MaterialPtr(), u"Env"), u"/Lib"), "");
+    EXPECT_EQ(xmlOf(*wrap<MaterialOverrideEnvironment>(MaterialPtr(), u"Env"), u"/Lib"), "");
 }
 
 TEST_F(Conversion, ParentsAndBitmapFilesInTheTree) {

@@ -22,7 +22,7 @@ RecordBytes layeredRecord(int version) {
     RecordBytes b;
     b.version(version).u32(2).diffuse("Base", 0.25f).diffuse("Top", 0.75f).i32(2).i32(7);
     if (version >= 3) b.i32(8).i32(9);
-    version == 1 ? b.str("Wall\n") : b.base(version == 4 ? "Wall" : "Wall\n", "U");
+    version == 1 ? b.wstr("Wall\n") : b.base(version == 4 ? "Wall" : "Wall\n", "U");
     return version >= 4 ? b.i32(10) : b;
 }
 
@@ -31,8 +31,8 @@ RecordBytes layeredRecord(int version) {
 // lineUnits; doSecondary, divideByDist; base record. 2 adds doSilhouetteMult, silhouetteMult.
 RecordBytes toonRecord(int version) {
     RecordBytes b;
-    b.version(version).multiMember("Base").f32(2).f32(3).acolor(0.1f).f32(0.5f).f32(4).b8(false).f32(0.25f).f32(5).acolor(0.3f);
-    b.color(0.2f, 0.4f, 0.6f).f32(6).acolor(0.4f).f32(0.9f).f32(0.01f).f32(0.6f).f32(2.5f).b8(false).b8(true).base("Ink");
+    b.version(version).multiMember("Base").f32(2).f32(3).acolorMember(0.1f).f32(0.5f).f32(4).b8(false).f32(0.25f).f32(5).acolorMember(0.3f);
+    b.color(0.2f, 0.4f, 0.6f).f32(6).acolorMember(0.4f).f32(0.9f).f32(0.01f).f32(0.6f).f32(2.5f).b8(false).b8(true).base("Ink");
     return version == 1 ? b : b.b8(true).f32(3);
 }
 
@@ -41,7 +41,7 @@ RecordBytes toonRecord(int version) {
 RecordBytes linkedRecord(std::uint32_t kind, const std::string& text, std::int32_t number) {
     RecordBytes b;
     b.version(1).version(1).u32(kind);
-    return (kind == 2 ? b.i32(number) : b.str(text)).multi("Inside").base("Linked");
+    return (kind == 2 ? b.i32(number) : b.wstr(text)).multi("Inside").base("Linked");
 }
 
 const std::vector<Record>& records() {
@@ -50,53 +50,53 @@ const std::vector<Record>& records() {
         {kMaterialLayeredBRDF, layeredRecord(3), false}, {kMaterialLayeredBRDF, layeredRecord(4), true},
         // Single 1: single_value_a, single_value_b, the name inline, the layer's tag and record. 2: the two values,
         // the layer, the base record.
-        {kMaterialSingleBRDF, RecordBytes().version(1).i32(3).i32(4).str("").diffuse("Only", 0.5f), false},
+        {kMaterialSingleBRDF, RecordBytes().version(1).i32(3).i32(4).wstr("").diffuse("Only", 0.5f), false},
         {kMaterialSingleBRDF, RecordBytes().version(2).i32(5).i32(6).diffuse("Only", 0.5f).base("Single", "S-1"), true},
         // Multi 1: count, each sub-material's tag and record, the name inline. 2: the base record for the name.
-        {kMaterialMulti, RecordBytes().version(1).u32(1).multi("Inner").str("Outer\t"), false},
+        {kMaterialMulti, RecordBytes().version(1).u32(1).multi("Inner").wstr("Outer\t"), false},
         {kMaterialMulti, RecordBytes().version(2).u32(1).multi("Inner").base("Outer", "M-1"), true},
         // Two-sided 1: front, back, translucency_tex, translucency, translucency_tex_mult, force_1sided.
-        {kMaterial2Sided, RecordBytes().version(1).multiMember("F").b8(false).acolor(0.25f).color(0.1f, 0.2f, 0.3f)
+        {kMaterial2Sided, RecordBytes().version(1).multiMember("F").b8(false).acolorMember(0.25f).color(0.1f, 0.2f, 0.3f)
                               .f32(0.5f).b8(true), false},
         // Two-sided 2: as 1, then transparency_tex, transparency, transparency_tex_mult. 3: as 2, then the base record.
-        {kMaterial2Sided, RecordBytes().version(2).b8(false).b8(false).b8(false).color(0, 0, 0).f32(1).b8(false).acolor(0.75f)
+        {kMaterial2Sided, RecordBytes().version(2).b8(false).b8(false).b8(false).color(0, 0, 0).f32(1).b8(false).acolorMember(0.75f)
                               .color(0.4f, 0.5f, 0.6f).f32(2), false},
-        {kMaterial2Sided, RecordBytes().version(3).b8(false).multiMember("B").acolor(0.2f).color(0, 0, 0).f32(1)
+        {kMaterial2Sided, RecordBytes().version(3).b8(false).multiMember("B").acolorMember(0.2f).color(0, 0, 0).f32(1)
                               .b8(false).b8(false).color(0, 0, 0).f32(1).base("Sheet", "uu"), true},
         // Skp two-sided 1: base record, front, back, force_1sided.
         {kMaterialSkp2Sided, RecordBytes().version(1).base("Skp").multiMember("F").multiMember("K").b8(true), true},
         // Bump 1: name (empty: the default name), path of bump_tex, bump_tex_mult, base_mtl as tag and record.
-        {kMaterialBump, RecordBytes().version(1).str("").str("C:/maps/bump.png").f32(0.5f).multi("Base"), false},
+        {kMaterialBump, RecordBytes().version(1).wstr("").wstr("C:/maps/bump.png").f32(0.5f).multi("Base"), false},
         // Bump 2: name (an empty one stays empty), bump_tex_mult, bump_tex as member, base_mtl bare.
-        {kMaterialBump, RecordBytes().version(2).str("").f32(3).acolor(0.5f).multi("Base"), false},
+        {kMaterialBump, RecordBytes().version(2).wstr("").f32(3).acolorMember(0.5f).multi("Base"), false},
         // Bump 3: bump_tex_mult, bump_tex, base_mtl, base record.
-        {kMaterialBump, RecordBytes().version(3).f32(2).acolor(0.6f).multi("Base").base("Wall", "u-3"), true},
+        {kMaterialBump, RecordBytes().version(3).f32(2).acolorMember(0.6f).multi("Base").base("Wall", "u-3"), true},
         // Environment override 1: base record, base_mtl, the textures bg, gi, reflect, refract, then colours,
         // multipliers and switches in that order.
-        {kMaterialOverrideEnvironment, RecordBytes().version(1).base("Env").b8(true).layered("Base").acolor(0.1f)
-                                           .b8(false).acolor(0.3f).acolor(0.4f).color(1, 0, 0).color(0, 1, 0)
+        {kMaterialOverrideEnvironment, RecordBytes().version(1).base("Env").b8(true).layered("Base").acolorMember(0.1f)
+                                           .b8(false).acolorMember(0.3f).acolorMember(0.4f).color(1, 0, 0).color(0, 1, 0)
                                            .color(0, 0, 1).color(1, 1, 0).f32(2).f32(3).f32(4).f32(5).b8(true).b8(false)
                                            .b8(false).b8(true), true},
         // Displaced 1: base record, base_mtl, displace_tex, displace_tex_mult. 2: as 1, then displace_shift,
         // displace_edge_length, the four integers.
         {kMaterialDisplaced, RecordBytes().version(1).base("D1").b8(true).layered("Base").b8(false).f32(3), false},
-        {kMaterialDisplaced, RecordBytes().version(2).base("D").b8(true).layered("Base").acolor(0.5f).f32(2).f32(0.25f).f32(8)
+        {kMaterialDisplaced, RecordBytes().version(2).base("D").b8(true).layered("Base").acolorMember(0.5f).f32(2).f32(0.25f).f32(8)
                                  .i32(64).i32(0).i32(0).i32(0), true},
         // Object exclusion 1: mode, base_mtl, the object names; no base record. 2: as 1, then the base record. 3: as
         // 2, then short_circuit.
-        {kMaterialObjectExclusion, RecordBytes().version(1).i32(1).multiMember("Base").u32(2).str("Chair").str("Table"), false},
+        {kMaterialObjectExclusion, RecordBytes().version(1).i32(1).multiMember("Base").u32(2).wstr("Chair").wstr("Table"), false},
         {kMaterialObjectExclusion, RecordBytes().version(2).i32(0).b8(false).u32(0).base("Ex2"), false},
-        {kMaterialObjectExclusion, RecordBytes().version(3).i32(7).multiMember("Base").u32(1).str("Lamp").base("Ex3")
+        {kMaterialObjectExclusion, RecordBytes().version(3).i32(7).multiMember("Base").u32(1).wstr("Lamp").base("Ex3")
                                        .b8(false), true},
         // Angle blend 1: base record, mtl_one, mtl_two, start_angle, stop_angle.
         {kMaterialAngleBlend, RecordBytes().version(1).base("Blend").b8(false).multiMember("Two").f32(10).f32(20), true},
         // Alpha contribution 1: base record, base_mtl, alpha_tex, alpha_tex_mult, alpha.
-        {kMaterialAlphaContribution, RecordBytes().version(1).base("Alpha").multiMember("Base").acolor(0.5f).f32(2)
+        {kMaterialAlphaContribution, RecordBytes().version(1).base("Alpha").multiMember("Base").acolorMember(0.5f).f32(2)
                                          .f32(0.25f), true},
         {kMaterialToon, toonRecord(1), false}, {kMaterialToon, toonRecord(2), true},
         // Reference 1: base record, target_uuid. 2: as 1, then the embedded copy as an optional member.
-        {kMaterialReference, RecordBytes().version(1).base("Ref", "own").str("target"), false},
-        {kMaterialReference, RecordBytes().version(2).base("Ref2").str("t").multiMember("Copy"), false},
+        {kMaterialReference, RecordBytes().version(1).base("Ref", "own").wstr("target"), false},
+        {kMaterialReference, RecordBytes().version(2).base("Ref2").wstr("t").multiMember("Copy"), false},
         // Instance 1: the base record alone.
         {kMaterialInstance, RecordBytes().version(1).base("Wood", "u"), true},
         {kMaterialLinked, linkedRecord(0, "obj-0", 0), true}, {kMaterialLinked, linkedRecord(1, "", 0), true},
@@ -146,9 +146,9 @@ TEST_F(MaterialRecords, EveryVersionLoads) {
     // conversion, folded into their layered base.
     auto show = [](const MaterialPtr& m, const std::string& what, const RecordBytes&) {
         const bool folded = m->getType() == kMaterialOverrideEnvironment || m->getType() == kMaterialDisplaced;
-        return hidden(*m) + (folded ? wideToUtf8(materialToXml(m)) : ownXml(*m, utf8ToWide("/" + what)));
+        return hidden(*m) + (folded ? wideToUtf8(materialToXml(m)) : xmlOf(*m, utf8ToWide("/" + what)));
     };
-    expectGolden("material_records.xml", loadEach<MaterialPtr>(records(), createMaterial, show));
+    expectGolden("materials/golden/material_records.xml", loadEach<MaterialPtr>(records(), createMaterial, show));
 }
 
 std::vector<MaterialPtr> samples() {
@@ -172,8 +172,8 @@ TEST_F(MaterialRecords, NamesAndLoadsIntoUsedObjects) {
     for (const auto& c : cases) {
         // MaterialMulti version 2: count 0, then the base record.
         RecordBytes bytes;
-        bytes.version(2).u32(0).version(std::get<0>(c)).str(std::get<1>(c));
-        if (std::get<0>(c) == 2) bytes.str("UU-1");
+        bytes.version(2).u32(0).version(std::get<0>(c)).wstr(std::get<1>(c));
+        if (std::get<0>(c) == 2) bytes.wstr("UU-1");
         MaterialMulti m;
         m.uuid = u"kept";
         QuickArchive ar = bytes.archive();
@@ -184,7 +184,7 @@ TEST_F(MaterialRecords, NamesAndLoadsIntoUsedObjects) {
     // A refused tag still cleans the name the material had.
     MaterialMulti m;
     m.name = u"A\tB";
-    QuickArchive ar = RecordBytes().version(2).u32(0).u32(0x20001).str("X").str("").archive();
+    QuickArchive ar = RecordBytes().version(2).u32(0).u32(0x20001).wstr("X").wstr("").archive();
     EXPECT_FALSE(m.load(ar));
     EXPECT_EQ(m.name, u"AB");
     // A layered material starts from its defaults, even for a refused tag.
@@ -192,7 +192,7 @@ TEST_F(MaterialRecords, NamesAndLoadsIntoUsedObjects) {
     l.brdfs.push_back(createBrdf(kGlassBrdf));
     l.layered_value_b = 42, l.uuid = u"old";
     // Version 2: no layers, double_sided, layered_value_a, base record version 1 (name only).
-    QuickArchive v2 = RecordBytes().version(2).u32(0).i32(0).i32(0).version(1).str("N").archive();
+    QuickArchive v2 = RecordBytes().version(2).u32(0).i32(0).i32(0).version(1).wstr("N").archive();
     ASSERT_TRUE(l.load(v2));
     EXPECT_EQ(std::make_tuple(l.brdfs.size(), l.layered_value_b, l.uuid), std::make_tuple(0u, 1, u""));
     l.brdfs.push_back(createBrdf(kGlassBrdf));
@@ -331,7 +331,7 @@ TEST_F(MaterialRecords, BadAndTruncatedRecordsFail) {
     };
     for (const auto& c : refused) {
         for (std::uint32_t tag : c.second) {
-            QuickArchive ar = RecordBytes().u32(tag).base("R").str("t").b8(false).archive();
+            QuickArchive ar = RecordBytes().u32(tag).base("R").wstr("t").b8(false).archive();
             EXPECT_FALSE(createMaterial(c.first)->load(ar)) << c.first << " " << std::hex << tag;
         }
     }
@@ -344,8 +344,8 @@ TEST_F(MaterialRecords, BadAndTruncatedRecordsFail) {
         {kMaterialMulti, RecordBytes().version(2).u32(1).i32(15)},                  // material tag 15
         {kMaterialObjectExclusion, RecordBytes().version(3).i32(0).b8(false).u32(0x7FFFFFFF)},  // name count
         {kMaterialBump, RecordBytes().version(3).f32(1).b8(false).u32(15)},         // bare base_mtl, tag 15
-        {kMaterialReference, RecordBytes().version(2).base("R").str("t").b8(true).u32(99)},  // copy, tag 99
-        {kMaterialReference, RecordBytes().version(2).version(3).str("X").str("").str("t").b8(false)},  // base record
+        {kMaterialReference, RecordBytes().version(2).base("R").wstr("t").b8(true).u32(99)},  // copy, tag 99
+        {kMaterialReference, RecordBytes().version(2).version(3).wstr("X").wstr("").wstr("t").b8(false)},  // base record
         {kMaterialLinked, RecordBytes().version(1).version(1).u32(2).i32(1).u32(15)},          // material tag 15
         {kMaterialLinked, RecordBytes().version(1).version(2).u32(2).i32(1).multi("Inside")},  // id tag
         {kMaterialLinked, RecordBytes().version(1).version(1).u32(3).i32(0).multi("Inside").base("L")},  // id kind 3
@@ -355,7 +355,7 @@ TEST_F(MaterialRecords, BadAndTruncatedRecordsFail) {
         EXPECT_FALSE(createMaterial(c.first)->load(ar)) << &c - cases;
     }
     // A refused base record ends the load before any child is read.
-    EXPECT_FALSE(loaded<MaterialSkp2Sided>(RecordBytes().version(1).version(3).str("X").multiMember("F"), false)->front);
+    EXPECT_FALSE(loaded<MaterialSkp2Sided>(RecordBytes().version(1).version(3).wstr("X").multiMember("F"), false)->front);
     // Without the material it can't leave out, a linked material fails to save, writing nothing; so do an invalid id
     // kind, a bump and a single material.
     auto linked = boost::make_shared<MaterialLinked>();
@@ -425,7 +425,7 @@ const std::vector<WrapperLayout>& layouts() {
         // Angle blend 1: base record | mtl_one | mtl_two, two angles.
         {kMaterialAngleBlend, true, [](B b) { b.version(1).base("N"); }, [](B b) { b.b8(false).f32(75).f32(150); }},
         // Reference 2: base record, target_uuid | embedded copy.
-        {kMaterialReference, true, [](B b) { b.version(2).base("N").str("t"); }, [](B) {}},
+        {kMaterialReference, true, [](B b) { b.version(2).base("N").wstr("t"); }, [](B) {}},
         // Toon 2: base_mtl | the line fields, base record, silhouette fields.
         {kMaterialToon, true, [](B b) { b.version(2); },
          [](B b) {
@@ -470,7 +470,7 @@ TEST_F(MaterialRecords, AThousandNestedWrappers) {
     QuickArchive ar = chain(100, [](int i) { return static_cast<std::size_t>(i) % layouts().size(); }).archive();
     const MaterialPtr mixed = createMaterial(kMaterialBump);
     ASSERT_TRUE(mixed->load(ar));
-    expectGolden("mixed_chain.xml", wideToUtf8(materialToXml(mixed)));
+    expectGolden("materials/golden/mixed_chain.xml", wideToUtf8(materialToXml(mixed)));
     // Built in memory: saving works at any depth; loading the result fails at the limit, while the conversion still
     // finds the layered material.
     MaterialPtr tree = layered(u"Bottom");

@@ -111,7 +111,7 @@ TEST_F(SceneTable, RecordVersions) {
     EXPECT_EQ(t.getMaterials().size(), 1u);
     // Version 2 takes names and pairs without any test: an empty name (which became a unique default name) and a UUID
     // of a name that isn't there are kept.
-    QuickArchive v2 = RecordBytes().version(2).u32(1).multi("").u32(2).str("U1").str("Ghost").str("U2").str("Other").archive();
+    QuickArchive v2 = RecordBytes().version(2).u32(1).multi("").u32(2).wstr("U1").wstr("Ghost").wstr("U2").wstr("Other").archive();
     ASSERT_TRUE(t.load(v2));
     EXPECT_EQ(state(t), "DefaultMaterial\nBeginning UUIDs\nU1 Ghost\nU2 Other\n");
     EXPECT_FALSE(t.getMaterialByUuid(u"U1"));
@@ -193,10 +193,10 @@ QuickArchive tableWithDuplicates() {
     RecordBytes b;
     b.version(2).u32(3).layered("Wood");
     // MaterialBump version 3: mult, no texture, the reference (version 2, no copy), base record.
-    b.u32(kMaterialBump).version(3).f32(1).b8(false).u32(kMaterialReference).version(2).base("Ref").str("A-1").b8(false);
+    b.u32(kMaterialBump).version(3).f32(1).b8(false).u32(kMaterialReference).version(2).base("Ref").wstr("A-1").b8(false);
     b.base("Wrap").layered("Other");
-    b.u32(6).str("a-1").str("Wood").str("b-2").str("wood").str("c-3").str("Wrap");
-    return b.str("x-1").str("Ghost").str("y-2").str("Ghost").str("z-9").str("Other").archive();
+    b.u32(6).wstr("a-1").wstr("Wood").wstr("b-2").wstr("wood").wstr("c-3").wstr("Wrap");
+    return b.wstr("x-1").wstr("Ghost").wstr("y-2").wstr("Ghost").wstr("z-9").wstr("Other").archive();
 }
 
 TEST_F(SceneTable, FindAndMergeReferences) {

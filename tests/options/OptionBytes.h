@@ -5,14 +5,15 @@
 // shows. Row types: b bool32, i i32, f f32, d f64, c color, t transform, s
 // wstring; the document adds P, F, S, C (the params, frame data, stamp and
 // camera records), T (a texture flag, always absent) and L (the channel list).
-#include "animation/RecordBytes.h"
 #include "options/AllOptions.h"
+#include "support/Golden.h"
+#include "support/RecordBytes.h"
 #include "xml/AssetXmlWriter.h"
 
 namespace opttest {
 
 using namespace OrvaneLumoCore;
-using namespace animtest;
+using namespace testsupport;
 
 enum Holder { kParams, kFrame, kDocument, kCamera };
 
@@ -21,11 +22,6 @@ inline std::int32_t intAt(Holder h, int row) { return 1000 * (h + 1) + row; }
 inline float floatAt(Holder h, int row) { return 100.0f * h + row + 0.25f; }
 inline std::int32_t flagAt(Holder h, int row) { return row % 2 ? intAt(h, row) : 0; }
 inline std::string textAt(Holder h, int row) { return "text" + std::to_string(intAt(h, row)); }
-
-// A wstring as the archive stores it: the UTF-8 byte length, then the bytes.
-inline RecordBytes& wstr(RecordBytes& b, const std::string& utf8) {
-    return b.u32(static_cast<std::uint32_t>(utf8.size())).append({utf8.begin(), utf8.end()});
-}
 
 // The tag of a record: the version in the high half; AllOptions has 1 in the low.
 inline std::uint32_t tag(int version) { return static_cast<std::uint32_t>(version) << 16; }
@@ -39,7 +35,7 @@ inline void layRow(RecordBytes& b, Holder h, char type, int row) {
     case 'd': b.f64(floatAt(h, row)); break;
     case 'c': b.vec(floatAt(h, row), floatAt(h, row) + 1, floatAt(h, row) + 2); break;
     case 't': b.transform(Transform()); break;
-    case 's': wstr(b, textAt(h, row)); break;
+    case 's': b.wstr(textAt(h, row)); break;
     }
 }
 
@@ -92,7 +88,7 @@ static_assert(sizeof kFrameRowTypes == 47 + 1 && sizeof kCameraV1RowTypes == 28 
 // ---- stamp info, version 1: three i32, the text, 60 raw font bytes.
 inline RecordBytes stampV1Record() {
     RecordBytes b;
-    wstr(b.u32(tag(1)).i32(1).i32(2).i32(3), "stamp");
+    b.u32(tag(1)).i32(1).i32(2).i32(3).wstr("stamp");
     for (int k = 0; k < 60; ++k) b.u8(static_cast<std::uint8_t>(k));
     return b;
 }

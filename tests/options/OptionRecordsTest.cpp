@@ -99,7 +99,7 @@ TEST(OrvaneLFBStampInfo, FontBytesOfBothVersionsAndTheSave) {
     for (const Case& c : kCases) {
         const auto laid = [&](int version, std::uint32_t count, std::size_t kept) {
             RecordBytes b;
-            wstr(b.u32(tag(version)).i32(3).i32(-4).i32(5), c.text);
+            b.u32(tag(version)).i32(3).i32(-4).i32(5).wstr(c.text);
             if (version == 2) b.u32(count);
             for (std::size_t k = 0; k < count; ++k) b.u8(k < kept ? k + 1 : 0);
             return b;
@@ -180,7 +180,7 @@ TEST(AllOptionsRecord, PathsAreCutTo2047Characters) {
     const auto at = std::search(bytes.begin(), bytes.end(), std::begin(marker), std::end(marker));
     ASSERT_NE(bytes.end(), at);
     RecordBytes laid;
-    wstr(laid.append({bytes.begin(), at}), std::string(3000, 'p')).append({at + sizeof marker, bytes.end()});
+    laid.append({bytes.begin(), at}).wstr(std::string(3000, 'p')).append({at + sizeof marker, bytes.end()});
     ASSERT_TRUE(loadsWhole(p, laid));
     EXPECT_EQ(std::u16string(2047, u'p'), p.output_img_file);
     // A longer text in memory is saved cut.

@@ -4,10 +4,11 @@
 
 #include <gtest/gtest.h>
 
-#include "lights/LightFixtures.h"
 #include "materials/Brdf.h"
 #include "materials/LayeredMaterials.h"
 #include "persistence/OrvMatFile.h"
+#include "support/Golden.h"
+#include "support/LightFixtures.h"
 #include "textures/SkyTexture.h"
 
 using namespace OrvaneLumoCore;
@@ -21,25 +22,25 @@ const char kDocId[] = "{D3BE9766-E4AA-418b-81A9-23414A2BA98D}";
 // change it for the whole process, and the tests share one process.
 class SkyTest : public ::testing::Test {
     const std::vector<std::uint8_t> documentSun_ = savedBytes(*documentSun());
-    void TearDown() override { loads(*documentSun(), Bytes{documentSun_}); }
+    void TearDown() override { loads(*documentSun(), RecordBytes{documentSun_}); }
 };
 
 // The settings of a sky record (version 2 and 3): up_vector, eight reals
 // (shadowBias to ozone), three ints, shadows; then skyFlag and skyId.
-Bytes& settings(Bytes& b, const std::string& skyId) {
+RecordBytes& settings(RecordBytes& b, const std::string& skyId) {
     return b.floats({0, 0, 1, 0.5f, 6, 2, 1, 1, 50, 150, 0.35f}).ints({500, 1000, 8}).u8(1).u8(1).wstr(skyId);
 }
 
 // SkyTexture 1: own sun flag, the sun's record if set.
-Bytes skyV1(const std::string& ownSunId = "") {
-    return ownSunId.empty() ? Bytes().version(1).u8(0) : Bytes().version(1).u8(1).append(sunV4(ownSunId));
+RecordBytes skyV1(const std::string& ownSunId = "") {
+    return ownSunId.empty() ? RecordBytes().version(1).u8(0) : RecordBytes().version(1).u8(1).append(sunV4(ownSunId));
 }
 
 // SkyTexture 3: own sun, settings, skyFlag, skyId, AnimatedTransform, the
 // document sun's record (a version 4 sun with `docId`), and whether the
 // sky's sun is the document sun.
-Bytes skyV3(const std::string& ownSunId, const std::string& docId, bool sunIsDocument) {
-    Bytes b = Bytes().version(3).u8(1).append(sunV4(ownSunId));
+RecordBytes skyV3(const std::string& ownSunId, const std::string& docId, bool sunIsDocument) {
+    RecordBytes b = RecordBytes().version(3).u8(1).append(sunV4(ownSunId));
     return settings(b, "sky-3").animated({{0.0, countingTransform(1)}}).append(sunV4(docId)).u8(sunIsDocument);
 }
 
@@ -54,7 +55,7 @@ std::string skyAsset(const std::string& reference) {
 // The sun reference in its three cases: the document sun, a sun written
 // earlier by the same writer, and any other sun.
 TEST_F(SkyTest, SunReference) {
-    const std::pair<Bytes, const char*> cases[] = {
+    const std::pair<RecordBytes, const char*> cases[] = {
         {skyV1(), "/Rhino Document Sun"}, {skyV1(kDocId), "/Rhino Document Sun"},
         {skyV1("{d3be9766-e4aa-418b-81a9-23414a2ba98d}"), "/Rhino Document Sun"},
         {skyV1("sun-7"), "/sun-7"}, {skyV1("a&b"), "/a&amp;b"}};
@@ -72,10 +73,10 @@ TEST_F(SkyTest, SunReference) {
 TEST_F(SkyTest, OldVersionsSaveAsVersion3) {
     // SkyTexture 2: own sun, a plain transform (set at time 0), settings,
     // skyFlag, skyId. It leaves the document sun alone.
-    Bytes v2 = Bytes().version(2).u8(1).append(sunV4("own")).transform(countingTransform(3));
+    RecordBytes v2 = RecordBytes().version(2).u8(1).append(sunV4("own")).transform(countingTransform(3));
     boost::shared_ptr<SkyTexture> sky = loaded<SkyTexture>(settings(v2, "SKY-2"));
-    Bytes v3 = Bytes().version(3).u8(1).append(sunV4("own"));
-    settings(v3, "SKY-2").animated({{0.0, countingTransform(3)}}).append(Bytes{savedBytes(*documentSun())}).u8(0);
+    RecordBytes v3 = RecordBytes().version(3).u8(1).append(sunV4("own"));
+    settings(v3, "SKY-2").animated({{0.0, countingTransform(3)}}).append(RecordBytes{savedBytes(*documentSun())}).u8(0);
     EXPECT_EQ(savedBytes(*sky), v3.data);
     EXPECT_EQ(documentSun()->id, utf8ToWide(kDocId));
 
@@ -84,7 +85,7 @@ TEST_F(SkyTest, OldVersionsSaveAsVersion3) {
     boost::shared_ptr<SkyTexture> old = loaded<SkyTexture>(skyV1());
     const std::vector<std::uint8_t> bytes = savedBytes(*old);
     EXPECT_EQ(bytes.back(), 1);
-    boost::shared_ptr<SkyTexture> back = loaded<SkyTexture>(Bytes{bytes});
+    boost::shared_ptr<SkyTexture> back = loaded<SkyTexture>(RecordBytes{bytes});
     EXPECT_TRUE(back->isEqual(old));
     EXPECT_EQ(back->sun.get(), documentSun().get());
 }
@@ -93,7 +94,7 @@ TEST_F(SkyTest, Version3ReplacesTheDocumentSunInPlace) {
     SunLight* const docSun = documentSun().get();
     for (bool sunIsDocument : {false, true}) {
         const std::string own = sunIsDocument ? "doc-z" : "own";
-        const Bytes b = skyV3(own, "doc-z", sunIsDocument);
+        const RecordBytes b = skyV3(own, "doc-z", sunIsDocument);
         boost::shared_ptr<SkyTexture> sky = loaded<SkyTexture>(b);
         EXPECT_EQ(documentSun().get(), docSun);  // the same object, new contents
         EXPECT_EQ(documentSun()->id, u"doc-z");
@@ -105,18 +106,18 @@ TEST_F(SkyTest, Version3ReplacesTheDocumentSunInPlace) {
 }
 
 TEST_F(SkyTest, RefusedAndDamagedRecords) {
-    const Bytes whole = skyV3("own", "doc", false);
-    const Bytes cases[] = {
-        Bytes().version(4).u8(0), Bytes().u32(0x10001).u8(0), Bytes(),
-        Bytes().version(1).u8(1).version(5),                            // own sun refused
+    const RecordBytes whole = skyV3("own", "doc", false);
+    const RecordBytes cases[] = {
+        RecordBytes().version(4).u8(0), RecordBytes().u32(0x10001).u8(0), RecordBytes(),
+        RecordBytes().version(1).u8(1).version(5),                            // own sun refused
         whole.with(whole.data.size() - 1 - 124, 0x90000),               // document sun's transform
         whole.with(5 + sunV4().data.size() + 12 + 32 + 12 + 1 + 1 + 4 + 5, 0x20000),  // sky's transform
     };
-    for (const Bytes& b : cases) EXPECT_FALSE(loads(SkyTexture(), b));
-    for (const Bytes& b : {skyV1("own"), skyV3("own", "doc", true)})
+    for (const RecordBytes& b : cases) EXPECT_FALSE(loads(SkyTexture(), b));
+    for (const RecordBytes& b : {skyV1("own"), skyV3("own", "doc", true)})
         for (std::size_t len = 0; len < b.data.size(); ++len) {
             SkyTexture sky;
-            loads(sky, Bytes{{b.data.begin(), b.data.begin() + len}});
+            loads(sky, RecordBytes{{b.data.begin(), b.data.begin() + len}});
             EXPECT_TRUE(sky.sun) << len;  // never null, whatever the record did
         }
 }

@@ -6,7 +6,8 @@
 
 #include <gtest/gtest.h>
 
-#include "TextureTestUtil.h"
+#include "support/Golden.h"
+#include "support/RecordBytes.h"
 #include "textures/BasicTextures.h"
 #include "textures/Bitmaps.h"
 #include "textures/ProceduralTextures.h"
@@ -14,7 +15,7 @@
 #include "textures/UVWGenerators.h"
 
 using namespace OrvaneLumoCore;
-using namespace textest;
+using namespace testsupport;
 
 namespace {
 
@@ -23,72 +24,72 @@ namespace {
 // the offsets of a child's tag and of a nested record's version tag (0: none).
 struct Row {
     int tag;
-    Bytes bytes;
+    RecordBytes bytes;
     const char* golden;
     std::size_t child, inner;
     std::function<void(BaseTexture&)> deepChange = nullptr;  // of a copy, leaving the original as it was
 };
 
 std::vector<Row> rows() {
-    const Bytes buffer = Bytes().version(1).i32(2).f32(0.5f).f32(2.2f).wstr("C:\\maps\\\xC3\xA9t\xC3\xA9.png");
+    const RecordBytes buffer = RecordBytes().version(1).i32(2).f32(0.5f).f32(2.2f).wstr("C:\\maps\\\xC3\xA9t\xC3\xA9.png");
     return {
         // FresnelTexture 2: whiteInverse, blackInverse, fresnel_ior, refract_ior,
         // four multipliers, four optional children. The second child is
         // BlendTexture 2 (color_a, color_b: optional children, each with its
         // multiplier behind it if present; blend_amount) without color_a.
-        {1, Bytes().version(2).floats({0.1f, 0.2f, 0.3f, 0.4f, 0.5f, 0.6f, 1.3f, 1.7f, 2, 3, 4, 5}).u8(0)
+        {1, RecordBytes().version(2).floats({0.1f, 0.2f, 0.3f, 0.4f, 0.5f, 0.6f, 1.3f, 1.7f, 2, 3, 4, 5}).u8(0)
              .u8(1).i32(10).version(2).u8(0).u8(1).acolor(0, 0, 1, 1).f32(0.25f).f32(0.125f)
              .u8(0).u8(1).acolor(1, 1, 0, 0), "fresnel.xml", 54, 58, [](BaseTexture& t) {
              auto& blend = static_cast<BlendTexture&>(*static_cast<FresnelTexture&>(t).refraction_tex);
              static_cast<AColorTexture&>(*blend.color_b).color.a = 0; }},
-        {10, Bytes().version(2).u8(1).acolor(1, 0, 0, 1).f32(2).u8(1).acolor(0, 0, 1, 1).f32(0.25f).f32(0.125f),
+        {10, RecordBytes().version(2).u8(1).acolor(1, 0, 0, 1).f32(2).u8(1).acolor(0, 0, 1, 1).f32(0.25f).f32(0.125f),
          "blend.xml", 5, 9},
         // InvertTexture 1: texture (tag and record), invert_alpha.
-        {9, Bytes().version(1).acolor(1, 1, 1, 1).u8(1), "invert.xml", 4, 8},
+        {9, RecordBytes().version(1).acolor(1, 1, 1, 1).u8(1), "invert.xml", 4, 8},
         // AColorTexture 1: the acolor.
-        {5, Bytes().version(1).floats({0.25f, 0.5f, 0.75f, 0.125f}), "acolor.xml", 0, 0},
+        {5, RecordBytes().version(1).floats({0.25f, 0.5f, 0.75f, 0.125f}), "acolor.xml", 0, 0},
         // UVWTexture 1: generator tag and record. GenPlanarWorldUVW and
         // GenObjectUVW 1: uvwTransform, components record.
-        {2, Bytes().version(1).i32(0).version(1).floats({1, 0, 0, 0, 1, 0, 0, 0, 1, 7, 8, 9})
+        {2, RecordBytes().version(1).i32(0).version(1).floats({1, 0, 0, 0, 1, 0, 0, 0, 1, 7, 8, 9})
              .components({0, 0, 0, 2, 2, 2, 1, 1, 1}, 0, 0, 0), "uvw_planar.xml", 4, 60},
-        {2, Bytes().version(1).i32(1).version(1).floats({1, 0, 0, 0, 1, 0, 0, 0, 1, 7, 8, 9})
+        {2, RecordBytes().version(1).i32(1).version(1).floats({1, 0, 0, 0, 1, 0, 0, 0, 1, 7, 8, 9})
              .components({0, 0, 0, 2, 3, 4, 1, 1, 1}, 1, 0, 0), "uvw_object.xml", 4, 8, [](BaseTexture& t) {
              static_cast<GenObjectUVW&>(*static_cast<UVWTexture&>(t).uvw).uvwComponents.offset.z = 9; }},
         // GenEnvironmentUVW 2: uvw_matrix, mapping_type, components record.
-        {2, Bytes().version(1).i32(3).version(2).floats({0, 1, 0, 1, 0, 0, 0, 0, -1}).i32(0)
+        {2, RecordBytes().version(1).i32(3).version(2).floats({0, 1, 0, 1, 0, 0, 0, 0, -1}).i32(0)
              .components({0, 0, 45, 1, 1, 1, 0, 0, 0}, 0, 1, 0), "uvw_environment.xml", 4, 8},
         // GenChannelUVW 2: uvwTransform, texTransform, wrap_u, wrap_v,
         // uvw_channel, uvwComponents, texComponents. XML shows the components.
-        {2, Bytes().version(1).i32(4).version(2).floats({1, 2, 3, 4, 5, 6, 7, 8, 9, 10, 11, 12})
+        {2, RecordBytes().version(1).i32(4).version(2).floats({1, 2, 3, 4, 5, 6, 7, 8, 9, 10, 11, 12})
              .floats({3, 0, 0, 0, 3, 0, 0, 0, 3, 100, 100, 100}).ints({1, 0, 2})
              .components({10, 20, 30, 1, 2, 3, 4, 5, 6}, 1, 0, 1)
              .components({15, 25, 35, 1, 2, 3, 4, 5, 6}, 1, 0, 0), "uvw_channel.xml", 4, 8},
         // BitmapTexture 1: uvw tag, bitmap tag, uvw record, bitmap record,
         // tile. BitmapBuffer 1: filter_type, filter_blur, gamma, file.
-        {0, Bytes().version(1).ints({0, 0}).placement().append(buffer).u8(0), "bitmap.xml", 8, 116,
+        {0, RecordBytes().version(1).ints({0, 0}).placement().append(buffer).u8(0), "bitmap.xml", 8, 116,
          [](BaseTexture& t) { static_cast<BitmapBuffer&>(*static_cast<BitmapTexture&>(t).bitmap).gamma = 3; }},
         // RampTexture 1: uvw, colors, positions, u_wave, v_wave, type, interpolation.
-        {11, Bytes().version(1).planar().acolor(0.5f, 0.25f, 0.75f, 1).floats({0.25f, 0.5f, 0.75f}).ints({2, 3}),
+        {11, RecordBytes().version(1).planar().acolor(0.5f, 0.25f, 0.75f, 1).floats({0.25f, 0.5f, 0.75f}).ints({2, 3}),
          "ramp.xml", 4, 116},
         // BulgeTexture 1: uvw, u_width, v_width.
-        {8, Bytes().version(1).planar().floats({0.2f, 0.3f}), "bulge.xml", 4, 8},
+        {8, RecordBytes().version(1).planar().floats({0.2f, 0.3f}), "bulge.xml", 4, 8},
         // GridTexture 2: uvw, line_color, fill_color, lineColorMult,
         // fillColorMult, u_width, v_width.
-        {6, Bytes().version(2).planar().acolor(1, 0, 0, 1).acolor(0, 1, 0, 0.5f)
+        {6, RecordBytes().version(2).planar().acolor(1, 0, 0, 1).acolor(0, 1, 0, 0.5f)
              .floats({0.5f, 0.25f, 0.05f, 0.15f}), "grid.xml", 4, 116,
          [](BaseTexture& t) { static_cast<AColorTexture&>(*static_cast<GridTexture&>(t).fill_color).color.r = 3; }},
         // ClothTexture 2: uvw, gap_color, u_color, v_color, u_width, v_width, tile.
-        {7, Bytes().version(2).planar().floats({0.1f, 0.2f, 0.3f, 0.4f, 0.5f, 0.6f, 0.7f, 0.8f, 0.9f, 1})
+        {7, RecordBytes().version(2).planar().floats({0.1f, 0.2f, 0.3f, 0.4f, 0.5f, 0.6f, 0.7f, 0.8f, 0.9f, 1})
              .floats({0.125f, 0.25f, 0.2f, 0.4f}).u8(0), "cloth.xml", 4, 8},
         // NoiseTexture 1: uvw, color1_tex (present), color2_tex (absent), color1,
         // color2, ten reals (persistence to color2_tex_mult), octaves,
         // noiseType, inflection.
-        {3, Bytes().version(1).planar().u8(1).acolor(0.2f, 0.4f, 0.6f, 0.8f).u8(0)
+        {3, RecordBytes().version(1).planar().u8(1).acolor(0.2f, 0.4f, 0.6f, 0.8f).u8(0)
              .floats({0.9f, 0.8f, 0.7f, 0.1f, 0.2f, 0.3f, 0.5f, 1.5f, 2.5f, 3, 4, 5, 0.25f, 0.125f, 0.75f, 0.875f})
              .ints({4, 1, 1}), "noise.xml", 113, 117},
         // CheckerTexture 2: uvw, white_color, black_color, tile_u, tile_v,
         // whiteColorMult, blackColorMult.
-        {4, Bytes().version(2).planar().acolor(0.9f, 0.9f, 0.9f, 1).acolor(0.1f, 0.1f, 0.1f, 1)
+        {4, RecordBytes().version(2).planar().acolor(0.9f, 0.9f, 0.9f, 1).acolor(0.1f, 0.1f, 0.1f, 1)
              .u8(0).u8(1).floats({0.5f, 2}), "checker.xml", 4, 116},
     };
 }
@@ -96,9 +97,9 @@ std::vector<Row> rows() {
 TexturePtr acolor(float r, float g, float b, float a) { return TexturePtr(new AColorTexture(AColor(r, g, b, a))); }
 
 // Rotation, scale, offset, then the mirror flags.
-TransformComponents components(Bytes::Floats nine, int mx = 0, int my = 0, int mz = 0) {
+TransformComponents components(RecordBytes::Floats nine, int mx = 0, int my = 0, int mz = 0) {
     TransformComponents c;
-    loads(c, Bytes().components(nine, mx, my, mz));
+    loads(c, RecordBytes().components(nine, mx, my, mz));
     return c;
 }
 
@@ -150,7 +151,7 @@ TEST(TextureRecords, DamagedRecordsAreRefusedOrFailQuietly) {
         // A child tag that no factory knows; in the bitmap, also a generator's (2).
         EXPECT_FALSE(r.child && loads(*createTexture(r.tag), r.bytes.with(r.child, 13)));
         EXPECT_FALSE(r.tag == 0 && loads(*createTexture(r.tag), r.bytes.with(4, 2)));
-        expectDamageHandled(loaded<BaseTexture>(r.bytes, createTexture(r.tag)), r.bytes,
+        expectDamageHandled(loadedInto(createTexture(r.tag), r.bytes), r.bytes,
                             [&] { return createTexture(r.tag); });
     }
 }
@@ -158,7 +159,7 @@ TEST(TextureRecords, DamagedRecordsAreRefusedOrFailQuietly) {
 TEST(TextureRecords, NestingDepthIsBounded) {
     // InvertTextures n deep: version 1 and tag 9 n times, an AColorTexture, n + 1 invert_alpha flags.
     auto chain = [](int n) {
-        Bytes b = Bytes().version(1);
+        RecordBytes b = RecordBytes().version(1);
         for (int i = 0; i < n; ++i) b.i32(9).version(1);
         b.acolor(1, 1, 1, 1);
         for (int i = 0; i <= n; ++i) b.u8(0);
@@ -167,7 +168,7 @@ TEST(TextureRecords, NestingDepthIsBounded) {
     EXPECT_TRUE(loads(*createTexture(9), chain(200)));
     EXPECT_FALSE(loads(*createTexture(9), chain(100000)));
     // Grids as line_color of grids: version 2, the generator, tag 6.
-    Bytes grids;
+    RecordBytes grids;
     for (int level = 0; level < 100000; ++level) grids.version(2).planar().i32(6);
     EXPECT_FALSE(loads(*createTexture(6), grids));
 }
@@ -175,35 +176,35 @@ TEST(TextureRecords, NestingDepthIsBounded) {
 // An old record, read over an object that held the newest one, saves as the
 // newest version with the defaults of the fields it lacks.
 TEST(TextureRecords, OldVersionsSaveAsTheNewest) {
-    const Bytes fresnel = Bytes().floats({0.1f, 0.2f, 0.3f, 0.4f, 0.5f, 0.6f, 1.3f, 1.7f});
-    const Bytes cloth = Bytes().floats({0, 0, 0, 1, 0, 0, 0, 1, 0, 0, 0, 1, 0.2f, 0.3f});
-    const Bytes gridV1 = Bytes().version(1).planar().acolor(1, 0, 0, 1).acolor(0, 1, 0, 1);
-    const Bytes unit = Bytes().floats({1, 0, 0, 0, 1, 0, 0, 0, 1});
-    const Bytes scaled = Bytes().floats({2, 0, 0, 0, 2, 0, 0, 0, 2, 4, 5, 6}).transform(Transform());
-    const Bytes checker = Bytes().i32(1).placement().i32(3).append(rows()[13].bytes).acolor(0, 0, 1, 1).flags({1, 0});
-    const struct { int tag; Bytes old, newest; } cases[] = {
+    const RecordBytes fresnel = RecordBytes().floats({0.1f, 0.2f, 0.3f, 0.4f, 0.5f, 0.6f, 1.3f, 1.7f});
+    const RecordBytes cloth = RecordBytes().floats({0, 0, 0, 1, 0, 0, 0, 1, 0, 0, 0, 1, 0.2f, 0.3f});
+    const RecordBytes gridV1 = RecordBytes().version(1).planar().acolor(1, 0, 0, 1).acolor(0, 1, 0, 1);
+    const RecordBytes unit = RecordBytes().floats({1, 0, 0, 0, 1, 0, 0, 0, 1});
+    const RecordBytes scaled = RecordBytes().floats({2, 0, 0, 0, 2, 0, 0, 0, 2, 4, 5, 6}).transform(Transform());
+    const RecordBytes checker = RecordBytes().i32(1).placement().i32(3).append(rows()[13].bytes).acolor(0, 0, 1, 1).flags({1, 0});
+    const struct { int tag; RecordBytes old, newest; } cases[] = {
         // FresnelTexture 1: whiteInverse, blackInverse, fresnel_ior, refract_ior.
-        {1, Bytes().version(1).append(fresnel),
-         Bytes().version(2).append(fresnel).floats({1, 1, 1, 1}).flags({0, 0, 0, 0})},
+        {1, RecordBytes().version(1).append(fresnel),
+         RecordBytes().version(2).append(fresnel).floats({1, 1, 1, 1}).flags({0, 0, 0, 0})},
         // BlendTexture 1: color_a, color_b (no multipliers), blend_amount; saved, an absent child has none.
-        {10, Bytes().version(1).u8(0).u8(1).acolor(0, 1, 0, 1).f32(0.75f),
-         Bytes().version(2).u8(0).u8(1).acolor(0, 1, 0, 1).f32(1).f32(0.75f)},
+        {10, RecordBytes().version(1).u8(0).u8(1).acolor(0, 1, 0, 1).f32(0.75f),
+         RecordBytes().version(2).u8(0).u8(1).acolor(0, 1, 0, 1).f32(1).f32(0.75f)},
         // GenChannelUVW 1: uvwTransform, texTransform, tex x and y rotation, tex x
         // and y mirror, wrap_u, wrap_v, uvw_channel.
-        {2, Bytes().version(1).i32(4).version(1).append(scaled).floats({30, 45}).ints({1, 0, 1, 2, 3}),
-         Bytes().version(1).i32(4).version(2).append(scaled).ints({1, 2, 3}).defaultComponents()
+        {2, RecordBytes().version(1).i32(4).version(1).append(scaled).floats({30, 45}).ints({1, 0, 1, 2, 3}),
+         RecordBytes().version(1).i32(4).version(2).append(scaled).ints({1, 2, 3}).defaultComponents()
              .components({30, 45, 0, 1, 1, 1, 0, 0, 0}, 1, 0, 0)},
         // GenEnvironmentUVW 1: uvw_matrix, mapping_type, z rotation, x rotation,
         // z mirror, x mirror.
-        {2, Bytes().version(1).i32(3).version(1).append(unit).i32(3).floats({10, 20}).ints({1, 0}),
-         Bytes().version(1).i32(3).version(2).append(unit).i32(3).components({20, 0, 10, 1, 1, 1, 0, 0, 0}, 0, 0, 1)},
+        {2, RecordBytes().version(1).i32(3).version(1).append(unit).i32(3).floats({10, 20}).ints({1, 0}),
+         RecordBytes().version(1).i32(3).version(2).append(unit).i32(3).components({20, 0, 10, 1, 1, 1, 0, 0, 0}, 0, 0, 1)},
         // GridTexture 1: uvw, line_color, fill_color, u_width, v_width.
-        {6, Bytes(gridV1).floats({0.3f, 0.4f}), Bytes(gridV1).with(0, 0x20000).floats({1, 1, 0.3f, 0.4f})},
+        {6, RecordBytes(gridV1).floats({0.3f, 0.4f}), RecordBytes(gridV1).with(0, 0x20000).floats({1, 1, 0.3f, 0.4f})},
         // ClothTexture 1: as 2 without tile; both directions tile.
-        {7, Bytes().version(1).planar().append(cloth), Bytes().version(2).planar().append(cloth).u8(1)},
+        {7, RecordBytes().version(1).planar().append(cloth), RecordBytes().version(2).planar().append(cloth).u8(1)},
         // CheckerTexture 1: uvw, white_color, black_color, tile_u, tile_v; here an
         // object generator and a noise texture.
-        {4, Bytes().version(1).append(checker), Bytes().version(2).append(checker).floats({1, 1})},
+        {4, RecordBytes().version(1).append(checker), RecordBytes().version(2).append(checker).floats({1, 1})},
     };
     for (const auto& c : cases) {
         SCOPED_TRACE(c.tag);
@@ -300,7 +301,7 @@ TEST(TextureXml, OddValues) {
     EXPECT_FALSE(makeBitmapTextureFromPath(u""));
     // An empty file name, and mapping types outside the table.
     BitmapBuffer buffer;
-    ASSERT_TRUE(loads(buffer, Bytes().version(1).i32(0).f32(0).f32(1).wstr("")));
+    ASSERT_TRUE(loads(buffer, RecordBytes().version(1).i32(0).f32(0).f32(1).wstr("")));
     EXPECT_NE(xmlOf(buffer, u"/M").find("label=\"file\">\n            <value></value>\n"), std::string::npos);
     GenEnvironmentUVW env;
     for (int type : {-1, 4, 1 << 30}) {

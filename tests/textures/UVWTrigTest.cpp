@@ -3,7 +3,7 @@
 // below print a different last digit with this machine's cosf/sinf.
 #include <gtest/gtest.h>
 
-#include "TextureTestUtil.h"
+#include "support/Golden.h"
 #include "animation/TransformComponents.h"
 #include "platform/NumberFormat.h"
 #include "textures/UVWGenerators.h"
@@ -50,7 +50,7 @@ TEST(UVWTrig, TexTransformInXml) {
     GenChannelUVW uvw;
     uvw.texComponents.rotation = Vector(12.9f, 117, -150);
     uvw.texComponents.scale = Vector(1, 1.58921f, 2);
-    const std::string xml = textest::xmlOf(uvw, u"/M");
+    const std::string xml = testsupport::xmlOf(uvw, u"/M");
     const std::size_t at = xml.find("tex_transform");
     ASSERT_NE(std::string::npos, at);
     EXPECT_NE(std::string::npos, xml.find("0.574764", at)) << xml;
