@@ -1,6 +1,7 @@
 // The two conversion drivers: a file that loads becomes a document, any other
 // file comes back as its text.
 #include "materials/MaterialAssets.h"
+#include "module/Extension.h"
 #include "module/TextFallback.h"
 #include "options/AllOptions.h"
 #include "persistence/OrvMatFile.h"
@@ -9,38 +10,49 @@
 
 namespace OrvaneLumoCore {
 
+namespace {
+
+void writeFileText(const std::u16string& path, XmlSink& sink) {
+    const std::u16string text = readFileAsText(path);
+    if (!text.empty()) sink.flush(text.data(), text.size());
+}
+
+}  // namespace
+
+void writeMaterialDocument(const std::u16string& path, XmlSink& sink) {
+    OrvMatFile file;
+    if (!file.load(path)) return writeFileText(path, sink);
+    AssetXmlWriter writer(sink);
+    writer.openRoot(u"orvmat");
+    for (std::size_t i = 0; i < file.getMaterialCount(); ++i) {
+        MaterialPtr material;
+        file.getMaterial(i, material);
+        writeMaterialAssets(writer, material);
+    }
+    writer.closeRoot();
+}
+
+void writeOptionsDocument(const std::u16string& path, XmlSink& sink) {
+    OrvOptFile file;
+    AllOptions options;
+    if (!file.load(options, path)) return writeFileText(path, sink);
+    AssetXmlWriter writer(sink);
+    writer.openRoot(u"orvopt");
+    options.writeXml(writer, std::u16string());
+    writer.closeRoot();
+}
+
 std::u16string OrvMatFile::getXml(std::u16string path) {
     std::u16string result;
-    OrvMatFile file;
-    if (file.load(path)) {
-        result.reserve(4096);
-        AssetXmlWriter writer(result);
-        writer.openRoot(u"orvmat");
-        for (std::size_t i = 0; i < file.getMaterialCount(); ++i) {
-            MaterialPtr material;
-            file.getMaterial(i, material);
-            writeMaterialAssets(writer, material);
-        }
-        writer.closeRoot();
-    } else {
-        result = readFileAsText(path);
-    }
+    StringSink sink(result);
+    writeMaterialDocument(path, sink);
     return result;
 }
 
 std::u16string OrvOptFile::getXml(std::u16string path) {
     std::u16string result;
-    OrvOptFile file;
-    AllOptions options;
-    if (file.load(options, path)) {
-        result.reserve(1 << 16);
-        AssetXmlWriter writer(result);
-        writer.openRoot(u"orvopt");
-        options.writeXml(writer, std::u16string());
-        writer.closeRoot();
-    } else {
-        result = readFileAsText(path);
-    }
+    StringSink sink(result);
+    writeOptionsDocument(path, sink);
     return result;
 }
 
