@@ -2,6 +2,7 @@
 // random pieces, the code points and the UTF-8 are those of the whole text.
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <random>
 #include <string>
 #include <vector>
@@ -65,6 +66,16 @@ void encodeInPieces(const std::u16string& s, std::mt19937& rng, std::u32string& 
     u32.append(last, a.finishUtf32(last));
     char tail[4];
     u8.append(tail, b.finishUtf8(tail));
+
+    // The count and the widest code point that a Python 3 str is made with,
+    // and the code points read back from the UTF-8.
+    const std::u32string want = codePoints(s);
+    ASSERT_EQ(b.codePoints(), want.size());
+    const char32_t widest = want.empty() ? 0 : *std::max_element(want.begin(), want.end());
+    EXPECT_EQ(std::max<char32_t>(b.widest(), 0x7F), std::max<char32_t>(widest, 0x7F));
+    std::u32string back(b.codePoints(), U'?');
+    ResultEncoder::fromOwnUtf8(u8.data(), u8.size(), &back[0]);
+    EXPECT_EQ(back, want);
 }
 
 TEST(ResultEncoder, PiecesGiveTheTextOfTheWhole) {

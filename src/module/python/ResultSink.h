@@ -5,13 +5,16 @@
 //   object (UTF-16 into UCS4, surrogate pairs joined, or copied as they are
 //   into a UCS2 build);
 // - Python 3: a str must know its widest character before it exists, so the
-//   pieces go into one compact UTF-8 staging buffer that the interpreter
-//   then decodes; lone surrogates pass as on Python 2 ("surrogatepass").
+//   pieces go into one compact UTF-8 staging buffer, with the count of code
+//   points and the widest one; then the str is made at its final size and
+//   filled from the staging buffer. Lone surrogates stay code points of their
+//   own, as on Python 2 (what "surrogatepass" decoding would give).
 // Like the "u" format of Py_BuildValue, both end the text at a zero unit.
 // A sink owns what it has built until release(); if the conversion throws,
 // the destructor frees it. A sink that can't grow throws std::bad_alloc.
 #include <Python.h>
 
+#include <algorithm>
 #include <cstdlib>
 #include <cstring>
 #include <new>
@@ -20,6 +23,19 @@
 #include "xml/XmlSink.h"
 
 namespace pyorvxml {
+
+// The next size of a growing buffer of units of `unitSize` bytes that must
+// hold `needed` units. It doubles while it is small enough for the allocator
+// to serve it from memory it keeps (up to 126 KB), then grows by half: a
+// large buffer is moved page by page rather than copied, and the untouched
+// pages of its reserve cost no memory.
+inline std::size_t nextCapacity(std::size_t capacity, std::size_t needed, std::size_t unitSize) {
+    const std::size_t small = 126 * 1024 / unitSize;
+    capacity = capacity < 8192 ? 8192
+               : capacity < small ? std::min(2 * capacity, small)
+                                  : capacity + capacity / 2;
+    return capacity < needed ? needed : capacity;
+}
 
 #if PY_MAJOR_VERSION < 3
 
@@ -65,14 +81,10 @@ private:
         }
     }
 
-    // Room for `needed` units. A large buffer grows by half its size; the
-    // allocator moves its pages rather than copying them, and untouched
-    // pages of the reserve cost no memory.
     void reserve(std::size_t needed) {
         if (static_cast<Py_ssize_t>(needed) <= capacity_) return;
-        Py_ssize_t capacity = capacity_ + capacity_ / 2;
-        if (capacity < static_cast<Py_ssize_t>(needed)) capacity = static_cast<Py_ssize_t>(needed);
-        if (capacity < 8192) capacity = 8192;
+        const Py_ssize_t capacity = static_cast<Py_ssize_t>(
+            nextCapacity(static_cast<std::size_t>(capacity_), needed, sizeof(Py_UNICODE)));
         if (object_ == NULL) {
             object_ = PyUnicode_FromUnicode(NULL, capacity);
             if (object_ == NULL) throw std::bad_alloc();
@@ -104,9 +116,29 @@ public:
     // The finished string (a new reference), or NULL with an exception set.
     // The staging buffer is freed.
     PyObject* release() {
-        if (data_ == NULL) return PyUnicode_FromStringAndSize(NULL, 0);
+        if (data_ == NULL) return PyUnicode_New(0, 0);
         size_ += encoder_.finishUtf8(data_ + size_);  // reserve left room for it
-        PyObject* result = PyUnicode_DecodeUTF8(data_, static_cast<Py_ssize_t>(size_), "surrogatepass");
+        // The encoder counted the code points and knows the widest: the str
+        // is made at its final size and kind and filled in one pass.
+        PyObject* result = PyUnicode_New(static_cast<Py_ssize_t>(encoder_.codePoints()),
+                                         static_cast<Py_UCS4>(encoder_.widest()));
+        if (result != NULL) {
+            void* out = PyUnicode_DATA(result);
+            switch (PyUnicode_KIND(result)) {
+                case PyUnicode_1BYTE_KIND:
+                    if (encoder_.widest() < 0x80)
+                        std::memcpy(out, data_, size_);
+                    else
+                        ResultEncoder::fromOwnUtf8(data_, size_, static_cast<Py_UCS1*>(out));
+                    break;
+                case PyUnicode_2BYTE_KIND:
+                    ResultEncoder::fromOwnUtf8(data_, size_, static_cast<Py_UCS2*>(out));
+                    break;
+                default:
+                    ResultEncoder::fromOwnUtf8(data_, size_, static_cast<Py_UCS4*>(out));
+                    break;
+            }
+        }
         std::free(data_);
         data_ = NULL;
         size_ = capacity_ = 0;
@@ -119,9 +151,7 @@ private:
 
     void reserve(std::size_t needed) {
         if (needed <= capacity_) return;
-        std::size_t capacity = capacity_ + capacity_ / 2;
-        if (capacity < needed) capacity = needed;
-        if (capacity < 16384) capacity = 16384;
+        const std::size_t capacity = nextCapacity(capacity_, needed, 1);
         char* data = static_cast<char*>(std::realloc(data_, capacity));
         if (data == NULL) throw std::bad_alloc();
         data_ = data;
