@@ -4,11 +4,12 @@
 // - Python 2: the pieces go straight into the buffer of a growing unicode
 //   object (UTF-16 into UCS4, surrogate pairs joined, or copied as they are
 //   into a UCS2 build);
-// - Python 3: a str must know its widest character before it exists, so the
-//   pieces go into one compact UTF-8 staging buffer, with the count of code
-//   points and the widest one; then the str is made at its final size and
-//   filled from the staging buffer. Lone surrogates stay code points of their
-//   own, as on Python 2 (what "surrogatepass" decoding would give).
+// - Python 3: a str must know its widest character before it exists. The
+//   pieces go straight into a growing str of the narrowest kind that holds
+//   the code points so far; a wider code point makes one copy into the wider
+//   kind, at most three times in all (the way the interpreter's own decoders
+//   build a str). Lone surrogates stay code points of their own, as on
+//   Python 2.
 // Like the "u" format of Py_BuildValue, both end the text at a zero unit.
 // A sink owns what it has built until release(); if the conversion throws,
 // the destructor frees it. A sink that can't grow throws std::bad_alloc.
@@ -105,43 +106,31 @@ private:
 
 class ResultSink final : public XmlSink {
 public:
-    ResultSink() : data_(NULL), size_(0), capacity_(0) {}
-    ~ResultSink() { std::free(data_); }
+    ResultSink() : object_(NULL), size_(0), capacity_(0), limit_(0) {}
+    ~ResultSink() { Py_XDECREF(object_); }
 
     void flush(const char16_t* text, std::size_t size) override {
-        reserve(size_ + ResultEncoder::maxUtf8(size));
-        size_ += encoder_.toUtf8(text, size, data_ + size_);
+        // Code points a chunk at a time, through a small buffer on the stack.
+        Py_UCS4 points[kChunk + 1];
+        while (size > 0) {
+            const std::size_t n = size < kChunk ? size : kChunk;
+            store(points, encoder_.toUtf32(text, n, points));
+            text += n;
+            size -= n;
+        }
     }
 
-    // The finished string (a new reference), or NULL with an exception set.
-    // The staging buffer is freed.
+    // The finished string (a new reference), or NULL with MemoryError set.
+    // The sink is empty afterwards.
     PyObject* release() {
-        if (data_ == NULL) return PyUnicode_New(0, 0);
-        size_ += encoder_.finishUtf8(data_ + size_);  // reserve left room for it
-        // The encoder counted the code points and knows the widest: the str
-        // is made at its final size and kind and filled in one pass.
-        PyObject* result = PyUnicode_New(static_cast<Py_ssize_t>(encoder_.codePoints()),
-                                         static_cast<Py_UCS4>(encoder_.widest()));
-        if (result != NULL) {
-            void* out = PyUnicode_DATA(result);
-            switch (PyUnicode_KIND(result)) {
-                case PyUnicode_1BYTE_KIND:
-                    if (encoder_.widest() < 0x80)
-                        std::memcpy(out, data_, size_);
-                    else
-                        ResultEncoder::fromOwnUtf8(data_, size_, static_cast<Py_UCS1*>(out));
-                    break;
-                case PyUnicode_2BYTE_KIND:
-                    ResultEncoder::fromOwnUtf8(data_, size_, static_cast<Py_UCS2*>(out));
-                    break;
-                default:
-                    ResultEncoder::fromOwnUtf8(data_, size_, static_cast<Py_UCS4*>(out));
-                    break;
-            }
-        }
-        std::free(data_);
-        data_ = NULL;
+        Py_UCS4 last[1];
+        store(last, encoder_.finishUtf32(last));
+        if (object_ == NULL) return PyUnicode_New(0, 0);
+        if (size_ != capacity_ && PyUnicode_Resize(&object_, size_) < 0) return NULL;
+        PyObject* result = object_;
+        object_ = NULL;
         size_ = capacity_ = 0;
+        limit_ = 0;
         return result;
     }
 
@@ -149,18 +138,71 @@ private:
     ResultSink(const ResultSink&) = delete;
     ResultSink& operator=(const ResultSink&) = delete;
 
-    void reserve(std::size_t needed) {
-        if (needed <= capacity_) return;
-        const std::size_t capacity = nextCapacity(capacity_, needed, 1);
-        char* data = static_cast<char*>(std::realloc(data_, capacity));
-        if (data == NULL) throw std::bad_alloc();
-        data_ = data;
+    static const std::size_t kChunk = 4096;
+
+    // Appends code points. The str's kind is the narrowest that holds every
+    // code point so far; a wider one makes a new str, once per kind.
+    void store(const Py_UCS4* points, std::size_t n) {
+        if (n == 0) return;
+        Py_UCS4 bits = 0;
+        std::size_t i = 0;
+        for (; i + 8 <= n; i += 8)  // blocks of a fixed size, which the compiler vectorizes
+            for (int k = 0; k < 8; ++k) bits |= points[i + k];
+        for (; i < n; ++i) bits |= points[i];
+        // The widest code point of each kind is 2^k - 1, so the OR of the
+        // code points picks the same kind as their largest.
+        const Py_UCS4 limit = bits <= 0x7F ? 0x7F : bits <= 0xFF ? 0xFF : bits <= 0xFFFF ? 0xFFFF : 0x10FFFF;
+        reserve(static_cast<std::size_t>(size_) + n, limit > limit_ ? limit : limit_);
+        void* data = PyUnicode_DATA(object_);
+        switch (PyUnicode_KIND(object_)) {
+            case PyUnicode_1BYTE_KIND:
+                narrow(points, n, static_cast<Py_UCS1*>(data) + size_);
+                break;
+            case PyUnicode_2BYTE_KIND:
+                narrow(points, n, static_cast<Py_UCS2*>(data) + size_);
+                break;
+            default:
+                std::memcpy(static_cast<Py_UCS4*>(data) + size_, points, n * sizeof(Py_UCS4));
+                break;
+        }
+        size_ += static_cast<Py_ssize_t>(n);
+    }
+
+    template <class Unit>
+    static void narrow(const Py_UCS4* __restrict points, std::size_t n, Unit* __restrict out) {
+        std::size_t i = 0;
+        for (; i + 8 <= n; i += 8)
+            for (int k = 0; k < 8; ++k) out[i + k] = static_cast<Unit>(points[i + k]);
+        for (; i < n; ++i) out[i] = static_cast<Unit>(points[i]);
+    }
+
+    // Room for `needed` code points up to `limit`.
+    void reserve(std::size_t needed, Py_UCS4 limit) {
+        if (static_cast<Py_ssize_t>(needed) <= capacity_ && limit == limit_) return;
+        Py_ssize_t capacity = capacity_;
+        if (static_cast<Py_ssize_t>(needed) > capacity_)
+            capacity = static_cast<Py_ssize_t>(nextCapacity(static_cast<std::size_t>(capacity_), needed,
+                                                            limit <= 0xFF ? 1 : limit <= 0xFFFF ? 2 : 4));
+        if (limit != limit_) {
+            PyObject* wider = PyUnicode_New(capacity, limit);
+            if (wider == NULL) throw std::bad_alloc();
+            if (size_ > 0 && PyUnicode_CopyCharacters(wider, 0, object_, 0, size_) < 0) {
+                Py_DECREF(wider);
+                throw std::bad_alloc();
+            }
+            Py_XDECREF(object_);
+            object_ = wider;
+            limit_ = limit;
+        } else if (PyUnicode_Resize(&object_, capacity) < 0) {
+            throw std::bad_alloc();  // object_ is unchanged and freed by the destructor
+        }
         capacity_ = capacity;
     }
 
-    char* data_;
-    std::size_t size_;
-    std::size_t capacity_;
+    PyObject* object_;
+    Py_ssize_t size_;
+    Py_ssize_t capacity_;
+    Py_UCS4 limit_;
     ResultEncoder encoder_;
 };
 
