@@ -38,12 +38,42 @@ inline std::size_t nextCapacity(std::size_t capacity, std::size_t needed, std::s
     return capacity < needed ? needed : capacity;
 }
 
+// The string object a sink builds and owns until it hands it over: `size_`
+// units written of `capacity_`.
+class GrowingString {
+protected:
+    GrowingString() : object_(NULL), size_(0), capacity_(0) {}
+    ~GrowingString() { Py_XDECREF(object_); }
+    GrowingString(const GrowingString&) = delete;
+    GrowingString& operator=(const GrowingString&) = delete;
+
+    // A new capacity for object_; on failure object_ is unchanged (and freed
+    // by the destructor).
+    void resize(Py_ssize_t capacity) {
+        if (PyUnicode_Resize(&object_, capacity) < 0) throw std::bad_alloc();
+        capacity_ = capacity;
+    }
+
+    // The string cut to its size (a new reference), or NULL with
+    // MemoryError set; the sink is empty afterwards.
+    PyObject* handOver() {
+        if (size_ != capacity_ && PyUnicode_Resize(&object_, size_) < 0) return NULL;
+        PyObject* result = object_;
+        object_ = NULL;
+        size_ = capacity_ = 0;
+        return result;
+    }
+
+    PyObject* object_;
+    Py_ssize_t size_;
+    Py_ssize_t capacity_;
+};
+
 #if PY_MAJOR_VERSION < 3
 
-class ResultSink final : public XmlSink {
+class ResultSink final : public XmlSink, private GrowingString {
 public:
-    ResultSink() : object_(NULL), size_(0), capacity_(0), ended_(false) {}
-    ~ResultSink() { Py_XDECREF(object_); }
+    ResultSink() : ended_(false) {}
 
     void flush(const char16_t* text, std::size_t size) override {
         reserve(size_ + ResultEncoder::maxUtf32(size));
@@ -57,16 +87,10 @@ public:
         if (object_ == NULL) return PyUnicode_FromUnicode(NULL, 0);
         if (sizeof(Py_UNICODE) >= 4)
             size_ += static_cast<Py_ssize_t>(encoder_.finishUtf32(PyUnicode_AS_UNICODE(object_) + size_));
-        if (size_ != capacity_ && PyUnicode_Resize(&object_, size_) < 0) return NULL;
-        PyObject* result = object_;
-        object_ = NULL;
-        size_ = capacity_ = 0;
-        return result;
+        return handOver();
     }
 
 private:
-    ResultSink(const ResultSink&);
-    ResultSink& operator=(const ResultSink&);
 
     // A UCS2 build takes the units as they are, up to a zero unit.
     template <class Unit>
@@ -86,28 +110,21 @@ private:
         if (static_cast<Py_ssize_t>(needed) <= capacity_) return;
         const Py_ssize_t capacity = static_cast<Py_ssize_t>(
             nextCapacity(static_cast<std::size_t>(capacity_), needed, sizeof(Py_UNICODE)));
-        if (object_ == NULL) {
-            object_ = PyUnicode_FromUnicode(NULL, capacity);
-            if (object_ == NULL) throw std::bad_alloc();
-        } else if (PyUnicode_Resize(&object_, capacity) < 0) {
-            throw std::bad_alloc();  // object_ is unchanged and freed by the destructor
-        }
+        if (object_ != NULL) return resize(capacity);
+        object_ = PyUnicode_FromUnicode(NULL, capacity);
+        if (object_ == NULL) throw std::bad_alloc();
         capacity_ = capacity;
     }
 
-    PyObject* object_;
-    Py_ssize_t size_;
-    Py_ssize_t capacity_;
     bool ended_;
     ResultEncoder encoder_;
 };
 
 #else
 
-class ResultSink final : public XmlSink {
+class ResultSink final : public XmlSink, private GrowingString {
 public:
-    ResultSink() : object_(NULL), size_(0), capacity_(0), limit_(0) {}
-    ~ResultSink() { Py_XDECREF(object_); }
+    ResultSink() : limit_(0) {}
 
     void flush(const char16_t* text, std::size_t size) override {
         // Code points a chunk at a time, through a small buffer on the stack.
@@ -126,17 +143,11 @@ public:
         Py_UCS4 last[1];
         store(last, encoder_.finishUtf32(last));
         if (object_ == NULL) return PyUnicode_New(0, 0);
-        if (size_ != capacity_ && PyUnicode_Resize(&object_, size_) < 0) return NULL;
-        PyObject* result = object_;
-        object_ = NULL;
-        size_ = capacity_ = 0;
         limit_ = 0;
-        return result;
+        return handOver();
     }
 
 private:
-    ResultSink(const ResultSink&) = delete;
-    ResultSink& operator=(const ResultSink&) = delete;
 
     static const std::size_t kChunk = 4096;
 
@@ -193,15 +204,12 @@ private:
             Py_XDECREF(object_);
             object_ = wider;
             limit_ = limit;
-        } else if (PyUnicode_Resize(&object_, capacity) < 0) {
-            throw std::bad_alloc();  // object_ is unchanged and freed by the destructor
+            capacity_ = capacity;
+        } else {
+            resize(capacity);
         }
-        capacity_ = capacity;
     }
 
-    PyObject* object_;
-    Py_ssize_t size_;
-    Py_ssize_t capacity_;
     Py_UCS4 limit_;
     ResultEncoder encoder_;
 };
