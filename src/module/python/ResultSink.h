@@ -127,7 +127,14 @@ public:
     ResultSink() : limit_(0) {}
 
     void flush(const char16_t* text, std::size_t size) override {
-        // Code points a chunk at a time, through a small buffer on the stack.
+        if (limit_ == kWidest) {  // nothing can widen the str any more: straight in
+            reserve(static_cast<std::size_t>(size_) + ResultEncoder::maxUtf32(size), kWidest);
+            size_ += static_cast<Py_ssize_t>(
+                encoder_.toUtf32(text, size, static_cast<Py_UCS4*>(PyUnicode_DATA(object_)) + size_));
+            return;
+        }
+        // Code points a chunk at a time, through a small buffer on the stack,
+        // so that the kind is known before they are stored.
         Py_UCS4 points[kChunk + 1];
         while (size > 0) {
             const std::size_t n = size < kChunk ? size : kChunk;
@@ -150,6 +157,7 @@ public:
 private:
 
     static const std::size_t kChunk = 4096;
+    static const Py_UCS4 kWidest = 0x10FFFF;
 
     // Appends code points. The str's kind is the narrowest that holds every
     // code point so far; a wider one makes a new str, once per kind.
@@ -162,7 +170,7 @@ private:
         for (; i < n; ++i) bits |= points[i];
         // The widest code point of each kind is 2^k - 1, so the OR of the
         // code points picks the same kind as their largest.
-        const Py_UCS4 limit = bits <= 0x7F ? 0x7F : bits <= 0xFF ? 0xFF : bits <= 0xFFFF ? 0xFFFF : 0x10FFFF;
+        const Py_UCS4 limit = bits <= 0x7F ? 0x7F : bits <= 0xFF ? 0xFF : bits <= 0xFFFF ? 0xFFFF : kWidest;
         reserve(static_cast<std::size_t>(size_) + n, limit > limit_ ? limit : limit_);
         void* data = PyUnicode_DATA(object_);
         switch (PyUnicode_KIND(object_)) {
