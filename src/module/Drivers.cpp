@@ -1,5 +1,5 @@
 // The two conversion drivers: a file that loads becomes a document, any other
-// file comes back as its text.
+// file comes back as its text. The text goes to a sink as it is made.
 #include "materials/MaterialAssets.h"
 #include "module/Extension.h"
 #include "module/TextFallback.h"
@@ -19,9 +19,7 @@ void writeFileText(const std::u16string& path, XmlSink& sink) {
 
 }  // namespace
 
-void writeMaterialDocument(const std::u16string& path, XmlSink& sink) {
-    OrvMatFile file;
-    if (!file.load(path)) return writeFileText(path, sink);
+void writeMaterialsDocument(const OrvMatFile& file, XmlSink& sink) {
     AssetXmlWriter writer(sink);
     writer.openRoot(u"orvmat");
     for (std::size_t i = 0; i < file.getMaterialCount(); ++i) {
@@ -32,14 +30,28 @@ void writeMaterialDocument(const std::u16string& path, XmlSink& sink) {
     writer.closeRoot();
 }
 
-void writeOptionsDocument(const std::u16string& path, XmlSink& sink) {
-    OrvOptFile file;
-    AllOptions options;
-    if (!file.load(options, path)) return writeFileText(path, sink);
+void writeOptionsDocument(AllOptions& options, XmlSink& sink) {
     AssetXmlWriter writer(sink);
     writer.openRoot(u"orvopt");
     options.writeXml(writer, std::u16string());
     writer.closeRoot();
+}
+
+void writeMaterialDocument(const std::u16string& path, XmlSink& sink) {
+    OrvMatFile file;
+    if (file.load(path))
+        writeMaterialsDocument(file, sink);
+    else
+        writeFileText(path, sink);
+}
+
+void writeOptionsDocument(const std::u16string& path, XmlSink& sink) {
+    OrvOptFile file;
+    AllOptions options;
+    if (file.load(options, path))
+        writeOptionsDocument(options, sink);
+    else
+        writeFileText(path, sink);
 }
 
 std::u16string OrvMatFile::getXml(std::u16string path) {

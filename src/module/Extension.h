@@ -5,6 +5,9 @@ class XmlSink;
 
 namespace OrvaneLumoCore {
 
+class AllOptions;
+class OrvMatFile;
+
 // True if the text behind the last "." of the whole path (directory
 // separators included) equals `first` or `second`, ignoring case.
 bool hasExtension(const std::u16string& path, const std::u16string& first,
@@ -25,5 +28,9 @@ bool convertOptionsPath(const std::u16string& path, XmlSink& sink);
 // The drivers behind them, without the extension test.
 void writeMaterialDocument(const std::u16string& path, XmlSink& sink);
 void writeOptionsDocument(const std::u16string& path, XmlSink& sink);
+
+// The document of what is loaded already.
+void writeMaterialsDocument(const OrvMatFile& file, XmlSink& sink);
+void writeOptionsDocument(AllOptions& options, XmlSink& sink);
 
 }  // namespace OrvaneLumoCore
