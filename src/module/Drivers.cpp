@@ -1,6 +1,7 @@
 // The two conversion drivers: a file that loads becomes a document, any other
-// file comes back as its text.
+// file comes back as its text. The text goes to a sink as it is made.
 #include "materials/MaterialAssets.h"
+#include "module/Extension.h"
 #include "module/TextFallback.h"
 #include "options/AllOptions.h"
 #include "persistence/OrvMatFile.h"
@@ -9,41 +10,76 @@
 
 namespace OrvaneLumoCore {
 
-std::u16string OrvMatFile::documentXml() const {
-    std::u16string result;
-    result.reserve(4096);
-    AssetXmlWriter writer(result);
+namespace {
+
+void writeFileText(const std::u16string& path, XmlSink& sink) {
+    const std::u16string text = readFileAsText(path);
+    if (!text.empty()) sink.flush(text.data(), text.size());
+}
+
+}  // namespace
+
+void writeMaterialsDocument(const OrvMatFile& file, XmlSink& sink) {
+    AssetXmlWriter writer(sink);
     writer.openRoot(u"orvmat");
-    for (std::size_t i = 0; i < getMaterialCount(); ++i) {
+    for (std::size_t i = 0; i < file.getMaterialCount(); ++i) {
         MaterialPtr material;
-        getMaterial(i, material);
+        file.getMaterial(i, material);
         writeMaterialAssets(writer, material);
     }
     writer.closeRoot();
-    return result;
 }
 
-std::u16string OrvMatFile::getXml(std::u16string path) {
+void writeOptionsDocument(AllOptions& options, XmlSink& sink) {
+    AssetXmlWriter writer(sink);
+    writer.openRoot(u"orvopt");
+    options.writeXml(writer, std::u16string());
+    writer.closeRoot();
+}
+
+void writeMaterialDocument(const std::u16string& path, XmlSink& sink) {
     OrvMatFile file;
-    if (file.load(path)) return file.documentXml();
-    return readFileAsText(path);
+    if (file.load(path))
+        writeMaterialsDocument(file, sink);
+    else
+        writeFileText(path, sink);
+}
+
+void writeOptionsDocument(const std::u16string& path, XmlSink& sink) {
+    OrvOptFile file;
+    AllOptions options;
+    if (file.load(options, path))
+        writeOptionsDocument(options, sink);
+    else
+        writeFileText(path, sink);
+}
+
+std::u16string OrvMatFile::documentXml() const {
+    std::u16string result;
+    StringSink sink(result);
+    writeMaterialsDocument(*this, sink);
+    return result;
 }
 
 std::u16string OrvOptFile::documentXml(AllOptions& options) {
     std::u16string result;
-    result.reserve(1 << 16);
-    AssetXmlWriter writer(result);
-    writer.openRoot(u"orvopt");
-    options.writeXml(writer, std::u16string());
-    writer.closeRoot();
+    StringSink sink(result);
+    writeOptionsDocument(options, sink);
+    return result;
+}
+
+std::u16string OrvMatFile::getXml(std::u16string path) {
+    std::u16string result;
+    StringSink sink(result);
+    writeMaterialDocument(path, sink);
     return result;
 }
 
 std::u16string OrvOptFile::getXml(std::u16string path) {
-    OrvOptFile file;
-    AllOptions options;
-    if (file.load(options, path)) return documentXml(options);
-    return readFileAsText(path);
+    std::u16string result;
+    StringSink sink(result);
+    writeOptionsDocument(path, sink);
+    return result;
 }
 
 }  // namespace OrvaneLumoCore

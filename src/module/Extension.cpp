@@ -3,6 +3,7 @@
 #include "persistence/OrvMatFile.h"
 #include "persistence/OrvOptFile.h"
 #include "platform/WideChar.h"
+#include "xml/XmlSink.h"
 
 namespace OrvaneLumoCore {
 
@@ -15,17 +16,29 @@ bool hasExtension(const std::u16string& path, const std::u16string& first,
 }
 
 std::u16string convertMaterialPath(const std::u16string& path, bool& ok) {
-    ok = hasExtension(path, u"orvmat", u"lumat");
-    if (!ok) return std::u16string();
-    OrvMatFile file;
-    return file.getXml(path);
+    std::u16string result;
+    StringSink sink(result);
+    ok = convertMaterialPath(path, sink);
+    return result;
 }
 
 std::u16string convertOptionsPath(const std::u16string& path, bool& ok) {
-    ok = hasExtension(path, u"orvopt", u"luopt");
-    if (!ok) return std::u16string();
-    OrvOptFile file;
-    return file.getXml(path);
+    std::u16string result;
+    StringSink sink(result);
+    ok = convertOptionsPath(path, sink);
+    return result;
+}
+
+bool convertMaterialPath(const std::u16string& path, XmlSink& sink) {
+    if (!hasExtension(path, u"orvmat", u"lumat")) return false;
+    writeMaterialDocument(path, sink);
+    return true;
+}
+
+bool convertOptionsPath(const std::u16string& path, XmlSink& sink) {
+    if (!hasExtension(path, u"orvopt", u"luopt")) return false;
+    writeOptionsDocument(path, sink);
+    return true;
 }
 
 }  // namespace OrvaneLumoCore

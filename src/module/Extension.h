@@ -1,7 +1,12 @@
 #pragma once
 #include <string>
 
+class XmlSink;
+
 namespace OrvaneLumoCore {
+
+class AllOptions;
+class OrvMatFile;
 
 // True if the text behind the last "." of the whole path (directory
 // separators included) equals `first` or `second`, ignoring case.
@@ -12,5 +17,20 @@ bool hasExtension(const std::u16string& path, const std::u16string& first,
 // file's document. `ok` is false when the extension is refused.
 std::u16string convertMaterialPath(const std::u16string& path, bool& ok);
 std::u16string convertOptionsPath(const std::u16string& path, bool& ok);
+
+// The same into a sink of the caller: the document (or the text of a file
+// that doesn't load) goes to `sink` in pieces, in order, and is complete
+// when the call returns. False, with nothing written, when the extension is
+// refused.
+bool convertMaterialPath(const std::u16string& path, XmlSink& sink);
+bool convertOptionsPath(const std::u16string& path, XmlSink& sink);
+
+// The drivers behind them, without the extension test.
+void writeMaterialDocument(const std::u16string& path, XmlSink& sink);
+void writeOptionsDocument(const std::u16string& path, XmlSink& sink);
+
+// The document of what is loaded already.
+void writeMaterialsDocument(const OrvMatFile& file, XmlSink& sink);
+void writeOptionsDocument(AllOptions& options, XmlSink& sink);
 
 }  // namespace OrvaneLumoCore

@@ -23,6 +23,22 @@ WriterText::WriterText(const char16_t* s) : wide_(s) {
         while (s[size_]) ++size_;
 }
 
+namespace {
+
+// Widens plain ASCII into `out`; false (with `out` partly written) if the
+// text has a byte beyond ASCII.
+bool widenAscii(const char* text, std::size_t size, char16_t* out) {
+    unsigned char any = 0;
+    for (std::size_t i = 0; i < size; ++i) {
+        const unsigned char c = static_cast<unsigned char>(text[i]);
+        any |= c;
+        out[i] = c;
+    }
+    return any < 0x80;
+}
+
+}  // namespace
+
 void WriterText::appendTo(std::u16string& out) const {
     if (wide_) {
         out.append(wide_, size_);
@@ -30,453 +46,546 @@ void WriterText::appendTo(std::u16string& out) const {
     }
     // Narrow text: plain ASCII widens unit by unit; anything else goes
     // through the system's conversion (UTF-8, else the ANSI code page).
-    for (std::size_t i = 0; i < size_; ++i) {
-        if (static_cast<unsigned char>(narrow_[i]) >= 0x80) {
-            out += utf8ToWide(narrow_, size_);
-            return;
-        }
+    const std::size_t old = out.size();
+    out.resize(old + size_);
+    if (!widenAscii(narrow_, size_, &out[old])) {
+        out.resize(old);
+        out += utf8ToWide(narrow_, size_);
     }
-    for (std::size_t i = 0; i < size_; ++i) out.push_back(static_cast<char16_t>(narrow_[i]));
 }
 
 // ---- escapeXml ---------------------------------------------------------------
 
 namespace {
 
-// One pass from left to right; the search goes on behind the inserted text.
-void replaceAll(std::u16string& s, const std::u16string& from, const std::u16string& to) {
-    std::size_t pos = s.find(from);
-    while (pos != std::u16string::npos) {
-        s.replace(pos, from.size(), to);
-        pos = s.find(from, pos + to.size());
+// The length of the escape "&lt;", "&gt;" or "&amp;" at `p`, or 0.
+std::size_t entityAt(const char16_t* p, const char16_t* end) {
+    const std::size_t left = static_cast<std::size_t>(end - p);
+    if (left >= 4 && (p[1] == u'l' || p[1] == u'g') && p[2] == u't' && p[3] == u';') return 4;
+    if (left >= 5 && p[1] == u'a' && p[2] == u'm' && p[3] == u'p' && p[4] == u';') return 5;
+    return 0;
+}
+
+// Calls put(text, size) for the escaped text: each run of plain units at
+// once, then an escape. Undoing the three escapes and escaping again, as
+// `normalize` asks, leaves an escape that is there unchanged, so such an
+// escape is copied as it stands and only a bare "&" becomes "&amp;".
+template <class Put>
+void escapeRuns(const char16_t* text, std::size_t size, bool normalize, Put put) {
+    const char16_t* const end = text + size;
+    const char16_t* run = text;
+    for (const char16_t* p = text; p != end; ++p) {
+        const char16_t c = *p;
+        if (c > u'>' || (c != u'&' && c != u'<' && c != u'>')) continue;
+        put(run, static_cast<std::size_t>(p - run));
+        if (c == u'<') {
+            put(u"&lt;", 4);
+        } else if (c == u'>') {
+            put(u"&gt;", 4);
+        } else if (const std::size_t entity = normalize ? entityAt(p, end) : 0) {
+            put(p, entity);
+            p += entity - 1;
+        } else {
+            put(u"&amp;", 5);
+        }
+        run = p + 1;
     }
+    put(run, static_cast<std::size_t>(end - run));
 }
 
 }  // namespace
 
 std::u16string escapeXml(const std::u16string& text, bool normalize) {
-    if (text.find_first_of(u"&<>") == std::u16string::npos) return text;
-    std::u16string s = text;
-    if (normalize) {
-        replaceAll(s, u"&lt;", u"<");
-        replaceAll(s, u"&gt;", u">");
-        replaceAll(s, u"&amp;", u"&");
+    std::u16string out;
+    out.reserve(text.size());
+    escapeRuns(text.data(), text.size(), normalize,
+               [&out](const char16_t* s, std::size_t n) { out.append(s, n); });
+    return out;
+}
+
+// ---- the buffer ----------------------------------------------------------------
+
+AssetXmlWriter::AssetXmlWriter(std::u16string& out)
+    : sink_(ownSink_), writeThrough_(true), pos_(buffer_), end_(buffer_ + kBufferUnits) {
+    ownSink_.out = &out;
+}
+
+AssetXmlWriter::AssetXmlWriter(XmlSink& sink)
+    : sink_(sink), writeThrough_(false), pos_(buffer_), end_(buffer_ + kBufferUnits) {
+    ownSink_.out = nullptr;
+}
+
+void AssetXmlWriter::flushBuffer() {
+    if (pos_ == buffer_) return;
+    const std::size_t size = static_cast<std::size_t>(pos_ - buffer_);
+    // Emptied first: after a sink that throws, the writer holds nothing.
+    pos_ = buffer_;
+    sink_.flush(buffer_, size);
+}
+
+void AssetXmlWriter::flush() { flushBuffer(); }
+
+void AssetXmlWriter::putLong(const char16_t* text, std::size_t size) {
+    flushBuffer();
+    if (size >= kBufferUnits / 2) {
+        sink_.flush(text, size);
+        return;
     }
-    replaceAll(s, u"&", u"&amp;");
-    replaceAll(s, u"<", u"&lt;");
-    replaceAll(s, u">", u"&gt;");
-    return s;
+    std::copy(text, text + size, pos_);
+    pos_ += size;
+}
+
+void AssetXmlWriter::putText(const WriterText& text) {
+    if (text.wide_) return put(text.wide_, text.size_);
+    if (text.size_ <= kBufferUnits && widenAscii(text.narrow_, text.size_, room(text.size_))) {
+        pos_ += text.size_;
+        return;
+    }
+    const std::u16string wide = utf8ToWide(text.narrow_, text.size_);
+    put(wide.data(), wide.size());
+}
+
+void AssetXmlWriter::putEscaped(const char16_t* text, std::size_t size) {
+    escapeRuns(text, size, true, [this](const char16_t* s, std::size_t n) { put(s, n); });
+}
+
+void AssetXmlWriter::putEscaped(const WriterText& text) {
+    if (text.wide_) return putEscaped(text.wide_, text.size_);
+    std::u16string wide;
+    text.appendTo(wide);
+    putEscaped(wide.data(), wide.size());
+}
+
+namespace {
+// Enough blanks for 64 levels at once.
+const char16_t kBlanks[] =
+    u"                                                                "
+    u"                                                                ";
+const std::size_t kBlankCount = sizeof kBlanks / sizeof kBlanks[0] - 1;
+}  // namespace
+
+void AssetXmlWriter::indentation() {
+    std::size_t n = static_cast<std::size_t>(indent_ > 0 ? indent_ : 0) * 2;
+    for (; n > kBlankCount; n -= kBlankCount) put(kBlanks, kBlankCount);
+    put(kBlanks, n);
+}
+
+void AssetXmlWriter::writeNumber(double value) {
+    pos_ += platform::formatFloat(room(platform::kMaxFloatText), value);
+}
+
+void AssetXmlWriter::writeInt(std::int64_t value) {
+    pos_ += platform::formatInt(room(platform::kMaxIntText), value);
+}
+
+void AssetXmlWriter::numberLine(Word open, double value, Word close) {
+    indentation();
+    put(open);
+    writeNumber(value);
+    put(close);
 }
 
 // ---- structure -----------------------------------------------------------------
 
-AssetXmlWriter::AssetXmlWriter(std::u16string& out) : out_(out) {}
-
-void AssetXmlWriter::indentation() { out_.append(static_cast<std::size_t>(indent_ > 0 ? indent_ : 0) * 2, u' '); }
-
 void AssetXmlWriter::openRoot(const WriterText& name) {
     rootName_.clear();
     name.appendTo(rootName_);
-    out_ += u"<";
-    out_ += rootName_;
-    out_ += u">\n";
+    put(u'<');
+    put(rootName_.data(), rootName_.size());
+    put(u">\n");
+    done();
 }
 
 void AssetXmlWriter::closeRoot() {
-    out_ += u"</";
-    out_ += rootName_;
-    out_ += u">\n";
+    put(u"</");
+    put(rootName_.data(), rootName_.size());
+    put(u">\n");
+    flushBuffer();
 }
 
 void AssetXmlWriter::openAssets() {
     ++indent_;
-    indentation();
-    out_ += u"<Assets>\n";
+    line(u"<Assets>\n");
+    done();
 }
 
 void AssetXmlWriter::closeAssets() {
-    indentation();
-    out_ += u"</Assets>\n";
+    line(u"</Assets>\n");
     --indent_;
+    done();
 }
 
 void AssetXmlWriter::openAsset(const WriterText& url, const WriterText& type, const WriterText& layout) {
     ++indent_;
-    indentation();
-    out_ += u"<Asset layout=\"";
-    layout.appendTo(out_);
-    out_ += u"\" renderer=\"lumo\" type=\"";
-    type.appendTo(out_);
-    out_ += u"\" url=\"";
-    std::u16string u;
-    url.appendTo(u);
-    out_ += escapeXml(u);
-    out_ += u"\" >\n";
+    line(u"<Asset layout=\"");
+    putText(layout);
+    put(u"\" renderer=\"lumo\" type=\"");
+    putText(type);
+    put(u"\" url=\"");
+    putEscaped(url);
+    put(u"\" >\n");
+    done();
 }
 
 void AssetXmlWriter::closeAsset() {
-    indentation();
-    out_ += u"</Asset>\n";
+    line(u"</Asset>\n");
     --indent_;
+    done();
 }
 
 void AssetXmlWriter::openPlugin(const WriterText& name, const WriterText& type) {
     ++indent_;
-    indentation();
-    out_ += u"<plugin>\n";
+    line(u"<plugin>\n");
     ++indent_;
-    indentation();
-    out_ += u"<lumoplugin name=\"";
-    name.appendTo(out_);
-    out_ += u"\" type=\"";
-    type.appendTo(out_);
-    out_ += u"\">\n";
+    line(u"<lumoplugin name=\"");
+    putText(name);
+    put(u"\" type=\"");
+    putText(type);
+    put(u"\">\n");
+    done();
 }
 
 void AssetXmlWriter::closePlugin() {
-    indentation();
-    out_ += u"</lumoplugin>\n";
+    line(u"</lumoplugin>\n");
     --indent_;
-    indentation();
-    out_ += u"</plugin>\n";
+    line(u"</plugin>\n");
     --indent_;
+    done();
 }
 
 void AssetXmlWriter::openParameters() {
     ++indent_;
-    indentation();
-    out_ += u"<parameters>\n";
+    line(u"<parameters>\n");
     ++indent_;
+    done();
 }
 
 void AssetXmlWriter::closeParameters() {
     --indent_;
-    indentation();
-    out_ += u"</parameters>\n";
+    line(u"</parameters>\n");
     --indent_;
+    done();
 }
 
 // ---- building blocks -------------------------------------------------------------
 
+// The parameter head of the fixed forms: `open` holds the text up to the
+// name, `middle` the handler and list type.
+void AssetXmlWriter::head(Word open, const WriterText& name, Word middle, bool isUserData,
+                          const WriterText& label) {
+    line(open);
+    putText(name);
+    put(middle);
+    if (isUserData) put(u" isUserData=\"1\"");
+    put(u" label=\"");
+    putText(label.empty() ? name : label);
+    put(u"\">\n");
+    ++indent_;
+}
+
 void AssetXmlWriter::openParameter(const WriterText& name, const WriterText& type,
                                    const WriterText& label, const WriterText& listType,
                                    bool isUserData, const WriterText& handler) {
-    indentation();
-    out_ += u"<parameter type=\"";
-    type.appendTo(out_);
-    out_ += u"\" name=\"";
-    name.appendTo(out_);
-    out_ += u"\" handler=\"";
-    handler.appendTo(out_);
-    out_ += u"\" listType=\"";
-    listType.appendTo(out_);
-    out_ += u"\"";
-    if (isUserData) out_ += u" isUserData=\"1\"";
-    out_ += u" label=\"";
-    (label.empty() ? name : label).appendTo(out_);
-    out_ += u"\">\n";
+    line(u"<parameter type=\"");
+    putText(type);
+    put(u"\" name=\"");
+    putText(name);
+    put(u"\" handler=\"");
+    putText(handler);
+    put(u"\" listType=\"");
+    putText(listType);
+    put(u'"');
+    if (isUserData) put(u" isUserData=\"1\"");
+    put(u" label=\"");
+    putText(label.empty() ? name : label);
+    put(u"\">\n");
     ++indent_;
+    done();
 }
 
 void AssetXmlWriter::closeParameter() {
     --indent_;
-    indentation();
-    out_ += u"</parameter>\n";
+    line(u"</parameter>\n");
+    done();
 }
 
 void AssetXmlWriter::openValue() {
-    indentation();
-    out_ += u"<value>\n";
+    line(u"<value>\n");
+    done();
 }
 
 void AssetXmlWriter::closeValue() {
-    indentation();
-    out_ += u"</value>\n";
+    line(u"</value>\n");
+    done();
 }
 
 void AssetXmlWriter::openInlineValue() {
-    indentation();
-    out_ += u"<value>";
+    line(u"<value>");
+    done();
 }
 
-void AssetXmlWriter::closeInlineValue() { out_ += u"</value>\n"; }
+void AssetXmlWriter::closeInlineValue() {
+    put(u"</value>\n");
+    done();
+}
 
-void AssetXmlWriter::writeRaw(const WriterText& text) { text.appendTo(out_); }
+void AssetXmlWriter::writeRaw(const WriterText& text) {
+    putText(text);
+    done();
+}
 
-void AssetXmlWriter::writeNumber(double value) { platform::appendFloat(out_, value); }
+// "</value>", the end of the parameter.
+void AssetXmlWriter::inlineEnd() {
+    put(u"</value>\n");
+    --indent_;
+    line(u"</parameter>\n");
+    done();
+}
+
+// "<value>" on a line of its own, the content a level deeper.
+void AssetXmlWriter::blockStart() {
+    line(u"<value>\n");
+    ++indent_;
+}
+
+void AssetXmlWriter::blockEnd() {
+    --indent_;
+    line(u"</value>\n");
+    --indent_;
+    line(u"</parameter>\n");
+    done();
+}
 
 // ---- parameters ------------------------------------------------------------------
 
+namespace {
+const char16_t kPlainMiddle[] = u"\" handler=\"default\" listType=\"none\"";
+}  // namespace
+
 void AssetXmlWriter::writeFloat(const WriterText& name, float value, const WriterText& label,
                                 bool isUserData) {
-    openParameter(name, "float", label, "none", isUserData, "default");
-    openInlineValue();
+    head(u"<parameter type=\"float\" name=\"", name, kPlainMiddle, isUserData, label);
+    line(u"<value>");
     writeNumber(value);
-    closeInlineValue();
-    closeParameter();
+    inlineEnd();
 }
 
 void AssetXmlWriter::writeInteger(const WriterText& name, std::int32_t value,
                                   const WriterText& label, bool isUserData) {
-    openParameter(name, "integer", label, "none", isUserData, "default");
-    openInlineValue();
-    platform::appendInt(out_, value);
-    closeInlineValue();
-    closeParameter();
+    head(u"<parameter type=\"integer\" name=\"", name, kPlainMiddle, isUserData, label);
+    line(u"<value>");
+    writeInt(value);
+    inlineEnd();
 }
 
 void AssetXmlWriter::writeBool(const WriterText& name, bool value, const WriterText& label,
                                bool isUserData) {
-    openParameter(name, "bool", label, "none", isUserData, "default");
-    openInlineValue();
-    out_.push_back(value ? u'1' : u'0');
-    closeInlineValue();
-    closeParameter();
+    head(u"<parameter type=\"bool\" name=\"", name, kPlainMiddle, isUserData, label);
+    line(u"<value>");
+    put(value ? u'1' : u'0');
+    inlineEnd();
 }
 
 void AssetXmlWriter::writeString(const WriterText& name, const WriterText& value,
                                  const WriterText& label, bool isUserData) {
-    openParameter(name, "string", label, "none", isUserData, "default");
-    openInlineValue();
-    value.appendTo(out_);
-    closeInlineValue();
-    closeParameter();
+    head(u"<parameter type=\"string\" name=\"", name, kPlainMiddle, isUserData, label);
+    line(u"<value>");
+    putText(value);
+    inlineEnd();
 }
 
 void AssetXmlWriter::writeFileName(const WriterText& name, const std::u16string& value,
                                    const WriterText& label, bool isUserData) {
-    openParameter(name, "string", label, "none", isUserData, "FileBrowserHandler");
-    openInlineValue();
-    out_ += escapeXml(value);
-    closeInlineValue();
-    closeParameter();
+    head(u"<parameter type=\"string\" name=\"", name,
+         u"\" handler=\"FileBrowserHandler\" listType=\"none\"", isUserData, label);
+    line(u"<value>");
+    putEscaped(value.data(), value.size());
+    inlineEnd();
 }
 
 void AssetXmlWriter::vectorBlock(const Vector& v) {
-    indentation();
-    out_ += u"<vector>\n";
+    line(u"<vector>\n");
     ++indent_;
-    static const char16_t* const kTags[3][2] = {{u"<x>", u"</x>\n"}, {u"<y>", u"</y>\n"},
-                                                {u"<z>", u"</z>\n"}};
-    for (int i = 0; i < 3; ++i) {
-        indentation();
-        out_ += kTags[i][0];
-        writeNumber(v[i]);
-        out_ += kTags[i][1];
-    }
+    numberLine(u"<x>", v[0], u"</x>\n");
+    numberLine(u"<y>", v[1], u"</y>\n");
+    numberLine(u"<z>", v[2], u"</z>\n");
     --indent_;
-    indentation();
-    out_ += u"</vector>\n";
+    line(u"</vector>\n");
 }
 
 void AssetXmlWriter::writeVector(const WriterText& name, const Vector& value, const WriterText& label) {
-    openParameter(name, "vector", label, "none", false, "default");
-    openValue();
-    ++indent_;
+    head(u"<parameter type=\"vector\" name=\"", name, kPlainMiddle, false, label);
+    blockStart();
     vectorBlock(value);
-    --indent_;
-    closeValue();
-    closeParameter();
+    blockEnd();
 }
 
-namespace {
-struct NamedNumber {
-    const char16_t* open;
-    const char16_t* close;
-};
-}  // namespace
-
 void AssetXmlWriter::writeColor(const WriterText& name, const Color& value, const WriterText& label) {
-    openParameter(name, "color", label, "none", false, "default");
-    openValue();
-    ++indent_;
-    const NamedNumber tags[3] = {{u"<r>", u"</r>\n"}, {u"<g>", u"</g>\n"}, {u"<b>", u"</b>\n"}};
-    const float values[3] = {value.r, value.g, value.b};
-    for (int i = 0; i < 3; ++i) {
-        indentation();
-        out_ += tags[i].open;
-        writeNumber(values[i]);
-        out_ += tags[i].close;
-    }
-    --indent_;
-    closeValue();
-    closeParameter();
+    head(u"<parameter type=\"color\" name=\"", name, kPlainMiddle, false, label);
+    blockStart();
+    numberLine(u"<r>", value.r, u"</r>\n");
+    numberLine(u"<g>", value.g, u"</g>\n");
+    numberLine(u"<b>", value.b, u"</b>\n");
+    blockEnd();
 }
 
 void AssetXmlWriter::writeAColor(const WriterText& name, const AColor& value, const WriterText& label) {
-    openParameter(name, "acolor", label, "none", false, "default");
-    openValue();
-    ++indent_;
-    const NamedNumber tags[4] = {
-        {u"<r>", u"</r>\n"}, {u"<g>", u"</g>\n"}, {u"<b>", u"</b>\n"}, {u"<a>", u"</a>\n"}};
-    const float values[4] = {value.r, value.g, value.b, value.a};
-    for (int i = 0; i < 4; ++i) {
-        indentation();
-        out_ += tags[i].open;
-        writeNumber(values[i]);
-        out_ += tags[i].close;
-    }
-    --indent_;
-    closeValue();
-    closeParameter();
+    head(u"<parameter type=\"acolor\" name=\"", name, kPlainMiddle, false, label);
+    blockStart();
+    numberLine(u"<r>", value.r, u"</r>\n");
+    numberLine(u"<g>", value.g, u"</g>\n");
+    numberLine(u"<b>", value.b, u"</b>\n");
+    numberLine(u"<a>", value.a, u"</a>\n");
+    blockEnd();
 }
 
 void AssetXmlWriter::writeMatrix(const WriterText& name, const Matrix& value, const WriterText& label) {
-    openParameter(name, "matrix", label, "none", false, "default");
-    openValue();
-    ++indent_;
-    out_ += u"\n";
-    indentation();
-    out_ += u"<matrix>\n";
+    head(u"<parameter type=\"matrix\" name=\"", name, kPlainMiddle, false, label);
+    blockStart();
+    put(u'\n');
+    line(u"<matrix>\n");
     ++indent_;
     for (const Vector& v : value.m) vectorBlock(v);
     --indent_;
-    indentation();
-    out_ += u"</matrix>\n";
-    --indent_;
-    closeValue();
-    closeParameter();
+    line(u"</matrix>\n");
+    blockEnd();
 }
 
 void AssetXmlWriter::writeTransform(const WriterText& name, const Transform& value,
                                     const WriterText& label) {
-    openParameter(name, "transform", label, "none", false, "default");
-    openValue();
-    ++indent_;
+    head(u"<parameter type=\"transform\" name=\"", name, kPlainMiddle, false, label);
+    blockStart();
     for (const Vector& v : value.m.m) vectorBlock(v);
     vectorBlock(value.offs);
-    --indent_;
-    closeValue();
-    closeParameter();
+    blockEnd();
 }
 
-void AssetXmlWriter::componentLines(const TransformComponents& c) {
-    static const NamedNumber kFloats[9] = {
-        {u"<x_rotation>", u"</x_rotation>\n"}, {u"<y_rotation>", u"</y_rotation>\n"},
-        {u"<z_rotation>", u"</z_rotation>\n"}, {u"<x_scale>", u"</x_scale>\n"},
-        {u"<y_scale>", u"</y_scale>\n"},       {u"<z_scale>", u"</z_scale>\n"},
-        {u"<x_offset>", u"</x_offset>\n"},     {u"<y_offset>", u"</y_offset>\n"},
-        {u"<z_offset>", u"</z_offset>\n"}};
-    static const NamedNumber kMirrors[3] = {{u"<x_mirror>", u"</x_mirror>\n"},
-                                            {u"<y_mirror>", u"</y_mirror>\n"},
-                                            {u"<z_mirror>", u"</z_mirror>\n"}};
-    const Vector* groups[3] = {&c.rotation, &c.scale, &c.offset};
-    for (int i = 0; i < 9; ++i) {
-        indentation();
-        out_ += kFloats[i].open;
-        writeNumber((*groups[i / 3])[i % 3]);
-        out_ += kFloats[i].close;
-    }
+void AssetXmlWriter::componentParameter(Word open, const WriterText& name,
+                                        const TransformComponents& c, const WriterText& label) {
+    head(open, name, kPlainMiddle, false, label);
+    blockStart();
+    numberLine(u"<x_rotation>", c.rotation[0], u"</x_rotation>\n");
+    numberLine(u"<y_rotation>", c.rotation[1], u"</y_rotation>\n");
+    numberLine(u"<z_rotation>", c.rotation[2], u"</z_rotation>\n");
+    numberLine(u"<x_scale>", c.scale[0], u"</x_scale>\n");
+    numberLine(u"<y_scale>", c.scale[1], u"</y_scale>\n");
+    numberLine(u"<z_scale>", c.scale[2], u"</z_scale>\n");
+    numberLine(u"<x_offset>", c.offset[0], u"</x_offset>\n");
+    numberLine(u"<y_offset>", c.offset[1], u"</y_offset>\n");
+    numberLine(u"<z_offset>", c.offset[2], u"</z_offset>\n");
+    const Word mirrors[3][2] = {{u"<x_mirror>", u"</x_mirror>\n"},
+                                {u"<y_mirror>", u"</y_mirror>\n"},
+                                {u"<z_mirror>", u"</z_mirror>\n"}};
     for (int i = 0; i < 3; ++i) {
         indentation();
-        out_ += kMirrors[i].open;
-        platform::appendInt(out_, c.mirror[i]);
-        out_ += kMirrors[i].close;
+        put(mirrors[i][0]);
+        writeInt(c.mirror[i]);
+        put(mirrors[i][1]);
     }
-}
-
-void AssetXmlWriter::componentParameter(const WriterText& name, const WriterText& type,
-                                        const TransformComponents& components,
-                                        const WriterText& label) {
-    openParameter(name, type, label, "none", false, "default");
-    openValue();
-    ++indent_;
-    componentLines(components);
-    --indent_;
-    closeValue();
-    closeParameter();
+    blockEnd();
 }
 
 void AssetXmlWriter::writeComponentMatrix(const WriterText& name, const TransformComponents& components,
                                           const WriterText& label) {
-    componentParameter(name, "componentMatrix", components, label);
+    componentParameter(u"<parameter type=\"componentMatrix\" name=\"", name, components, label);
 }
 
 void AssetXmlWriter::writeComponentTransform(const WriterText& name,
                                              const TransformComponents& components,
                                              const WriterText& label) {
-    componentParameter(name, "componentTransform", components, label);
+    componentParameter(u"<parameter type=\"componentTransform\" name=\"", name, components, label);
 }
 
 void AssetXmlWriter::writePlugin(const WriterText& name, const WriterText& text, const WriterText& label) {
-    openParameter(name, "plugin", label, "none", false, "default");
-    openInlineValue();
-    text.appendTo(out_);
-    closeInlineValue();
-    closeParameter();
+    head(u"<parameter type=\"plugin\" name=\"", name, kPlainMiddle, false, label);
+    line(u"<value>");
+    putText(text);
+    inlineEnd();
 }
 
 namespace {
 
-// The text that refers to the held object's Asset, or false for a null
-// pointer (and for a type outside the six roots, which no caller passes).
-bool referenceText(const boost::any& reference, const std::u16string& url, std::u16string& text) {
-    text = escapeXml(url);
+// Stands for a sun, whose Asset stands under the url itself.
+const std::u16string kUrlItself;
+
+// The name behind the url's "/" in a reference: null if the pointer is null
+// (or of a type outside the six roots, which no caller passes); kUrlItself
+// for a sun.
+const std::u16string* referenceName(const boost::any& reference, std::u16string& scratch) {
     if (auto p = boost::any_cast<boost::shared_ptr<BaseTexture>>(&reference)) {
-        if (!*p) return false;
-        text += u"/" + (*p)->getPluginName();
-    } else if (auto p = boost::any_cast<boost::shared_ptr<BaseMaterial>>(&reference)) {
-        if (!*p) return false;
-        text += u"/" + (*p)->name;
-    } else if (auto p = boost::any_cast<boost::shared_ptr<BaseUVW>>(&reference)) {
-        if (!*p) return false;
-        text += u"/" + (*p)->getPluginName();
-    } else if (auto p = boost::any_cast<boost::shared_ptr<BaseCamera>>(&reference)) {
-        if (!*p) return false;
-        text += u"/" + (*p)->getPluginName();
-    } else if (auto p = boost::any_cast<boost::shared_ptr<BaseBitmap>>(&reference)) {
-        if (!*p) return false;
-        text += u"/" + (*p)->getPluginName();
-    } else if (auto p = boost::any_cast<boost::shared_ptr<BaseLight>>(&reference)) {
-        if (!*p) return false;
-        // A sun's Asset stands under the url itself.
-        if ((*p)->getType() != BaseLight::kSunLightType) text += u"/" + (*p)->getPluginName();
-    } else {
-        return false;
+        if (!*p) return nullptr;
+        return &(scratch = (*p)->getPluginName());
     }
-    return true;
+    if (auto p = boost::any_cast<boost::shared_ptr<BaseMaterial>>(&reference)) {
+        return *p ? &(*p)->name : nullptr;
+    }
+    if (auto p = boost::any_cast<boost::shared_ptr<BaseUVW>>(&reference)) {
+        if (!*p) return nullptr;
+        return &(scratch = (*p)->getPluginName());
+    }
+    if (auto p = boost::any_cast<boost::shared_ptr<BaseCamera>>(&reference)) {
+        if (!*p) return nullptr;
+        return &(scratch = (*p)->getPluginName());
+    }
+    if (auto p = boost::any_cast<boost::shared_ptr<BaseBitmap>>(&reference)) {
+        if (!*p) return nullptr;
+        return &(scratch = (*p)->getPluginName());
+    }
+    if (auto p = boost::any_cast<boost::shared_ptr<BaseLight>>(&reference)) {
+        if (!*p) return nullptr;
+        if ((*p)->getType() == BaseLight::kSunLightType) return &kUrlItself;
+        return &(scratch = (*p)->getPluginName());
+    }
+    return nullptr;
 }
 
 }  // namespace
 
 void AssetXmlWriter::writePluginRef(const WriterText& name, boost::any reference,
                                     const std::u16string& url, const WriterText& label) {
-    openParameter(name, "plugin", label, "none", false, "default");
-    std::u16string text;
-    if (referenceText(reference, url, text)) {
-        openInlineValue();
-        out_ += text;
-        closeInlineValue();
+    head(u"<parameter type=\"plugin\" name=\"", name, kPlainMiddle, false, label);
+    std::u16string scratch;
+    if (const std::u16string* child = referenceName(reference, scratch)) {
+        line(u"<value>");
+        putEscaped(url.data(), url.size());
+        if (child != &kUrlItself) {
+            put(u'/');
+            put(child->data(), child->size());
+        }
+        put(u"</value>\n");
     }
-    closeParameter();
+    --indent_;
+    line(u"</parameter>\n");
+    done();
 }
 
 void AssetXmlWriter::openList(const WriterText& name, const WriterText& listType, const WriterText& label) {
     openParameter(name, "list", label, listType, false, "default");
-    openValue();
-    indentation();
-    out_ += u"<list>\n";
+    line(u"<value>\n");
+    line(u"<list>\n");
     ++indent_;
+    done();
 }
 
 void AssetXmlWriter::writeListEntry(const std::u16string& text) {
-    indentation();
-    out_ += u"<entry>";
-    out_ += escapeXml(text);
-    out_ += u"</entry>\n";
+    line(u"<entry>");
+    putEscaped(text.data(), text.size());
+    put(u"</entry>\n");
+    done();
 }
 
 void AssetXmlWriter::writeStringEntry(const WriterText& text) {
-    indentation();
-    out_ += u"<string>\"";
-    text.appendTo(out_);
-    out_ += u"\"</string>\n";
+    line(u"<string>\"");
+    putText(text);
+    put(u"\"</string>\n");
+    done();
 }
 
 void AssetXmlWriter::closeList() {
     --indent_;
-    indentation();
-    out_ += u"</list>\n";
-    closeValue();
-    closeParameter();
+    line(u"</list>\n");
+    line(u"</value>\n");
+    --indent_;
+    line(u"</parameter>\n");
+    done();
 }

@@ -1,7 +1,8 @@
 #pragma once
 // Writes the result document: a root element, Assets groups, Assets with one
-// plugin each, and parameters of a fixed set of forms. The text goes straight
-// into a wide string, with the writer's own indentation of two blanks a level.
+// plugin each, and parameters of a fixed set of forms, with the writer's own
+// indentation of two blanks a level. The text is made once: fragments go
+// into a small buffer of the writer, and the buffer goes to a sink.
 #include <cstddef>
 #include <cstdint>
 #include <map>
@@ -10,6 +11,7 @@
 #include <boost/any.hpp>
 
 #include "persistence/Types.h"
+#include "xml/XmlSink.h"
 
 namespace OrvaneLumoCore {
 class TransformComponents;
@@ -29,6 +31,8 @@ public:
     void appendTo(std::u16string& out) const;
 
 private:
+    friend class AssetXmlWriter;
+
     const char* narrow_ = nullptr;
     const char16_t* wide_ = nullptr;
     std::size_t size_ = 0;
@@ -36,12 +40,22 @@ private:
 
 // Undoes earlier escapes when `normalize` is set, then escapes "&", "<" and
 // ">" (in that order). Quotation marks and apostrophes stay as they are.
+// One pass: runs of plain text are copied at once.
 std::u16string escapeXml(const std::u16string& text, bool normalize = true);
 
 class AssetXmlWriter {
 public:
-    // `out` is the result text; it must outlive the writer.
+    // `out` is the result text; it must outlive the writer. The text is
+    // appended as each call returns, so `out` is complete between calls.
     explicit AssetXmlWriter(std::u16string& out);
+    // The text goes to `sink` whenever the buffer is full, at closeRoot and at
+    // flush; `sink` must outlive the writer.
+    explicit AssetXmlWriter(XmlSink& sink);
+    AssetXmlWriter(const AssetXmlWriter&) = delete;
+    AssetXmlWriter& operator=(const AssetXmlWriter&) = delete;
+
+    // Hands what the buffer holds to the sink.
+    void flush();
 
     // Map from a sun's id to the url of the Asset it was written under.
     std::map<std::u16string, std::u16string> sunRegistry;
@@ -109,16 +123,74 @@ public:
 
     int getIndent() const { return indent_; }
 
+    // Units the writer buffers before it hands them to its sink.
+    static constexpr std::size_t kBufferUnits = 4096;
+
+    // A fixed word of the vocabulary, with its length known when compiled.
+    struct Word {
+        template <std::size_t N>
+        constexpr Word(const char16_t (&s)[N]) : text(s), size(N - 1) {}
+        const char16_t* text;
+        std::size_t size;
+    };
+
 private:
+    // ---- the buffer
+    void put(const char16_t* text, std::size_t size) {
+        if (static_cast<std::size_t>(end_ - pos_) < size) return putLong(text, size);
+        for (std::size_t i = 0; i < size; ++i) pos_[i] = text[i];
+        pos_ += size;
+    }
+    void put(Word w) { put(w.text, w.size); }
+    void putText(const WriterText& text);
+    void put(char16_t c) {
+        if (pos_ == end_) flushBuffer();
+        *pos_++ = c;
+    }
+    void putLong(const char16_t* text, std::size_t size);
+    void putEscaped(const char16_t* text, std::size_t size);
+    void putEscaped(const WriterText& text);
+    // Room for `size` (at most kBufferUnits) units at pos_.
+    char16_t* room(std::size_t size) {
+        if (static_cast<std::size_t>(end_ - pos_) < size) flushBuffer();
+        return pos_;
+    }
+    void flushBuffer();
+    // The end of a public call: a writer over a string brings it up to date.
+    void done() {
+        if (writeThrough_) flushBuffer();
+    }
+
+    // ---- pieces of the text
     void indentation();
+    void line(Word w) {
+        indentation();
+        put(w);
+    }
     void writeNumber(double value);
+    void writeInt(std::int64_t value);
+    void numberLine(Word open, double value, Word close);
+    void head(Word open, const WriterText& name, Word middle, bool isUserData, const WriterText& label);
+    void inlineEnd();
+    void blockStart();
+    void blockEnd();
     void vectorBlock(const OrvaneLumoCore::Vector& v);
-    void componentLines(const OrvaneLumoCore::TransformComponents& c);
-    void componentParameter(const WriterText& name, const WriterText& type,
+    void componentParameter(Word open, const WriterText& name,
                             const OrvaneLumoCore::TransformComponents& components,
                             const WriterText& label);
 
-    std::u16string& out_;
+    // The sink of a writer over a string.
+    struct OwnString final : XmlSink {
+        std::u16string* out;
+        void flush(const char16_t* text, std::size_t size) override { out->append(text, size); }
+    };
+
+    OwnString ownSink_;
+    XmlSink& sink_;
+    const bool writeThrough_;
     int indent_ = 0;
     std::u16string rootName_;
+    char16_t* pos_;
+    char16_t* end_;
+    char16_t buffer_[kBufferUnits];
 };

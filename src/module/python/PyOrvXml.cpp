@@ -4,9 +4,9 @@
 #include <Python.h>
 
 #include <string>
-#include <vector>
 
 #include "module/Extension.h"
+#include "module/python/ResultSink.h"
 
 namespace {
 
@@ -30,25 +30,7 @@ std::u16string fromPython(const Py_UNICODE* text) {
     return out;
 }
 
-std::vector<Py_UNICODE> toPython(const std::u16string& text) {
-    std::vector<Py_UNICODE> out;
-    out.reserve(text.size() + 1);
-    for (std::size_t i = 0; i < text.size(); ++i) {
-        const char16_t c = text[i];
-        if (sizeof(Py_UNICODE) > 2 && c >= 0xD800 && c <= 0xDBFF && i + 1 < text.size() &&
-            text[i + 1] >= 0xDC00 && text[i + 1] <= 0xDFFF) {
-            out.push_back(static_cast<Py_UNICODE>(0x10000 + ((c - 0xD800) << 10) +
-                                                  (text[i + 1] - 0xDC00)));
-            ++i;
-        } else {
-            out.push_back(static_cast<Py_UNICODE>(c));
-        }
-    }
-    out.push_back(0);
-    return out;
-}
-
-typedef std::u16string (*Conversion)(const std::u16string&, bool&);
+typedef bool (*Conversion)(const std::u16string&, XmlSink&);
 
 // Shared body of both functions. A refused extension returns NULL without an
 // exception, which the interpreter reports as a SystemError of its own.
@@ -57,11 +39,9 @@ PyObject* convert(PyObject* args, Conversion conversion) {
     Py_UNICODE* text = NULL;
     if (!PyArg_ParseTuple(args, "u", &text)) return NULL;
     const std::u16string path = fromPython(text);
-    bool accepted = false;
-    const std::u16string xml = conversion(path, accepted);
-    if (!accepted) return NULL;
-    std::vector<Py_UNICODE> unicode = toPython(xml);
-    result = Py_BuildValue("u", &unicode[0]);
+    pyorvxml::ResultSink sink;
+    if (!conversion(path, sink)) return NULL;
+    result = sink.release();
     return result;
 }
 
