@@ -86,7 +86,7 @@ class Install(unittest.TestCase):
             meta = wheel.read(info + 'METADATA').decode('utf-8')
             self.assertIn('\nName: PyOrvXml\n', meta)
             self.assertIn('\nVersion: %s\n' % version, meta)
-            self.assertEqual(wheel.getinfo(module_name).external_attr >> 16, 0o755)
+            self.assertEqual(wheel.getinfo(module_name).external_attr >> 16, 0o100755)
             with open(STUB, 'rb') as f:
                 self.assertEqual(wheel.read('PyOrvXml.pyi'), f.read())
 

@@ -156,7 +156,7 @@ def write_wheel(path, files):
     with zipfile.ZipFile(path, 'w', zipfile.ZIP_DEFLATED) as wheel:
         for name, data, executable in files:
             entry = zipfile.ZipInfo(name, date_time=(1980, 1, 1, 0, 0, 0))
-            entry.external_attr = (0o755 if executable else 0o644) << 16
+            entry.external_attr = (0o100755 if executable else 0o100644) << 16  # regular file
             entry.compress_type = zipfile.ZIP_DEFLATED
             wheel.writestr(entry, data)
 
