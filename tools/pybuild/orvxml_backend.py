@@ -97,7 +97,11 @@ def run(command, log):
     """Runs a build step with its output into the log; shows the log if it fails."""
     log.write(('$ ' + ' '.join(command) + '\n').encode('utf-8'))
     log.flush()
-    if subprocess.call(command, stdout=log, stderr=subprocess.STDOUT) != 0:
+    try:
+        status = subprocess.call(command, stdout=log, stderr=subprocess.STDOUT)
+    except OSError as e:
+        raise RuntimeError('%s: %s (is it installed and on the PATH?)' % (command[0], e))
+    if status != 0:
         log.seek(0)
         sys.stderr.write(log.read().decode('utf-8', 'replace'))
         raise RuntimeError('the build failed: ' + ' '.join(command))
@@ -115,7 +119,10 @@ def build(folder, log):
     """Configures and builds into folder; gives [(role, file)] for the wheel."""
     major = 'python%d' % sys.version_info[0]
     include = sysconfig.get_paths()['include']
-    configure = ['cmake', '-S', ROOT, '-B', folder, '-DCMAKE_BUILD_TYPE=Release',
+    # The build type of the tested build folder, so the code is the same; the
+    # debug information is stripped when linking.
+    configure = ['cmake', '-S', ROOT, '-B', folder, '-DCMAKE_BUILD_TYPE=RelWithDebInfo',
+                 '-DCMAKE_MODULE_LINKER_FLAGS=-s', '-DCMAKE_EXE_LINKER_FLAGS=-s',
                  '-DORVXML_BUILD_TESTS=OFF', '-DORVXML_BUILD_BENCH=OFF']
     if sys.version_info[0] >= 3:
         configure += ['-DORVXML_BUILD_MODULE=OFF', '-DORVXML_BUILD_MODULE3=ON',
