@@ -3,6 +3,7 @@
 and text that matches Python 2.7's to the code point."""
 import os
 import pathlib
+import sys
 import unittest
 
 from support import (BUILD, SOURCE, ScratchTest, PyOrvXml, convert_elsewhere, convert_here,
@@ -23,6 +24,18 @@ class Arguments(ScratchTest):
         for arg in (path, pathlib.Path(path), pathlib.PurePosixPath(path), PathLike(path)):
             self.assertEqual(PyOrvXml.getOrvmatXml(arg), '<a/>')
             self.assertIs(type(PyOrvXml.getOrvmatXml(arg)), str)
+
+    def test_no_reference_to_the_path_is_kept(self):
+        path = self.write('a.orvmat', b'<a/>')
+        for arg, function in ((path, PyOrvXml.getOrvmatXml), (path.encode(), PyOrvXml.getOrvmatXml),
+                              (path, PyOrvXml.getOrvoptXml), (path + '\0', PyOrvXml.getOrvmatXml)):
+            before = sys.getrefcount(arg)
+            for _ in range(100):
+                try:
+                    function(PathLike(arg))
+                except (TypeError, SystemError, ValueError):
+                    pass
+            self.assertEqual(sys.getrefcount(arg), before, repr(arg))
 
     def test_bytes_are_refused(self):
         path = self.write('a.orvopt', b'<a/>')

@@ -34,37 +34,42 @@ const Function kOptions = {"getOrvoptXml", "O:getOrvoptXml", &OrvaneLumoCore::co
 
 #if PY_MAJOR_VERSION >= 3
 
+// Owns one reference, so that no exit from a function leaks it.
+struct Ref {
+    explicit Ref(PyObject* o) : object(o) {}
+    ~Ref() { Py_XDECREF(object); }
+    Ref(const Ref&) = delete;
+    Ref& operator=(const Ref&) = delete;
+    PyObject* object;
+};
+
 // The path: a str, or an os.PathLike that gives a str. Its UTF-16 form keeps
 // lone surrogates (such as those os.fsdecode makes of undecodable bytes) as
 // they are, which is what 2.7 hands the library for the same text.
 bool pathArgument(PyObject* args, const Function& f, std::u16string& path) {
     PyObject* arg = NULL;
     if (!PyArg_ParseTuple(args, f.format, &arg)) return false;
-    PyObject* text = PyOS_FSPath(arg);
-    if (text == NULL) return false;
-    if (!PyUnicode_Check(text)) {
+    Ref text(PyOS_FSPath(arg));
+    if (text.object == NULL) return false;
+    if (!PyUnicode_Check(text.object)) {
         // PyOS_FSPath gives str or bytes, or has raised TypeError itself.
         PyErr_Format(PyExc_TypeError, "%s() takes a str or an os.PathLike giving str, not bytes",
                      f.name);
-        Py_DECREF(text);
         return false;
     }
-    PyObject* utf16 = PyUnicode_AsEncodedString(text, "utf-16-le", "surrogatepass");
-    Py_DECREF(text);
-    if (utf16 == NULL) return false;
+    Ref utf16(PyUnicode_AsEncodedString(text.object, "utf-16-le", "surrogatepass"));
     char* data = NULL;
     Py_ssize_t size = 0;
-    bool ok = PyBytes_AsStringAndSize(utf16, &data, &size) == 0;
-    if (ok) {
-        path.resize(static_cast<std::size_t>(size) / 2);
-        if (!path.empty()) std::memcpy(&path[0], data, path.size() * 2);
-        if (path.find(u'\0') != std::u16string::npos) {
-            PyErr_Format(PyExc_ValueError, "%s(): embedded null character in path", f.name);
-            ok = false;
-        }
+    if (utf16.object == NULL || PyBytes_AsStringAndSize(utf16.object, &data, &size) < 0) {
+        return false;
     }
-    Py_DECREF(utf16);
-    return ok;
+    path.resize(static_cast<std::size_t>(size) / 2);
+    if (!path.empty()) std::memcpy(&path[0], data, path.size() * 2);
+    if (path.find(u'\0') != std::u16string::npos) {
+        PyErr_Format(PyExc_ValueError, "%s(): embedded null character in path", f.name);
+        return false;
+    }
+    return true;
 }
 
 PyObject* refusedExtension(const Function& f) {
