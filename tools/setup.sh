@@ -28,3 +28,12 @@ else
   echo "CPython 2.7 with headers is needed (pyenv install 2.7.18)" >&2
   exit 1
 fi
+
+# CPython 3 with headers, under pyenv: the tests run the module under 3.8 and 3.13.
+pyenv_root="$( (pyenv root || "$HOME/.pyenv/bin/pyenv" root) 2>/dev/null || echo "${PYENV_ROOT:-$HOME/.pyenv}")"
+for v in 3.8 3.13; do
+  if ! ls "$pyenv_root"/versions/$v.*/include/python$v/Python.h >/dev/null 2>&1; then
+    echo "CPython $v with headers is needed (pyenv install 3.8.18 3.13.0)" >&2
+    exit 1
+  fi
+done

@@ -1,5 +1,5 @@
 # -*- coding: utf-8 -*-
-"""Whole conversions through the interpreter, on the bundled sample files."""
+"""Whole conversions through the interpreter (2.7 or 3), on the bundled sample files."""
 import os
 import re
 import shutil
@@ -8,14 +8,7 @@ import sys
 import tempfile
 import unittest
 
-sys.path.insert(0, os.environ.get('ORVXML_BUILD_DIR', 'build'))
-import PyOrvXml  # noqa: E402
-
-EXAMPLES = os.path.join(os.environ.get('ORVXML_SOURCE_DIR', '.'), 'examples')
-
-
-def example(name):
-    return os.path.join(EXAMPLES, name).decode('utf-8')
+from support import EXAMPLES, example, read, text, PyOrvXml
 
 
 class MaterialDocuments(unittest.TestCase):
@@ -41,7 +34,7 @@ class MaterialDocuments(unittest.TestCase):
             src = os.path.join(EXAMPLES, 'materials_all_layers.orvmat')
             dst = os.path.join(tmp, 'copy.LUMAT')
             shutil.copy(src, dst)
-            self.assertEqual(PyOrvXml.getOrvmatXml(dst.decode('utf-8')),
+            self.assertEqual(PyOrvXml.getOrvmatXml(text(dst)),
                              PyOrvXml.getOrvmatXml(example('materials_all_layers.orvmat')))
         finally:
             shutil.rmtree(tmp)
@@ -49,11 +42,12 @@ class MaterialDocuments(unittest.TestCase):
     def test_damaged_record_takes_the_text_road(self):
         tmp = tempfile.mkdtemp()
         try:
-            data = open(os.path.join(EXAMPLES, 'materials_all_layers.orvmat'), 'rb').read()
+            data = read(os.path.join(EXAMPLES, 'materials_all_layers.orvmat'))
             bad = os.path.join(tmp, 'bad.orvmat')
             # Break the first material's version tag (behind header, block count, type tag).
-            open(bad, 'wb').write(data[:18] + '\x07\x00' + data[20:])
-            self.assertEqual(PyOrvXml.getOrvmatXml(bad.decode('utf-8')), u'')
+            with open(bad, 'wb') as f:
+                f.write(data[:18] + b'\x07\x00' + data[20:])
+            self.assertEqual(PyOrvXml.getOrvmatXml(text(bad)), u'')
         finally:
             shutil.rmtree(tmp)
 
@@ -62,18 +56,19 @@ class DocumentSun(unittest.TestCase):
     SCRIPT = """
 import PyOrvXml, re, sys
 def sun(name):
-    xml = PyOrvXml.getOrvmatXml((sys.argv[1] + '/' + name).decode('utf-8'))
+    path = sys.argv[1] + '/' + name
+    xml = PyOrvXml.getOrvmatXml(path if sys.version_info[0] >= 3 else path.decode('utf-8'))
     return re.search(r'name="sun"[^\\n]*\\n *<value>([^<]*)<', xml).group(1)
 first = sun('textures_sky_document_sun_2.orvmat')
 sun('textures_sky_document_sun_1.orvmat')
-print first + '|' + sun('textures_sky_document_sun_2.orvmat')
+sys.stdout.write(first + '|' + sun('textures_sky_document_sun_2.orvmat'))
 """
 
     def test_a_version_3_sky_replaces_the_document_sun_for_later_calls(self):
         # A fresh interpreter: the document sun lives as long as the process.
         out = subprocess.check_output([sys.executable, '-c', self.SCRIPT, EXAMPLES],
                                       env=dict(os.environ, PYTHONPATH=sys.path[0]))
-        before, after = out.strip().split('|')
+        before, after = out.decode('utf-8').split('|')
         self.assertEqual(before, '/Rhino Document Sun')
         self.assertNotEqual(after, before)
         self.assertTrue(after.startswith('/{'), after)
@@ -101,11 +96,12 @@ class OptionsDocuments(unittest.TestCase):
     def test_damaged_options_file_gives_its_first_character(self):
         tmp = tempfile.mkdtemp()
         try:
-            data = open(os.path.join(EXAMPLES, 'render_settings.orvopt'), 'rb').read()
+            data = read(os.path.join(EXAMPLES, 'render_settings.orvopt'))
             # The tag's low half stays 1; the version (15) is one no file has.
             bad_version = os.path.join(tmp, 'badversion.orvopt')
-            open(bad_version, 'wb').write('\x01\x00\x0f\x00' + data[4:])
-            self.assertEqual(PyOrvXml.getOrvoptXml(bad_version.decode('utf-8')), u'\x01')
+            with open(bad_version, 'wb') as f:
+                f.write(b'\x01\x00\x0f\x00' + data[4:])
+            self.assertEqual(PyOrvXml.getOrvoptXml(text(bad_version)), u'\x01')
         finally:
             shutil.rmtree(tmp)
 

@@ -1,0 +1,56 @@
+# -*- coding: utf-8 -*-
+"""Running out of memory inside a conversion is the interpreter's MemoryError,
+and the interpreter goes on: tried in a child interpreter under an address
+space limit."""
+import os
+import struct
+import subprocess
+import sys
+import unittest
+
+from support import BUILD, EXAMPLES, ScratchTest, example, read, PyOrvXml
+
+CHILD = """
+import resource, sys
+import PyOrvXml
+big, small = [p if sys.version_info[0] >= 3 else p.decode('utf-8') for p in sys.argv[1:3]]
+limit = int(sys.argv[3]) << 20
+resource.setrlimit(resource.RLIMIT_AS, (limit, limit))
+for attempt in range(2):
+    try:
+        PyOrvXml.getOrvmatXml(big)
+        sys.stdout.write('converted ')
+    except MemoryError:
+        sys.stdout.write('MemoryError ')
+sys.stdout.write('%d' % len(PyOrvXml.getOrvmatXml(small)))
+"""
+
+
+class MemoryLimit(ScratchTest):
+    def large_library(self, copies):
+        """The materials of a version 2 example, over and over: a few MB of
+        file that give hundreds of MB of XML."""
+        data = read(os.path.join(EXAMPLES, 'materials_old_records_v2.orvmat'))
+        count = struct.unpack('<I', data[4:8])[0]
+        return self.write('large.orvmat',
+                          data[:4] + struct.pack('<I', count * copies) + data[8:] * copies)
+
+    def test_allocation_failure_raises_and_the_next_call_works(self):
+        big = self.large_library(10000)
+        small = example('materials_all_layers.orvmat')
+        out = subprocess.check_output(
+            [sys.executable, '-c', CHILD, big.encode('utf-8'), small.encode('utf-8'), '400'],
+            env=dict(os.environ, PYTHONPATH=BUILD))
+        self.assertEqual(out.decode('ascii').split(),
+                         ['MemoryError', 'MemoryError', str(len(PyOrvXml.getOrvmatXml(small)))])
+
+    def test_the_same_file_converts_without_the_limit(self):
+        # The library is valid: what fails above is memory, not the file.
+        big = self.large_library(200)
+        xml = PyOrvXml.getOrvmatXml(big)
+        self.assertTrue(xml.startswith(u'<orvmat>\n'))
+        self.assertEqual(xml.count(u'\n  <Assets>\n'), 2 * 200)
+
+
+if __name__ == '__main__':
+    unittest.main()

@@ -1,0 +1,218 @@
+# -*- coding: utf-8 -*-
+"""Builds the PyOrvXml wheel through the project's own CMake build.
+
+A PEP 517 build backend (pyproject.toml names it, with backend-path) that
+needs nothing beyond the interpreter and CMake: it configures the project in a
+temporary folder for the interpreter that runs it, builds only the model
+library, that interpreter's module and the command-line program (when the
+project has one), and writes the wheel itself. It runs under CPython 2.7 too,
+where tools/wheel.sh calls it directly:
+
+    python orvxml_backend.py OUTDIR     # prints the path of the wheel
+"""
+from __future__ import print_function
+
+import base64
+import hashlib
+import os
+import re
+import shutil
+import subprocess
+import sys
+import sysconfig
+import tempfile
+import zipfile
+
+ROOT = os.path.dirname(os.path.dirname(os.path.dirname(os.path.abspath(__file__))))
+STUB = os.path.join('src', 'module', 'python', 'PyOrvXml.pyi')
+# The oldest Python 3 the stable-ABI module serves (its Py_LIMITED_API).
+ABI3_VERSION = (3, 8)
+
+
+def project():
+    """The [project] strings of pyproject.toml (name, version, ...)."""
+    fields = {}
+    section = None
+    with open(os.path.join(ROOT, 'pyproject.toml')) as f:
+        for line in f:
+            line = line.strip()
+            if line.startswith('['):
+                section = line
+                continue
+            m = re.match(r'([\w-]+)\s*=\s*"([^"]*)"\s*$', line)
+            if section == '[project]' and m:
+                fields[m.group(1)] = m.group(2)
+    return fields
+
+
+def normalized(name):
+    """The distribution name as wheel and dist-info file names spell it."""
+    return re.sub(r'[-_.]+', '_', name).lower()
+
+
+def tags():
+    """(python, abi, platform) of the wheel for the running interpreter."""
+    if getattr(sys, 'implementation', None) is not None and sys.implementation.name != 'cpython':
+        raise RuntimeError('PyOrvXml builds for CPython only')
+    platform = re.sub(r'[-.]', '_', sysconfig.get_platform())
+    if sys.version_info[0] >= 3:
+        if sys.version_info[:2] < ABI3_VERSION:
+            raise RuntimeError('PyOrvXml needs Python 2.7 or %d.%d and later' % ABI3_VERSION)
+        return 'cp%d%d' % ABI3_VERSION, 'abi3', platform
+    flag = sysconfig.get_config_var
+    abi = 'cp27' + ('d' if flag('Py_DEBUG') else '') + \
+        ('m' if flag('WITH_PYMALLOC') in (None, 1) else '') + \
+        ('u' if sys.maxunicode == 0x10FFFF else '')
+    return 'cp27', abi, platform
+
+
+def wheel_name():
+    meta = project()
+    return '%s-%s-%s.whl' % (normalized(meta['name']), meta['version'], '-'.join(tags()))
+
+
+def metadata_files():
+    """Name and content of METADATA and WHEEL."""
+    meta = project()
+    metadata = ['Metadata-Version: 2.1',
+                'Name: ' + meta['name'],
+                'Version: ' + meta['version']]
+    for key, field in (('description', 'Summary'), ('requires-python', 'Requires-Python'),
+                       ('license', 'License')):
+        if key in meta:
+            metadata.append('%s: %s' % (field, meta[key]))
+    wheel = ['Wheel-Version: 1.0',
+             'Generator: orvxml_backend (%s)' % meta['version'],
+             'Root-Is-Purelib: false',
+             'Tag: ' + '-'.join(tags())]
+    return [('METADATA', '\n'.join(metadata) + '\n'), ('WHEEL', '\n'.join(wheel) + '\n')]
+
+
+def dist_info():
+    meta = project()
+    return '%s-%s.dist-info' % (normalized(meta['name']), meta['version'])
+
+
+def run(command, log):
+    """Runs a build step with its output into the log; shows the log if it fails."""
+    log.write(('$ ' + ' '.join(command) + '\n').encode('utf-8'))
+    log.flush()
+    try:
+        status = subprocess.call(command, stdout=log, stderr=subprocess.STDOUT)
+    except OSError as e:
+        raise RuntimeError('%s: %s (is it installed and on the PATH?)' % (command[0], e))
+    if status != 0:
+        log.seek(0)
+        sys.stderr.write(log.read().decode('utf-8', 'replace'))
+        raise RuntimeError('the build failed: ' + ' '.join(command))
+
+
+def cpu_count():
+    try:
+        return len(os.sched_getaffinity(0))
+    except AttributeError:
+        import multiprocessing
+        return multiprocessing.cpu_count()
+
+
+def build(folder, log):
+    """Configures and builds into folder; gives [(role, file)] for the wheel."""
+    major = 'python%d' % sys.version_info[0]
+    include = sysconfig.get_paths()['include']
+    # The build type of the tested build folder, so the code is the same; the
+    # debug information is stripped when linking.
+    configure = ['cmake', '-S', ROOT, '-B', folder, '-DCMAKE_BUILD_TYPE=RelWithDebInfo',
+                 '-DCMAKE_MODULE_LINKER_FLAGS=-s', '-DCMAKE_EXE_LINKER_FLAGS=-s',
+                 '-DORVXML_BUILD_TESTS=OFF', '-DORVXML_BUILD_BENCH=OFF']
+    if sys.version_info[0] >= 3:
+        configure += ['-DORVXML_BUILD_MODULE=OFF', '-DORVXML_BUILD_MODULE3=ON',
+                      '-DPYTHON3_EXECUTABLE=' + sys.executable]
+    else:
+        configure += ['-DORVXML_BUILD_MODULE=ON', '-DORVXML_BUILD_MODULE3=OFF',
+                      '-DPYTHON27_PREFIX=' + sys.prefix,
+                      '-DPYTHON27_EXECUTABLE=' + sys.executable,
+                      '-DPYTHON27_INCLUDE_DIR=' + include]
+    run(configure, log)
+    contents = []
+    with open(os.path.join(folder, 'wheel-contents.txt')) as f:
+        for line in f:
+            if line.strip():
+                role, target, path = line.split(' ', 2)
+                if role in (major, 'script'):
+                    contents.append((role, target, path.rstrip('\n')))
+    if not any(role == major for role, _, _ in contents):
+        raise RuntimeError('the build has no module for ' + major)
+    targets = [target for _, target, _ in contents]
+    run(['cmake', '--build', folder, '--parallel', str(cpu_count()), '--target'] + targets, log)
+    return [(role, path) for role, _, path in contents]
+
+
+def record_line(name, data):
+    digest = base64.urlsafe_b64encode(hashlib.sha256(data).digest()).rstrip(b'=')
+    return '%s,sha256=%s,%d' % (name, digest.decode('ascii'), len(data))
+
+
+def write_wheel(path, files):
+    """Writes the wheel: files is [(name in the wheel, bytes, executable)]."""
+    info = dist_info()
+    files = list(files) + [(info + '/' + name, text.encode('utf-8'), False)
+                           for name, text in metadata_files()]
+    record = [record_line(name, data) for name, data, _ in files]
+    record.append(info + '/RECORD,,')
+    files.append((info + '/RECORD', ('\n'.join(record) + '\n').encode('utf-8'), False))
+    with zipfile.ZipFile(path, 'w', zipfile.ZIP_DEFLATED) as wheel:
+        for name, data, executable in files:
+            entry = zipfile.ZipInfo(name, date_time=(1980, 1, 1, 0, 0, 0))
+            entry.external_attr = (0o100755 if executable else 0o100644) << 16  # regular file
+            entry.compress_type = zipfile.ZIP_DEFLATED
+            wheel.writestr(entry, data)
+
+
+def read(path):
+    with open(path, 'rb') as f:
+        return f.read()
+
+
+# PEP 517 hooks.
+
+def get_requires_for_build_wheel(config_settings=None):
+    return []
+
+
+def prepare_metadata_for_build_wheel(metadata_directory, config_settings=None):
+    folder = os.path.join(metadata_directory, dist_info())
+    if not os.path.isdir(folder):
+        os.makedirs(folder)
+    for name, text in metadata_files():
+        with open(os.path.join(folder, name), 'wb') as f:
+            f.write(text.encode('utf-8'))
+    return dist_info()
+
+
+def build_wheel(wheel_directory, config_settings=None, metadata_directory=None):
+    folder = tempfile.mkdtemp(prefix='orvxml-wheel-')
+    try:
+        with tempfile.TemporaryFile() as log:
+            built = build(os.path.join(folder, 'build'), log)
+        scripts = '%s-%s.data/scripts/' % (normalized(project()['name']), project()['version'])
+        files = [('PyOrvXml.pyi', read(os.path.join(ROOT, STUB)), False)]
+        for role, path in built:
+            name = os.path.basename(path)
+            if role == 'script':
+                files.append((scripts + name, read(path), True))
+            else:
+                files.append((name, read(path), True))
+        name = wheel_name()
+        if not os.path.isdir(wheel_directory):
+            os.makedirs(wheel_directory)
+        write_wheel(os.path.join(wheel_directory, name), files)
+        return name
+    finally:
+        shutil.rmtree(folder, ignore_errors=True)
+
+
+if __name__ == '__main__':
+    if len(sys.argv) != 2:
+        sys.exit('usage: %s OUTDIR' % sys.argv[0])
+    out = os.path.abspath(sys.argv[1])
+    print(os.path.join(out, build_wheel(out)))
