@@ -36,7 +36,7 @@ class MemoryLimit(ScratchTest):
                           data[:4] + struct.pack('<I', count * copies) + data[8:] * copies)
 
     def test_allocation_failure_raises_and_the_next_call_works(self):
-        big = self.large_library(10000)
+        big = self.large_library(40000)
         small = example('materials_all_layers.orvmat')
         out = subprocess.check_output(
             [sys.executable, '-c', CHILD, big.encode('utf-8'), small.encode('utf-8'), '400'],

@@ -25,8 +25,8 @@ import zipfile
 
 ROOT = os.path.dirname(os.path.dirname(os.path.dirname(os.path.abspath(__file__))))
 STUB = os.path.join('src', 'module', 'python', 'PyOrvXml.pyi')
-# The oldest Python 3 the stable-ABI module serves (its Py_LIMITED_API).
-ABI3_VERSION = (3, 8)
+# The oldest Python 3 the module is built for.
+OLDEST_PYTHON3 = (3, 8)
 
 
 def project():
@@ -56,9 +56,10 @@ def tags():
         raise RuntimeError('PyOrvXml builds for CPython only')
     platform = re.sub(r'[-.]', '_', sysconfig.get_platform())
     if sys.version_info[0] >= 3:
-        if sys.version_info[:2] < ABI3_VERSION:
-            raise RuntimeError('PyOrvXml needs Python 2.7 or %d.%d and later' % ABI3_VERSION)
-        return 'cp%d%d' % ABI3_VERSION, 'abi3', platform
+        if sys.version_info[:2] < OLDEST_PYTHON3:
+            raise RuntimeError('PyOrvXml needs Python 2.7 or %d.%d and later' % OLDEST_PYTHON3)
+        python = 'cp%d%d' % sys.version_info[:2]
+        return python, python + ('d' if sysconfig.get_config_var('Py_DEBUG') else ''), platform
     flag = sysconfig.get_config_var
     abi = 'cp27' + ('d' if flag('Py_DEBUG') else '') + \
         ('m' if flag('WITH_PYMALLOC') in (None, 1) else '') + \

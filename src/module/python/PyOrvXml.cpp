@@ -1,8 +1,8 @@
 // The Python face of the library: two functions and an error class, for
-// CPython 2.7 and, from the same source, for CPython 3.8 and later through the
-// stable ABI (built with Py_LIMITED_API). Everything else happens in the model
-// library; this file only moves the path in and the result out, and keeps C++
-// exceptions from reaching the interpreter.
+// CPython 2.7 and, from the same source, for each CPython from 3.8 on.
+// Everything else happens in the model library; this file only moves the path
+// in and the result out, and keeps C++ exceptions from reaching the
+// interpreter.
 #include <Python.h>
 
 #include <cstring>

@@ -16,7 +16,6 @@
 #include <Python.h>
 
 #include <algorithm>
-#include <cstdint>
 #include <cstdlib>
 #include <cstring>
 #include <new>
@@ -118,83 +117,6 @@ private:
     }
 
     bool ended_;
-    ResultEncoder encoder_;
-};
-
-#elif defined(Py_LIMITED_API)
-
-// The stable ABI has no way into a str's buffer: the text is staged once as
-// UTF-8 (about a byte a character) and the interpreter decodes it. A lone
-// surrogate is staged in the three bytes that "surrogatepass" decodes back.
-class ResultSink final : public XmlSink {
-public:
-    ResultSink() : data_(NULL), size_(0), capacity_(0) {}
-    ~ResultSink() { std::free(data_); }
-    ResultSink(const ResultSink&) = delete;
-    ResultSink& operator=(const ResultSink&) = delete;
-
-    void flush(const char16_t* text, std::size_t size) override {
-        std::uint32_t points[kChunk + 1];
-        while (size > 0) {
-            const std::size_t n = size < kChunk ? size : kChunk;
-            store(points, encoder_.toUtf32(text, n, points));
-            text += n;
-            size -= n;
-        }
-    }
-
-    // The finished string (a new reference), or NULL with an exception set.
-    // The sink is empty afterwards.
-    PyObject* release() {
-        std::uint32_t last[1];
-        store(last, encoder_.finishUtf32(last));
-        PyObject* result =
-            PyUnicode_DecodeUTF8(data_ ? data_ : "", static_cast<Py_ssize_t>(size_), "surrogatepass");
-        std::free(data_);
-        data_ = NULL;
-        size_ = capacity_ = 0;
-        return result;
-    }
-
-private:
-    static const std::size_t kChunk = 4096;
-
-    void store(const std::uint32_t* points, std::size_t n) {
-        if (size_ + 4 * n > capacity_) grow(size_ + 4 * n);
-        char* out = data_ + size_;
-        for (std::size_t i = 0; i < n; ++i) {
-            const std::uint32_t c = points[i];
-            if (c < 0x80) {
-                *out++ = static_cast<char>(c);
-            } else if (c < 0x800) {
-                *out++ = static_cast<char>(0xC0 | (c >> 6));
-                *out++ = static_cast<char>(0x80 | (c & 0x3F));
-            } else if (c < 0x10000) {
-                *out++ = static_cast<char>(0xE0 | (c >> 12));
-                *out++ = static_cast<char>(0x80 | ((c >> 6) & 0x3F));
-                *out++ = static_cast<char>(0x80 | (c & 0x3F));
-            } else {
-                *out++ = static_cast<char>(0xF0 | (c >> 18));
-                *out++ = static_cast<char>(0x80 | ((c >> 12) & 0x3F));
-                *out++ = static_cast<char>(0x80 | ((c >> 6) & 0x3F));
-                *out++ = static_cast<char>(0x80 | (c & 0x3F));
-            }
-        }
-        size_ = static_cast<std::size_t>(out - data_);
-    }
-
-    // On failure data_ is unchanged, and freed by the destructor.
-    void grow(std::size_t needed) {
-        const std::size_t capacity = nextCapacity(capacity_, needed, 1);
-        char* data = static_cast<char*>(std::realloc(data_, capacity));
-        if (data == NULL) throw std::bad_alloc();
-        data_ = data;
-        capacity_ = capacity;
-    }
-
-    char* data_;
-    std::size_t size_;
-    std::size_t capacity_;
     ResultEncoder encoder_;
 };
 
