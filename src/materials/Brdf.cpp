@@ -64,18 +64,15 @@ RecordRow<L> path(TexturePtr L::*texture) {
 // ---- XML parameters --------------------------------------------------------------
 //
 // Plain fields in the form of their type; a texture is referred to by its slot
-// url; two parameters are derived from a field:
+// url; an integer flag is a bool (asFlag); one parameter is derived from a
+// field:
 
 enum ParamHook {
     kFromReflection = 1,  // colour: 1 - reflection per component, 0 where negative
-    kBoolFromInt,         // bool: an integer field tested against 0
 };
 
 template <class L>
 ParamRow<L> fromReflection(const char* name, Color L::*p) { return {name, p, "", false, kFromReflection}; }
-
-template <class L>
-ParamRow<L> boolFromInt(const char* name, std::int32_t L::*p) { return {name, p, "", false, kBoolFromInt}; }
 
 // A texture slot: the field and the word of its url.
 template <class L>
@@ -207,7 +204,6 @@ void writeLayer(const L& layer, AssetXmlWriter& writer, std::u16string url,
         case kFromReflection:
             writer.writeColor(p.name, colorFromReflection(p.field.template get<Color>(layer)));
             break;
-        case kBoolFromInt: writer.writeBool(p.name, p.field.template get<std::int32_t>(layer) != 0); break;
         default: {
             const TexturePtr& texture = textureOf(layer, p);
             writer.writePluginRef(p.name, boost::any(texture), slotPrefix + slotWord(layer, texture, table));
@@ -266,9 +262,9 @@ const LayerLayout<Glass_BRDF>& glassTable() {
             {"transparency", &G::transparency},
             {"fog_color", &G::fog_color},
             {"translucency", &G::translucency},
-            boolFromInt("affect_shadows", &G::affect_shadows),
-            boolFromInt("affect_alpha", &G::affect_alpha),
-            boolFromInt("translucency_on", &G::translucency_on),
+            {"affect_shadows", asFlag(&G::affect_shadows)},
+            {"affect_alpha", asFlag(&G::affect_alpha)},
+            {"translucency_on", asFlag(&G::translucency_on)},
             {"ior", &G::ior},
             {"fog_color_mult", &G::fog_color_mult},
             {"glossiness", &G::glossiness},
@@ -468,7 +464,7 @@ const LayerLayout<Light_BRDF>& lightTable() {
             {"intensity", &E::intensity},
             {"transparency_tex_mult", &E::transparency_tex_mult},
             {"color_tex_mult", &E::color_tex_mult},
-            boolFromInt("doubleSided", &E::doubleSided),
+            {"doubleSided", asFlag(&E::doubleSided)},
             {"color_tex", &E::color_tex},
             {"transparency_tex", &E::transparency_tex},
         };

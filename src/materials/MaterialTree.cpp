@@ -131,27 +131,30 @@ void collectFromMaterial(const MaterialPtr& material, std::vector<std::u16string
 // The one or first child of the classes that findParentMaterial goes
 // through; false for every other class.
 bool firstChildOf(const BaseMaterial& m, MaterialPtr& first) {
-    switch (m.getType()) {
-    case kMaterialBump:
-    case kMaterialLinked:
-    case kMaterialOverrideEnvironment:
-    case kMaterialDisplaced:
-    case kMaterialObjectExclusion:
-    case kMaterialAlphaContribution:
-    case kMaterialToon:
-        break;
-    case kMaterialAngleBlend:
+    if (m.getType() == kMaterialAngleBlend) {
         if (const MaterialAngleBlend* blend = as<MaterialAngleBlend>(m)) first = blend->mtl_one;
         return true;
-    default:
-        return false;
     }
+    if (!isSingleChildWrapper(m.getType())) return false;
     const std::vector<MaterialPtr> children = childMaterials(m);
     if (!children.empty()) first = children.front();
     return true;
 }
 
 }  // namespace
+
+bool isSingleChildWrapper(std::uint32_t type) {
+    switch (type) {
+    case kMaterialBump:
+    case kMaterialLinked:
+    case kMaterialOverrideEnvironment:
+    case kMaterialDisplaced:
+    case kMaterialObjectExclusion:
+    case kMaterialAlphaContribution:
+    case kMaterialToon: return true;
+    default: return false;
+    }
+}
 
 std::vector<MaterialPtr> childMaterials(const BaseMaterial& m) {
     std::vector<MaterialPtr> children;

@@ -3,6 +3,7 @@
 // direct children of a material, the parent of a child, the bitmap files of a
 // whole tree, and whether a material can stand in a plugin reference.
 #include <cstddef>
+#include <cstdint>
 #include <string>
 #include <vector>
 
@@ -16,6 +17,11 @@ namespace OrvaneLumoCore {
 // sub-materials). Empty slots are left out; an instance's material is no
 // child.
 std::vector<MaterialPtr> childMaterials(const BaseMaterial& material);
+
+// True for the classes that wrap one material (bump, linked, environment
+// override, displaced, object exclusion, alpha contribution, toon): the
+// searches through a tree go down through them.
+bool isSingleChildWrapper(std::uint32_t type);
 
 // False for an empty pointer; for a MaterialReference true if its target UUID
 // isn't empty; true for any other material.

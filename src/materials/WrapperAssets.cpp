@@ -138,19 +138,11 @@ std::vector<MaterialPtr> wrapperSearchChildren(const BaseMaterial& m) {
         return target ? std::vector<MaterialPtr>{target} : std::vector<MaterialPtr>();
     }
     switch (m.getType()) {
-    case kMaterialBump:
-    case kMaterialLinked:
-    case kMaterialOverrideEnvironment:
-    case kMaterialDisplaced:
-    case kMaterialObjectExclusion:
-    case kMaterialAlphaContribution:
-    case kMaterialToon:
     case kMaterial2Sided:
     case kMaterialSkp2Sided:
-    case kMaterialAngleBlend:
-        return childMaterials(m);
+    case kMaterialAngleBlend: return childMaterials(m);
     default:  // layered, single, multi and instance end the search
-        return std::vector<MaterialPtr>();
+        return isSingleChildWrapper(m.getType()) ? childMaterials(m) : std::vector<MaterialPtr>();
     }
 }
 

@@ -5,11 +5,58 @@
 // persistence/FieldRows.h); `writeParams` writes a table in order, each in the
 // form that follows from the field's type: bool, integer, float (a double
 // narrowed), color, acolor, vector, transform (a TransformD's offset
-// narrowed), string, and a file name for a path.
+// narrowed), string, and a file name for a path. An integer field that holds
+// a flag is shown as a bool (`asFlag`). A block that shows fields of several
+// holders (C's member objects) reaches one of them with `fieldOf`.
 #include "persistence/FieldRows.h"
 #include "xml/AssetXmlWriter.h"
 
 namespace OrvaneLumoCore {
+
+template <class M>
+struct MemberPointerTraits;
+template <class C, class T>
+struct MemberPointerTraits<T C::*> {
+    using Class = C;
+    using Type = T;
+};
+template <class M>
+using MemberClass = typename MemberPointerTraits<M>::Class;
+template <class M>
+using MemberType = typename MemberPointerTraits<M>::Type;
+
+template <class C>
+struct ParamRow;
+
+// Writes a row whose field lies in a member object of C (see fieldOf).
+template <class C>
+using PartWriter = void (*)(AssetXmlWriter&, const ParamRow<C>&, const C&);
+
+// The field a parameter shows: a field of C, or one of a member object of C.
+template <class C>
+struct ParamField : FieldRef<C> {
+    using FieldRef<C>::FieldRef;
+    constexpr ParamField() = default;
+    constexpr ParamField(const FieldRef<C>& f) : FieldRef<C>(f) {}
+    constexpr ParamField(PartWriter<C> writer) : part(writer) {}
+
+    PartWriter<C> part = nullptr;
+    // An integer shown as a bool: any value but 0 is 1.
+    bool shownAsFlag = false;
+};
+
+template <class C>
+constexpr ParamField<C> asFlag(std::int32_t C::*m) {
+    ParamField<C> f(m);
+    f.shownAsFlag = true;
+    return f;
+}
+template <class C>
+constexpr ParamField<C> asFlag(PartWriter<C> writer) {
+    ParamField<C> f(writer);
+    f.shownAsFlag = true;
+    return f;
+}
 
 // One XML parameter that shows a field. An empty label shows the name. A
 // parameter in a form of its own (a reference to a child's Asset, a value
@@ -17,7 +64,7 @@ namespace OrvaneLumoCore {
 template <class C>
 struct ParamRow {
     const char* name;
-    FieldRef<C> field;
+    ParamField<C> field;
     const char* label = "";
     bool isUserData = false;
     int hook = 0;
@@ -26,9 +73,12 @@ struct ParamRow {
 template <class C>
 void writeParam(AssetXmlWriter& w, const ParamRow<C>& row, const C& obj) {
     using Kind = typename FieldRef<C>::Kind;
-    const FieldRef<C>& f = row.field;
+    const ParamField<C>& f = row.field;
+    if (f.part) return f.part(w, row, obj);
     const char* name = row.name;
     const WriterText label(row.label);
+    if (f.shownAsFlag && f.kind() == Kind::Int)
+        return w.writeBool(name, f.template get<std::int32_t>(obj) != 0, label, row.isUserData);
     switch (f.kind()) {
         case Kind::Bool:
         case Kind::Bool32: w.writeBool(name, f.template get<bool>(obj), label, row.isUserData); break;
@@ -52,6 +102,19 @@ void writeParam(AssetXmlWriter& w, const ParamRow<C>& row, const C& obj) {
         case Kind::Material: break;
     }
 }
+
+// The row `row` of a C shows the field `Field` of its member object `Part`.
+template <class C, class P, P C::*Part, auto Field>
+void writeFieldOfPart(AssetXmlWriter& w, const ParamRow<C>& row, const C& obj) {
+    ParamRow<P> inner{row.name, FieldRef<P>(Field), row.label, row.isUserData};
+    inner.field.shownAsFlag = row.field.shownAsFlag;
+    writeParam(w, inner, obj.*Part);
+}
+
+// The field `Field` of C's member object `Part`, as a row's field:
+// `{"gi_on", asFlag(fieldOf<&Options::params, &Params::gi_on>)}`.
+template <auto Part, auto Field>
+constexpr auto fieldOf = &writeFieldOfPart<MemberClass<decltype(Part)>, MemberType<decltype(Part)>, Part, Field>;
 
 template <class C, class Rows>
 void writeParams(AssetXmlWriter& w, const C& obj, const Rows& rows) {

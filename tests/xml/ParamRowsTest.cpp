@@ -1,0 +1,115 @@
+#include <gtest/gtest.h>
+
+#include <cstdint>
+#include <functional>
+#include <string>
+#include <vector>
+
+#include "xml/ParamRows.h"
+
+using namespace OrvaneLumoCore;
+
+namespace {
+
+struct Inner {
+    std::int32_t flag = 0;
+    std::int32_t count = 0;
+    float weight = 0;
+    std::u16string file;
+};
+
+struct Holder {
+    Inner inner;
+    std::int32_t ownFlag = 0;
+    std::int32_t ownCount = 0;
+    bool on = false;
+    double scale = 0;
+    std::u16string path;
+};
+
+std::u16string written(const std::function<void(AssetXmlWriter&)>& body) {
+    std::u16string out;
+    AssetXmlWriter w(out);
+    body(w);
+    return out;
+}
+
+// Each row of a table against the writer call it stands for, for values
+// that tell the forms apart (a flag of -7 is 1, a count of -7 is -7).
+TEST(ParamRows, EachRowWritesTheFormOfItsField) {
+    Holder h;
+    h.inner.flag = -7;
+    h.inner.count = -7;
+    h.inner.weight = 0.25f;
+    h.inner.file = u"a<b.png";
+    h.ownFlag = 2;
+    h.ownCount = 2;
+    h.on = true;
+    h.scale = 1.5;
+    h.path = u"c&d.exr";
+
+    struct Case {
+        ParamRow<Holder> row;
+        std::function<void(AssetXmlWriter&)> expected;
+    };
+    const Case cases[] = {
+        {{"own_flag", asFlag(&Holder::ownFlag)}, [](AssetXmlWriter& w) { w.writeBool("own_flag", true); }},
+        {{"own_count", &Holder::ownCount}, [](AssetXmlWriter& w) { w.writeInteger("own_count", 2); }},
+        {{"on", &Holder::on, "On", true}, [](AssetXmlWriter& w) { w.writeBool("on", true, "On", true); }},
+        {{"scale", &Holder::scale}, [](AssetXmlWriter& w) { w.writeFloat("scale", 1.5f); }},
+        {{"path", FieldRef<Holder>::path(&Holder::path)},
+         [](AssetXmlWriter& w) { w.writeFileName("path", u"c&d.exr"); }},
+        {{"flag", asFlag(fieldOf<&Holder::inner, &Inner::flag>)},
+         [](AssetXmlWriter& w) { w.writeBool("flag", true); }},
+        {{"count", fieldOf<&Holder::inner, &Inner::count>, "Count", true},
+         [](AssetXmlWriter& w) { w.writeInteger("count", -7, "Count", true); }},
+        {{"weight", fieldOf<&Holder::inner, &Inner::weight>}, [](AssetXmlWriter& w) { w.writeFloat("weight", 0.25f); }},
+        {{"file", FieldRef<Holder>()}, [](AssetXmlWriter&) {}},
+    };
+    for (const Case& c : cases) {
+        SCOPED_TRACE(c.row.name);
+        EXPECT_EQ(written([&](AssetXmlWriter& w) { writeParam(w, c.row, h); }), written(c.expected));
+    }
+}
+
+TEST(ParamRows, AFlagOfZeroIsFalseWhereverItLies) {
+    Holder h;
+    const ParamRow<Holder> rows[] = {
+        {"own", asFlag(&Holder::ownFlag)},
+        {"inner", asFlag(fieldOf<&Holder::inner, &Inner::flag>)},
+    };
+    const std::u16string expected = written([](AssetXmlWriter& w) {
+        w.writeBool("own", false);
+        w.writeBool("inner", false);
+    });
+    EXPECT_EQ(written([&](AssetXmlWriter& w) { writeParams(w, h, rows); }), expected);
+}
+
+// Hook rows go to the hook in table order; the rows around them are written.
+TEST(ParamRows, HookRowsGoToTheHookInOrder) {
+    Holder h;
+    h.ownCount = 4;
+    h.inner.count = 9;
+    const ParamRow<Holder> rows[] = {
+        {"first", &Holder::ownCount},
+        {"hooked", {}, "", false, 3},
+        {"inner", fieldOf<&Holder::inner, &Inner::count>},
+        {"last", {}, "", false, 5},
+    };
+    std::vector<int> hooks;
+    const std::u16string out = written([&](AssetXmlWriter& w) {
+        writeParams(w, h, rows, [&](const ParamRow<Holder>& row) {
+            hooks.push_back(row.hook);
+            w.writeString(row.name, "x");
+        });
+    });
+    EXPECT_EQ(hooks, (std::vector<int>{3, 5}));
+    EXPECT_EQ(out, written([](AssetXmlWriter& w) {
+                  w.writeInteger("first", 4);
+                  w.writeString("hooked", "x");
+                  w.writeInteger("inner", 9);
+                  w.writeString("last", "x");
+              }));
+}
+
+}  // namespace
