@@ -49,14 +49,4 @@ TEST(TextFallback, ALargeFileCostsItsText) {
     EXPECT_LT(extra, 100);
 }
 
-TEST(TextFallback, OnlyRegularFilesHaveText) {
-    TempDir dir;
-    std::filesystem::create_directory(dir.file("folder.orvmat"));
-    ASSERT_EQ(0, ::mkfifo(dir.file("fifo.orvmat").c_str(), 0600));
-    for (const std::string& path : {dir.file("folder.orvmat"), dir.file("fifo.orvmat"), dir.file("missing.orvmat"),
-                                    std::string("/dev/zero"), std::string("/dev/null")}) {
-        EXPECT_EQ(u"", readFileAsText(wide(path))) << path;
-    }
-}
-
 }  // namespace

@@ -56,40 +56,25 @@ TEST(BlockSource, ReadsLikeTheBytesInMemory) {
                 onSource.setReadPosition(to);
             }
             ASSERT_EQ(held.bytesLeft(), onSource.bytesLeft()) << size << " " << step;
+            // Each value starts from the same filling, kept behind the end.
+            std::uint8_t byteA = 0x55, byteB = 0x55;
+            std::uint32_t uintA = 0xDEADBEEF, uintB = 0xDEADBEEF;
+            double realA = 1.5, realB = 1.5;
+            std::string textA, textB;
+            char rawA[16] = {}, rawB[16] = {};
             switch (random() % 5) {
-                case 0: {
-                    std::uint8_t a = 0x55, b = 0x55;
-                    ASSERT_EQ(held.readByte(a), onSource.readByte(b));
-                    ASSERT_EQ(a, b);
-                    break;
-                }
-                case 1: {
-                    std::uint32_t a = 0xDEADBEEF, b = 0xDEADBEEF;  // kept behind the end
-                    held.readUInt(a);
-                    onSource.readUInt(b);
-                    ASSERT_EQ(a, b);
-                    break;
-                }
-                case 2: {
-                    double a = 1.5, b = 1.5;
-                    held.readDouble(a);
-                    onSource.readDouble(b);
-                    ASSERT_EQ(0, std::memcmp(&a, &b, sizeof a));
-                    break;
-                }
-                case 3: {
-                    std::string a, b;
-                    held.readString(a);
-                    onSource.readString(b);
-                    ASSERT_EQ(a, b);
-                    break;
-                }
-                default: {
-                    char a[16] = {}, b[16] = {};
-                    ASSERT_EQ(held.readBytes(a, 16, step % 2 == 0), onSource.readBytes(b, 16, step % 2 == 0));
-                    ASSERT_EQ(0, std::memcmp(a, b, sizeof a));
-                }
+                case 0: ASSERT_EQ(held.readByte(byteA), onSource.readByte(byteB)); break;
+                case 1: held.readUInt(uintA); onSource.readUInt(uintB); break;
+                case 2: held.readDouble(realA); onSource.readDouble(realB); break;
+                case 3: held.readString(textA); onSource.readString(textB); break;
+                default:
+                    ASSERT_EQ(held.readBytes(rawA, 16, step % 2 == 0), onSource.readBytes(rawB, 16, step % 2 == 0));
             }
+            ASSERT_EQ(byteA, byteB);
+            ASSERT_EQ(uintA, uintB);
+            ASSERT_EQ(0, std::memcmp(&realA, &realB, sizeof realA));
+            ASSERT_EQ(textA, textB);
+            ASSERT_EQ(0, std::memcmp(rawA, rawB, sizeof rawA));
             ASSERT_EQ(held.getReadPosition(), onSource.getReadPosition());
         }
     }
