@@ -222,15 +222,7 @@ std::size_t formatFloat(char16_t* out, double value) {
     // A whole number below 10^6 has at most six digits, all of them kept
     // and none rounded: its own digits, with no scaling.
     if (e >= 0 && e <= 20 && m < (std::uint64_t(1) << 20) && (m << e) < 1000000) {
-        std::uint32_t whole = static_cast<std::uint32_t>(m << e);
-        char16_t digits[6];
-        int count = 0;
-        do {
-            digits[count++] = static_cast<char16_t>(u'0' + whole % 10);
-            whole /= 10;
-        } while (whole);
-        while (count > 0) *p++ = digits[--count];
-        return static_cast<std::size_t>(p - out);
+        return static_cast<std::size_t>(p - out) + formatInt(p, static_cast<std::int64_t>(m << e));
     }
 
     // |value| = m * 2^e. Find the decimal exponent whose six digits
