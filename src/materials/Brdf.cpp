@@ -206,7 +206,7 @@ void writeLayer(const L& layer, AssetXmlWriter& writer, std::u16string url,
             break;
         default: {
             const TexturePtr& texture = textureOf(layer, p);
-            writer.writePluginRef(p.name, boost::any(texture), slotPrefix + slotWord(layer, texture, table));
+            writer.writeTextureRef(p.name, texture.get(), slotPrefix, slotWord(layer, texture, table));
         }
         }
     });

@@ -219,6 +219,12 @@ std::size_t formatFloat(char16_t* out, double value) {
     m >>= zeros;
     e += zeros;
 
+    // A whole number below 10^6 has at most six digits, all of them kept
+    // and none rounded: its own digits, with no scaling.
+    if (e >= 0 && e <= 20 && m < (std::uint64_t(1) << 20) && (m << e) < 1000000) {
+        return static_cast<std::size_t>(p - out) + formatInt(p, static_cast<std::int64_t>(m << e));
+    }
+
     // |value| = m * 2^e. Find the decimal exponent whose six digits
     // floor(|value| * 10^(5 - exponent)) lie in [100000, 999999], starting
     // from floor(log10(2) * floor(log2 |value|)).

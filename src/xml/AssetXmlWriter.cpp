@@ -2,6 +2,10 @@
 
 #include <cstring>
 
+#if defined(__SSE2__)
+#include <emmintrin.h>
+#endif
+
 #include "animation/BaseCamera.h"
 #include "animation/TransformComponents.h"
 #include "lights/BaseLight.h"
@@ -28,6 +32,21 @@ namespace {
 // Widens plain ASCII into `out`; false (with `out` partly written) if the
 // text has a byte beyond ASCII.
 bool widenAscii(const char* text, std::size_t size, char16_t* out) {
+#if defined(__SSE2__)
+    // Eight bytes at a time, the last eight overlapping the ones before.
+    if (size >= 8) {
+        const __m128i zero = _mm_setzero_si128();
+        __m128i any = zero;
+        const auto eight = [&](std::size_t i) {
+            const __m128i v = _mm_loadl_epi64(reinterpret_cast<const __m128i*>(text + i));
+            any = _mm_or_si128(any, v);
+            _mm_storeu_si128(reinterpret_cast<__m128i*>(out + i), _mm_unpacklo_epi8(v, zero));
+        };
+        for (std::size_t i = 0; i + 8 < size; i += 8) eight(i);
+        eight(size - 8);
+        return _mm_movemask_epi8(any) == 0;
+    }
+#endif
     unsigned char any = 0;
     for (std::size_t i = 0; i < size; ++i) {
         const unsigned char c = static_cast<unsigned char>(text[i]);
@@ -541,13 +560,19 @@ const std::u16string* referenceName(const boost::any& reference, std::u16string&
 
 }  // namespace
 
-void AssetXmlWriter::writePluginRef(const WriterText& name, boost::any reference,
-                                    const std::u16string& url, const WriterText& label) {
+// A plugin parameter whose value is the child's url, `url` and `urlTail`,
+// then "/" and `child` unless the child stands under the url itself; no
+// value when `child` is null.
+void AssetXmlWriter::pluginRef(const WriterText& name, const WriterText& label,
+                               const std::u16string* child, const std::u16string& url,
+                               const WriterText& urlTail) {
     head(u"<parameter type=\"plugin\" name=\"", name, kPlainMiddle, false, label);
-    std::u16string scratch;
-    if (const std::u16string* child = referenceName(reference, scratch)) {
+    if (child) {
         line(u"<value>");
         putEscaped(url.data(), url.size());
+        // The tail is a slot word, plain letters, so escaping the two parts
+        // one after the other gives what escaping the whole url gives.
+        if (!urlTail.empty()) putEscaped(urlTail);
         if (child != &kUrlItself) {
             put(u'/');
             put(child->data(), child->size());
@@ -557,6 +582,19 @@ void AssetXmlWriter::writePluginRef(const WriterText& name, boost::any reference
     --indent_;
     line(u"</parameter>\n");
     done();
+}
+
+void AssetXmlWriter::writePluginRef(const WriterText& name, const boost::any& reference,
+                                    const std::u16string& url, const WriterText& label) {
+    std::u16string scratch;
+    pluginRef(name, label, referenceName(reference, scratch), url, WriterText());
+}
+
+void AssetXmlWriter::writeTextureRef(const WriterText& name, const BaseTexture* texture,
+                                     const std::u16string& slotPrefix, const char16_t* slotWord) {
+    std::u16string scratch;
+    if (texture) scratch = texture->getPluginName();
+    pluginRef(name, WriterText(), texture ? &scratch : nullptr, slotPrefix, slotWord);
 }
 
 void AssetXmlWriter::openList(const WriterText& name, const WriterText& listType, const WriterText& label) {

@@ -5,6 +5,7 @@
 // into a small buffer of the writer, and the buffer goes to a sink.
 #include <cstddef>
 #include <cstdint>
+#include <cstring>
 #include <map>
 #include <string>
 
@@ -14,6 +15,7 @@
 #include "xml/XmlSink.h"
 
 namespace OrvaneLumoCore {
+class BaseTexture;
 class TransformComponents;
 }
 
@@ -102,8 +104,12 @@ public:
     void writePlugin(const WriterText& name, const WriterText& text, const WriterText& label = {});
     // `reference` holds a boost::shared_ptr of BaseTexture, BaseMaterial,
     // BaseUVW, BaseCamera, BaseBitmap or BaseLight; `url` is the child's slot url.
-    void writePluginRef(const WriterText& name, boost::any reference, const std::u16string& url,
+    void writePluginRef(const WriterText& name, const boost::any& reference, const std::u16string& url,
                         const WriterText& label = {});
+    // The same for a texture in a slot, whose url is `slotPrefix` followed by
+    // `slotWord`: no url string and no boost::any are made per parameter.
+    void writeTextureRef(const WriterText& name, const OrvaneLumoCore::BaseTexture* texture,
+                         const std::u16string& slotPrefix, const char16_t* slotWord);
     void openList(const WriterText& name, const WriterText& listType, const WriterText& label = {});
     void writeListEntry(const std::u16string& text);
     void writeStringEntry(const WriterText& text);
@@ -138,8 +144,25 @@ private:
     // ---- the buffer
     void put(const char16_t* text, std::size_t size) {
         if (static_cast<std::size_t>(end_ - pos_) < size) return putLong(text, size);
-        for (std::size_t i = 0; i < size; ++i) pos_[i] = text[i];
+        copyUnits(pos_, text, size);
         pos_ += size;
+    }
+    // Copies `size` units in moves of 16 bytes, the last one overlapping the
+    // one before, rather than through a call of memmove: most pieces are a
+    // few dozen units.
+    static void copyUnits(char16_t* __restrict out, const char16_t* __restrict text, std::size_t size) {
+        if (size >= 8) {
+            for (std::size_t i = 0; i + 8 < size; i += 8) std::memcpy(out + i, text + i, 16);
+            std::memcpy(out + size - 8, text + size - 8, 16);
+        } else if (size >= 4) {
+            std::memcpy(out, text, 8);
+            std::memcpy(out + size - 4, text + size - 4, 8);
+        } else if (size >= 2) {
+            std::memcpy(out, text, 4);
+            std::memcpy(out + size - 2, text + size - 2, 4);
+        } else if (size == 1) {
+            *out = *text;
+        }
     }
     void put(Word w) { put(w.text, w.size); }
     void putText(const WriterText& text);
@@ -172,6 +195,8 @@ private:
     void numberLine(Word open, double value, Word close);
     void head(Word open, const WriterText& name, Word middle, bool isUserData, const WriterText& label);
     void inlineEnd();
+    void pluginRef(const WriterText& name, const WriterText& label, const std::u16string* child,
+                   const std::u16string& url, const WriterText& urlTail);
     void blockStart();
     void blockEnd();
     void vectorBlock(const OrvaneLumoCore::Vector& v);

@@ -193,6 +193,20 @@ TEST(NumberFormatReference, RandomFloats) {
     for (std::size_t i = 0; i < n; ++i) c.check(std::ldexp(unit(rng), exponent(rng)));
 }
 
+// Whole numbers, which take a road of their own below 10^6: every one up to
+// past the bound, both signs, and powers of two around it.
+TEST(NumberFormatReference, WholeNumbers) {
+    Comparison c;
+    for (int i = 0; i <= 1100000; ++i) {
+        c.check(static_cast<double>(i));
+        c.check(-static_cast<double>(i));
+    }
+    for (int k = 0; k <= 64; ++k) {
+        for (double f : {1.0, 3.0, 0.75, 999999.0, 1000001.0}) c.check(std::ldexp(f, k));
+    }
+    EXPECT_GT(c.checked(), 2200000u);
+}
+
 TEST(NumberFormatReference, RandomDoubles) {
     Comparison c;
     std::mt19937_64 rng(1124);

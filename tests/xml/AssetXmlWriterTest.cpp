@@ -166,6 +166,63 @@ TEST(AssetXmlWriter, PluginReferences) {
               head + I7 + "<value>/L/LightOmni</value>\n" + I6 + "</parameter>\n");
 }
 
+// A texture slot reference gives the text of a plugin reference whose url is
+// the prefix and the slot word joined, escaping included.
+TEST(AssetXmlWriter, TextureSlotReferenceMatchesPluginReference) {
+    const TexturePtr texture(new FakeTexture);
+    const std::u16string prefixes[] = {u"/M/", u"/M&N/", u"/M&amp;/", u"/M&l/", u"/<M>&/", u""};
+    for (const TexturePtr& child : {texture, TexturePtr()}) {
+        for (const std::u16string& prefix : prefixes) {
+            SCOPED_TRACE(narrow(prefix));
+            EXPECT_EQ(param([&](AssetXmlWriter& w) { w.writeTextureRef("tex", child.get(), prefix, u"color_texture"); }),
+                      param([&](AssetXmlWriter& w) {
+                          w.writePluginRef("tex", boost::any(child), prefix + u"color_texture");
+                      }));
+        }
+    }
+}
+
+// Pieces of every length from 0 to 40 units, wide and narrow, with and
+// without a character beyond ASCII at each place, come out unit for unit,
+// also where they cross the end of the writer's buffer.
+TEST(AssetXmlWriter, PiecesOfEveryLength) {
+    for (std::size_t fill : {std::size_t(0), AssetXmlWriter::kBufferUnits - 13}) {
+        for (std::size_t n = 0; n <= 40; ++n) {
+            for (std::size_t wideAt = 0; wideAt <= n; ++wideAt) {
+                std::string utf8;
+                std::u16string expected(fill, u'.');
+                for (std::size_t i = 0; i < n; ++i) {
+                    if (i == wideAt) {
+                        utf8 += "\xc3\xa9";
+                        expected += u'\u00e9';
+                    } else {
+                        utf8 += static_cast<char>('a' + i % 26);
+                        expected += static_cast<char16_t>(u'a' + i % 26);
+                    }
+                }
+                const std::u16string wide = expected.substr(fill);
+                std::u16string viaNarrow, viaWide;
+                {
+                    StringSink sink(viaNarrow);
+                    AssetXmlWriter w(sink);
+                    w.writeRaw(std::u16string(fill, u'.'));
+                    w.writeRaw(utf8);
+                    w.flush();
+                }
+                {
+                    StringSink sink(viaWide);
+                    AssetXmlWriter w(sink);
+                    w.writeRaw(std::u16string(fill, u'.'));
+                    w.writeRaw(wide);
+                    w.flush();
+                }
+                ASSERT_EQ(viaNarrow, expected) << "fill " << fill << ", " << n << " units, wide at " << wideAt;
+                ASSERT_EQ(viaWide, expected) << "fill " << fill << ", " << n << " units";
+            }
+        }
+    }
+}
+
 TEST(AssetXmlWriter, DocumentFrame) {
     std::u16string out;
     AssetXmlWriter w(out);

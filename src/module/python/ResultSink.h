@@ -16,9 +16,14 @@
 #include <Python.h>
 
 #include <algorithm>
+#include <cstdint>
 #include <cstdlib>
 #include <cstring>
 #include <new>
+
+#if defined(__linux__)
+#include <sys/mman.h>
+#endif
 
 #include "xml/UnitConversion.h"
 #include "xml/XmlSink.h"
@@ -61,12 +66,39 @@ protected:
         PyObject* result = object_;
         object_ = NULL;
         size_ = capacity_ = 0;
+        populated_ = 0;
         return result;
     }
+
+    // Makes the pages of the string's buffer up to `bytes` (and a step beyond,
+    // within `capacity` bytes) present before the text is stored there: one
+    // call per step instead of one page fault per page as the writes reach
+    // them. Pages moved by a resize stay present, so the count is an offset
+    // into the buffer. Only large strings, whose buffers are mapped pages of
+    // their own; where the call is not known, the pages fault in as before.
+    void populate(const void* buffer, std::size_t bytes, std::size_t capacity) {
+#if defined(__linux__) && defined(MADV_POPULATE_WRITE)
+        if (bytes <= populated_ || capacity < kPopulateStep) return;
+        const std::uintptr_t page = 4096;
+        const std::uintptr_t data = reinterpret_cast<std::uintptr_t>(buffer);
+        const std::size_t end = std::min(bytes + kPopulateStep, capacity);
+        const std::uintptr_t first = (data + populated_) & ~(page - 1);
+        const std::uintptr_t last = (data + end) & ~(page - 1);
+        if (last > first) madvise(reinterpret_cast<void*>(first), last - first, MADV_POPULATE_WRITE);
+        populated_ = end;
+#else
+        (void)buffer;
+        (void)bytes;
+        (void)capacity;
+#endif
+    }
+
+    static const std::size_t kPopulateStep = std::size_t(2) << 20;
 
     PyObject* object_;
     Py_ssize_t size_;
     Py_ssize_t capacity_;
+    std::size_t populated_ = 0;
 };
 
 #if PY_MAJOR_VERSION < 3
@@ -77,6 +109,8 @@ public:
 
     void flush(const char16_t* text, std::size_t size) override {
         reserve(size_ + ResultEncoder::maxUtf32(size));
+        populate(PyUnicode_AS_UNICODE(object_), (size_ + ResultEncoder::maxUtf32(size)) * sizeof(Py_UNICODE),
+                 static_cast<std::size_t>(capacity_) * sizeof(Py_UNICODE));
         Py_UNICODE* out = PyUnicode_AS_UNICODE(object_) + size_;
         size_ += static_cast<Py_ssize_t>(convert(text, size, out));
     }
@@ -129,6 +163,8 @@ public:
     void flush(const char16_t* text, std::size_t size) override {
         if (limit_ == kWidest) {  // nothing can widen the str any more: straight in
             reserve(static_cast<std::size_t>(size_) + ResultEncoder::maxUtf32(size), kWidest);
+            populate(PyUnicode_DATA(object_), (static_cast<std::size_t>(size_) + ResultEncoder::maxUtf32(size)) * 4,
+                     static_cast<std::size_t>(capacity_) * 4);
             size_ += static_cast<Py_ssize_t>(
                 encoder_.toUtf32(text, size, static_cast<Py_UCS4*>(PyUnicode_DATA(object_)) + size_));
             return;
@@ -172,6 +208,9 @@ private:
         // code points picks the same kind as their largest.
         const Py_UCS4 limit = bits <= 0x7F ? 0x7F : bits <= 0xFF ? 0xFF : bits <= 0xFFFF ? 0xFFFF : kWidest;
         reserve(static_cast<std::size_t>(size_) + n, limit > limit_ ? limit : limit_);
+        const std::size_t kind = PyUnicode_KIND(object_);
+        populate(PyUnicode_DATA(object_), (static_cast<std::size_t>(size_) + n) * kind,
+                 static_cast<std::size_t>(capacity_) * kind);
         void* data = PyUnicode_DATA(object_);
         switch (PyUnicode_KIND(object_)) {
             case PyUnicode_1BYTE_KIND:
@@ -211,6 +250,7 @@ private:
             }
             Py_XDECREF(object_);
             object_ = wider;
+            populated_ = static_cast<std::size_t>(size_) * PyUnicode_KIND(object_);
             limit_ = limit;
             capacity_ = capacity;
         } else {
