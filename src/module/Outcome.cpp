@@ -1,10 +1,6 @@
 #include "module/Outcome.h"
 
-#include <cerrno>
 #include <cstring>
-
-#include <sys/stat.h>
-#include <unistd.h>
 
 #include "lights/SunIesDome.h"
 #include "module/Extension.h"
@@ -50,46 +46,41 @@ std::size_t countBlocks(const std::u16string& document) {
     return n;
 }
 
-// A path the loaders must not open: one that isn't there, can't be read, or
-// isn't a regular file (a folder, a pipe that would block, a device).
-bool refusePath(const std::string& native, ConversionOutcome& out) {
-    struct stat st;
-    if (::stat(native.c_str(), &st) != 0)
-        out.note.fail(LoadRule::CannotOpen, 0, errno);
-    else if (!S_ISREG(st.st_mode))
-        out.note.fail(LoadRule::NotRegularFile, 0);
-    else if (::access(native.c_str(), R_OK) != 0)
-        out.note.fail(LoadRule::CannotOpen, 0, errno);
-    else
-        out.fileSize = static_cast<std::uint64_t>(st.st_size);
-    return out.note.isSet();
-}
-
 }  // namespace
 
 ConversionOutcome convertFile(const std::u16string& path, FileKind kind) {
     ConversionOutcome out;
     resetDocumentSun();
-    if (refusePath(platform::pathToNative(path), out)) return out;
+    // The file is opened once, as the containers open it; a path that isn't
+    // a regular file is never read.
+    platform::RegularFile file;
+    if (!file.open(path)) {
+        if (file.notRegular())
+            out.note.fail(LoadRule::NotRegularFile, 0);
+        else
+            out.note.fail(LoadRule::CannotOpen, 0, static_cast<std::uint64_t>(file.error()));
+        return out;
+    }
+    out.fileSize = file.size();
     bool loaded = false;
     if (kind == FileKind::Materials) {
-        OrvMatFile file;
-        loaded = file.load(path);
+        OrvMatFile materials;
+        loaded = materials.load(file);
         if (loaded) {
-            out.text = file.documentXml();
-            out.items = file.getMaterialCount();
+            out.text = materials.documentXml();
+            out.items = materials.getMaterialCount();
         } else {
-            out.note = file.loadNote;
+            out.note = materials.loadNote;
         }
     } else {
-        OrvOptFile file;
+        OrvOptFile container;
         AllOptions options;
-        loaded = file.load(options, path);
+        loaded = container.load(options, file);
         if (loaded) {
             out.text = OrvOptFile::documentXml(options);
             out.items = countBlocks(out.text);
         } else {
-            out.note = file.loadNote;
+            out.note = container.loadNote;
         }
     }
     if (loaded) {
@@ -98,12 +89,6 @@ ConversionOutcome convertFile(const std::u16string& path, FileKind kind) {
     }
     out.status = FileStatus::Text;
     out.text = readFileAsText(path);
-    // A version 3 body is read in whole blocks; what was read behind the
-    // file's end came from the zeros of a block the file didn't fill.
-    if (out.note.reached > out.fileSize) {
-        out.note.rule = LoadRule::DataEndsEarly;
-        out.note.offset = out.fileSize;
-    }
     return out;
 }
 

@@ -34,7 +34,7 @@ struct ConversionOutcome {
 // document sun is put back to its start state first, so the result doesn't
 // depend on what was converted before. The text is byte for byte what
 // OrvMatFile::getXml or OrvOptFile::getXml returns then; a path that isn't a
-// regular file gives the empty text without being opened.
+// regular file gives the empty text and is never read.
 ConversionOutcome convertFile(const std::u16string& path, FileKind kind);
 
 // One line on an outcome: "document, 3 materials, 12300 bytes" or

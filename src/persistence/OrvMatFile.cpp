@@ -216,7 +216,9 @@ bool OrvMatFile::load(const std::u16string& path) {
     platform::RegularFile file;
     if (!file.open(path)) {
         loadNote = LoadNote();
-        return loadNote.fail(LoadRule::CannotOpen, 0);
+        return file.notRegular() ? loadNote.fail(LoadRule::NotRegularFile, 0)
+                                 : loadNote.fail(LoadRule::CannotOpen, 0,
+                                                 static_cast<std::uint64_t>(file.error()));
     }
     return load(file);
 }

@@ -14,7 +14,9 @@ bool OrvOptFile::load(AllOptions& options, const std::u16string& path) {
     platform::RegularFile file;
     if (!file.open(path)) {
         loadNote = LoadNote();
-        return loadNote.fail(LoadRule::CannotOpen, 0);
+        return file.notRegular() ? loadNote.fail(LoadRule::NotRegularFile, 0)
+                                 : loadNote.fail(LoadRule::CannotOpen, 0,
+                                                 static_cast<std::uint64_t>(file.error()));
     }
     return load(options, file);
 }

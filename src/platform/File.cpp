@@ -44,6 +44,8 @@ bool RegularFile::open(const std::u16string& path) {
         fd_ = -1;
     }
     size_ = 0;
+    notRegular_ = false;
+    error_ = 0;
     const std::string native = pathToNative(path);
     // O_NONBLOCK: opening a FIFO with no writer returns at once instead of
     // waiting. It has no effect on reads from a regular file.
@@ -51,9 +53,18 @@ bool RegularFile::open(const std::u16string& path) {
     do {
         fd = ::open(native.c_str(), O_RDONLY | O_NONBLOCK | O_CLOEXEC | O_NOCTTY);
     } while (fd < 0 && errno == EINTR);
-    if (fd < 0) return false;
+    if (fd < 0) {
+        error_ = errno;
+        return false;
+    }
     struct stat st;
-    if (::fstat(fd, &st) != 0 || !S_ISREG(st.st_mode) || st.st_size < 0) {
+    if (::fstat(fd, &st) != 0) {
+        error_ = errno;
+        ::close(fd);
+        return false;
+    }
+    if (!S_ISREG(st.st_mode) || st.st_size < 0) {
+        notRegular_ = true;
         ::close(fd);
         return false;
     }

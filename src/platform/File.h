@@ -51,6 +51,10 @@ public:
 
     bool open(const std::u16string& path);
     bool isOpen() const { return fd_ >= 0; }
+    // Why the last open failed: the path opened but isn't a regular file,
+    // or the system's error number.
+    bool notRegular() const { return notRegular_; }
+    int error() const { return error_; }
 
     std::uint64_t size() const override { return size_; }
     std::size_t readAt(std::uint64_t offset, void* dst, std::size_t n) const override;
@@ -58,6 +62,8 @@ public:
 private:
     int fd_ = -1;
     std::uint64_t size_ = 0;
+    bool notRegular_ = false;
+    int error_ = 0;
 };
 
 }  // namespace platform
