@@ -1,7 +1,5 @@
 #include "module/Outcome.h"
 
-#include <cstring>
-
 #include "lights/SunIesDome.h"
 #include "module/Extension.h"
 #include "module/TextFallback.h"
@@ -24,29 +22,6 @@ bool kindOfPath(const std::u16string& path, FileKind& kind) {
     return false;
 }
 
-namespace {
-
-// The settings blocks of an options document: its Assets elements at the
-// first level of indentation. The search runs over the bytes of the text with
-// memmem, much faster than a search by 16-bit units; a hit must start on a
-// unit.
-std::size_t countBlocks(const std::u16string& document) {
-    static const char16_t kBlockStart[] = u"\n  <Assets>\n";
-    const std::size_t patternSize = sizeof kBlockStart - sizeof(char16_t);
-    const char* text = reinterpret_cast<const char*>(document.data());
-    const std::size_t size = document.size() * sizeof(char16_t);
-    std::size_t n = 0;
-    for (std::size_t at = 0; at < size;) {
-        const void* hit = ::memmem(text + at, size - at, kBlockStart, patternSize);
-        if (!hit) break;
-        const std::size_t found = static_cast<std::size_t>(static_cast<const char*>(hit) - text);
-        if (found % sizeof(char16_t) == 0) ++n;
-        at = found + 1;
-    }
-    return n;
-}
-
-}  // namespace
 
 ConversionOutcome convertFile(const std::u16string& path, FileKind kind) {
     ConversionOutcome out;
@@ -78,7 +53,7 @@ ConversionOutcome convertFile(const std::u16string& path, FileKind kind) {
         loaded = container.load(options, file);
         if (loaded) {
             out.text = OrvOptFile::documentXml(options);
-            out.items = countBlocks(out.text);
+            out.items = AllOptions::documentBlockCount();
         } else {
             out.note = container.loadNote;
         }

@@ -34,6 +34,8 @@ public:
     // The 22 settings blocks of the document, each in an Assets element of its
     // own, under `url`.
     void writeXml(AssetXmlWriter& writer, std::u16string url) override;
+    // How many settings blocks writeXml writes: every one, always.
+    static std::size_t documentBlockCount();
     std::u16string getPluginName() const override { return u"AllOptions"; }
 
     // Name of a render channel number (100 to 133), or null for another number.

@@ -505,6 +505,8 @@ void writeBlock(AssetXmlWriter& w, const AllOptions& o, const Block& b, const st
 
 }  // namespace
 
+std::size_t AllOptions::documentBlockCount() { return sizeof kBlocks / sizeof kBlocks[0]; }
+
 void AllOptions::writeXml(AssetXmlWriter& writer, std::u16string url) {
     const std::u16string assetType = getAssetType();
     for (const Block& b : kBlocks) writeBlock(writer, *this, b, url, assetType);
