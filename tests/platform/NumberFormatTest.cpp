@@ -90,16 +90,12 @@ std::string formatted(double value) {
     return std::string(text, text + n);
 }
 
-double fromBits(std::uint64_t bits) {
-    double d;
-    std::memcpy(&d, &bits, sizeof d);
-    return d;
-}
-
-float floatFromBits(std::uint32_t bits) {
-    float f;
-    std::memcpy(&f, &bits, sizeof f);
-    return f;
+template <class To, class From>
+To fromBits(From bits) {
+    static_assert(sizeof(To) == sizeof(From), "same width");
+    To v;
+    std::memcpy(&v, &bits, sizeof v);
+    return v;
 }
 
 // Counts and names the first few values where the two texts differ.
@@ -186,7 +182,7 @@ TEST(NumberFormatReference, RandomFloats) {
     Comparison c;
     std::mt19937 rng(20261124);
     const std::size_t n = sweepSize();
-    for (std::size_t i = 0; i < n; ++i) c.check(floatFromBits(static_cast<std::uint32_t>(rng())));
+    for (std::size_t i = 0; i < n; ++i) c.check(fromBits<float>(static_cast<std::uint32_t>(rng())));
     // Floats of ordinary size, uniformly in their exponent.
     std::uniform_real_distribution<float> unit(1.0f, 2.0f);
     std::uniform_int_distribution<int> exponent(-40, 40);
@@ -211,7 +207,7 @@ TEST(NumberFormatReference, RandomDoubles) {
     Comparison c;
     std::mt19937_64 rng(1124);
     const std::size_t n = sweepSize();
-    for (std::size_t i = 0; i < n; ++i) c.check(fromBits(rng()));
+    for (std::size_t i = 0; i < n; ++i) c.check(fromBits<double>(rng()));
     std::uniform_real_distribution<double> unit(1.0, 2.0);
     std::uniform_int_distribution<int> exponent(-100, 130);
     for (std::size_t i = 0; i < n; ++i) c.check(std::ldexp(unit(rng), exponent(rng)));
