@@ -87,8 +87,7 @@ class Tree(unittest.TestCase):
         return path
 
     def copy(self, example, rel):
-        with open(os.path.join(EXAMPLES, example), 'rb') as f:
-            return self.put(rel, f.read())
+        return self.put(rel, self.read(os.path.join(EXAMPLES, example)))
 
     def files_under(self, root):
         found = []
