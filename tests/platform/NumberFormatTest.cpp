@@ -178,16 +178,20 @@ TEST(NumberFormatReference, EdgeValues) {
     EXPECT_GT(c.checked(), 500000u);
 }
 
-TEST(NumberFormatReference, RandomFloats) {
+// Random bit patterns, then values of ordinary size, uniform in their exponent.
+template <class Real, class Bits, class Rng>
+void randomSweep(Rng rng, int minExponent, int maxExponent) {
     Comparison c;
-    std::mt19937 rng(20261124);
     const std::size_t n = sweepSize();
-    for (std::size_t i = 0; i < n; ++i) c.check(fromBits<float>(static_cast<std::uint32_t>(rng())));
-    // Floats of ordinary size, uniformly in their exponent.
-    std::uniform_real_distribution<float> unit(1.0f, 2.0f);
-    std::uniform_int_distribution<int> exponent(-40, 40);
+    for (std::size_t i = 0; i < n; ++i) c.check(fromBits<Real>(static_cast<Bits>(rng())));
+    std::uniform_real_distribution<Real> unit(1, 2);
+    std::uniform_int_distribution<int> exponent(minExponent, maxExponent);
     for (std::size_t i = 0; i < n; ++i) c.check(std::ldexp(unit(rng), exponent(rng)));
 }
+
+TEST(NumberFormatReference, RandomFloats) { randomSweep<float, std::uint32_t>(std::mt19937(20261124), -40, 40); }
+
+TEST(NumberFormatReference, RandomDoubles) { randomSweep<double, std::uint64_t>(std::mt19937_64(1124), -100, 130); }
 
 // Whole numbers, which take a road of their own below 10^6: every one up to
 // past the bound, both signs, and powers of two around it.
@@ -201,16 +205,6 @@ TEST(NumberFormatReference, WholeNumbers) {
         for (double f : {1.0, 3.0, 0.75, 999999.0, 1000001.0}) c.check(std::ldexp(f, k));
     }
     EXPECT_GT(c.checked(), 2200000u);
-}
-
-TEST(NumberFormatReference, RandomDoubles) {
-    Comparison c;
-    std::mt19937_64 rng(1124);
-    const std::size_t n = sweepSize();
-    for (std::size_t i = 0; i < n; ++i) c.check(fromBits<double>(rng()));
-    std::uniform_real_distribution<double> unit(1.0, 2.0);
-    std::uniform_int_distribution<int> exponent(-100, 130);
-    for (std::size_t i = 0; i < n; ++i) c.check(std::ldexp(unit(rng), exponent(rng)));
 }
 
 TEST(NumberFormatReference, IntegersMatchPrintf) {
