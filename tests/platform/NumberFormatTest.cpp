@@ -138,11 +138,8 @@ TEST(NumberFormatReference, EdgeValues) {
                           std::numeric_limits<float>::max(),        std::numeric_limits<float>::denorm_min(),
                           0.0, 1.0, 0.5, 0.1, 1.0 / 3, 2.0 / 3};
     for (double v : lim) c.checkAround(v);
-    c.check(std::numeric_limits<double>::infinity());
-    c.check(-std::numeric_limits<double>::infinity());
-    c.check(std::numeric_limits<double>::quiet_NaN());
-    c.check(-std::numeric_limits<double>::quiet_NaN());
-    c.check(std::numeric_limits<double>::signaling_NaN());
+    using D = std::numeric_limits<double>;
+    for (double v : {D::infinity(), -D::infinity(), D::quiet_NaN(), -D::quiet_NaN(), D::signaling_NaN()}) c.check(v);
     // Powers of ten and the six-digit boundaries around each, where the
     // exponent changes and rounding carries.
     for (int e = -330; e <= 310; ++e) {
