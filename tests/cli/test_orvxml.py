@@ -159,10 +159,7 @@ class CommandLine(Tree):
         os.close(slave)
         shown = b''
         try:
-            while True:
-                chunk = os.read(master, 4096)
-                if not chunk:
-                    break
+            for chunk in iter(lambda: os.read(master, 4096), b''):
                 shown += chunk
         except OSError:
             pass
