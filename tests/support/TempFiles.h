@@ -121,21 +121,15 @@ inline long peakMiBOfChild(const std::function<bool()>& work, bool& passed) {
     return usage.ru_maxrss / 1024;
 }
 
-// The child's peak above that of a child that does nothing.
-inline long extraMiBOfChild(const std::function<bool()>& work, bool& passed) {
-    bool idle = false;
+// `work` succeeds in a child whose peak stays under 100 MiB above that of a
+// child that does nothing.
+inline void expectSmallChild(const std::function<bool()>& work, const std::string& what) {
+    bool idle = false, passed = false;
     const long base = peakMiBOfChild([] { return true; }, idle);
     const long peak = peakMiBOfChild(work, passed);
-    return peak < 0 || base < 0 ? -1 : peak - base;
-}
-
-// `work` succeeds in a child whose peak stays under 100 MiB above an idle one.
-inline void expectSmallChild(const std::function<bool()>& work, const std::string& what) {
-    bool passed = false;
-    const long extra = extraMiBOfChild(work, passed);
     EXPECT_TRUE(passed) << what;
-    EXPECT_GE(extra, 0) << what;
-    EXPECT_LT(extra, 100) << what;
+    EXPECT_TRUE(base >= 0 && peak >= base) << what << ": " << base << " then " << peak;
+    EXPECT_LT(peak - base, 100) << what;
 }
 
 }  // namespace tempfiles
