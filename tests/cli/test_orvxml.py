@@ -87,8 +87,7 @@ class Tree(unittest.TestCase):
         return path
 
     def copy(self, example, rel):
-        with open(os.path.join(EXAMPLES, example), 'rb') as f:
-            return self.put(rel, f.read())
+        return self.put(rel, self.read(os.path.join(EXAMPLES, example)))
 
     def files_under(self, root):
         found = []
@@ -160,10 +159,7 @@ class CommandLine(Tree):
         os.close(slave)
         shown = b''
         try:
-            while True:
-                chunk = os.read(master, 4096)
-                if not chunk:
-                    break
+            for chunk in iter(lambda: os.read(master, 4096), b''):
                 shown += chunk
         except OSError:
             pass

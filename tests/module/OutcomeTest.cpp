@@ -2,48 +2,29 @@
 // whatever was converted before, and the reason for the text road.
 #include <gtest/gtest.h>
 
-#include <cerrno>
-#include <cstdlib>
-#include <fstream>
-#include <iterator>
 #include <string>
 
 #include <sys/stat.h>
-#include <unistd.h>
 
 #include "lights/SunIesDome.h"
 #include "module/Outcome.h"
 #include "persistence/OrvMatFile.h"
 #include "persistence/OrvOptFile.h"
 #include "persistence/QuickArchive.h"
+#include "support/TempFiles.h"
 
 using namespace OrvaneLumoCore;
+using tempfiles::TempDir;
 
 namespace {
 
-std::u16string example(const char* name) {
-    return utf8ToWide(std::string(ORVXML_SOURCE_DIR) + "/examples/" + name);
-}
+std::u16string example(const char* name) { return tempfiles::wide(tempfiles::examplePath(name)); }
 
 // What the module returns for the path in a fresh process.
 std::u16string moduleText(const std::u16string& path, FileKind kind) {
     resetDocumentSun();
     return kind == FileKind::Materials ? OrvMatFile().getXml(path) : OrvOptFile().getXml(path);
 }
-
-class TempDir {
-public:
-    TempDir() {
-        char name[] = "/tmp/orvxml-outcome-XXXXXX";
-        path = ::mkdtemp(name);
-    }
-    ~TempDir() { std::system(("rm -rf '" + path + "'").c_str()); }
-    std::string write(const std::string& name, const std::string& bytes) const {
-        std::ofstream(path + "/" + name, std::ios::binary) << bytes;
-        return path + "/" + name;
-    }
-    std::string path;
-};
 
 TEST(Outcome, TextIsTheModulesForEveryExample) {
     const struct {
@@ -98,14 +79,14 @@ TEST(Outcome, DocumentSunStartsAfreshForEachFile) {
 
 TEST(Outcome, PathsThatAreNotReadAtAll) {
     TempDir dir;
-    ASSERT_EQ(::mkdir((dir.path + "/folder.orvmat").c_str(), 0777), 0);
+    ASSERT_EQ(::mkdir(dir.file("folder.orvmat").c_str(), 0777), 0);
     const struct {
         std::string path;
         LoadRule rule;
         const char* line;
     } cases[] = {
-        {dir.path + "/folder.orvmat", LoadRule::NotRegularFile, "unreadable: not a regular file"},
-        {dir.path + "/missing.orvopt", LoadRule::CannotOpen,
+        {dir.file("folder.orvmat"), LoadRule::NotRegularFile, "unreadable: not a regular file"},
+        {dir.file("missing.orvopt"), LoadRule::CannotOpen,
          "unreadable: can't be opened: No such file or directory"},
     };
     for (const auto& c : cases) {
@@ -124,7 +105,8 @@ TEST(Outcome, ReadingIntoBlocksTheFileLacksIsDataEndingEarly) {
     std::string file("\0\0\3\0\1\0\0\0\2\0\0\0", 12);
     file += std::string("\0\0\0\0\0\0\2\0", 8) + std::string(10, '\0');
     TempDir dir;
-    const std::string path = dir.write("cut.orvmat", file);
+    const std::string path = dir.file("cut.orvmat");
+    ASSERT_TRUE(tempfiles::writeFile(path, file));
     const ConversionOutcome o = convertFile(utf8ToWide(path), FileKind::Materials);
     EXPECT_EQ(o.status, FileStatus::Text);
     EXPECT_EQ(o.note.rule, LoadRule::DataEndsEarly);

@@ -6,16 +6,14 @@ builds the project once more."""
 import base64
 import hashlib
 import os
-import shutil
 import subprocess
 import sys
-import tempfile
 import unittest
 import zipfile
 
 import sysconfig
 
-from support import BUILD, SOURCE, convert_elsewhere, convert_here, examples
+from support import BUILD, SOURCE, ScratchTest, convert_elsewhere, convert_here, examples, read
 
 WHEELS = '/usr/share/python-wheels'   # Debian's pip and setuptools, for --find-links
 STUB = os.path.join(SOURCE, 'src', 'module', 'python', 'PyOrvXml.pyi')
@@ -33,16 +31,13 @@ def build_has_command():
         return any(line.startswith('script ') for line in f)
 
 
-class Install(unittest.TestCase):
+class Install(ScratchTest):
     def setUp(self):
-        self.dir = tempfile.mkdtemp()
+        ScratchTest.setUp(self)
         # pip keeps its cache and its messages to itself.
         self.env = dict(os.environ, PIP_CACHE_DIR=os.path.join(self.dir, 'cache'),
                         PIP_DISABLE_PIP_VERSION_CHECK='1')
         self.env.pop('PYTHONPATH', None)
-
-    def tearDown(self):
-        shutil.rmtree(self.dir)
 
     def run_quietly(self, command, cwd=None):
         proc = subprocess.Popen(command, cwd=cwd, env=self.env, stdout=subprocess.PIPE,
@@ -95,8 +90,7 @@ class Install(unittest.TestCase):
             self.assertIn('\nName: PyOrvXml\n', meta)
             self.assertIn('\nVersion: %s\n' % version, meta)
             self.assertEqual(wheel.getinfo(module_name).external_attr >> 16, 0o100755)
-            with open(STUB, 'rb') as f:
-                self.assertEqual(wheel.read('PyOrvXml.pyi'), f.read())
+            self.assertEqual(wheel.read('PyOrvXml.pyi'), read(STUB))
 
     def check_command(self, bin_dir):
         command = os.path.join(bin_dir, 'orvxml')
@@ -112,9 +106,7 @@ class Install(unittest.TestCase):
         self.check_converts_like_the_build(python, self.env, MODULE)
         site = subprocess.check_output(
             [python, '-c', 'import sysconfig; print(sysconfig.get_paths()["platlib"])'])
-        with open(os.path.join(site.decode().strip(), 'PyOrvXml.pyi'), 'rb') as f:
-            with open(STUB, 'rb') as g:
-                self.assertEqual(f.read(), g.read())
+        self.assertEqual(read(os.path.join(site.decode().strip(), 'PyOrvXml.pyi')), read(STUB))
         self.check_command(os.path.dirname(python))
 
     def test_pip_wheel_installs_elsewhere(self):

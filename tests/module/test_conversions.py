@@ -2,16 +2,14 @@
 """Whole conversions through the interpreter (2.7 or 3), on the bundled sample files."""
 import os
 import re
-import shutil
 import subprocess
 import sys
-import tempfile
 import unittest
 
-from support import EXAMPLES, example, read, text, PyOrvXml
+from support import EXAMPLES, ScratchTest, example, read, PyOrvXml
 
 
-class MaterialDocuments(unittest.TestCase):
+class MaterialDocuments(ScratchTest):
     def check_document(self, xml, groups):
         self.assertTrue(xml.startswith(u'<orvmat>\n'), xml[:40])
         self.assertTrue(xml.endswith(u'</orvmat>\n'))
@@ -29,27 +27,14 @@ class MaterialDocuments(unittest.TestCase):
             self.assertGreater(xml.count(u'\n  <Assets>\n'), 0)
 
     def test_same_file_under_both_extensions(self):
-        tmp = tempfile.mkdtemp()
-        try:
-            src = os.path.join(EXAMPLES, 'materials_all_layers.orvmat')
-            dst = os.path.join(tmp, 'copy.LUMAT')
-            shutil.copy(src, dst)
-            self.assertEqual(PyOrvXml.getOrvmatXml(text(dst)),
-                             PyOrvXml.getOrvmatXml(example('materials_all_layers.orvmat')))
-        finally:
-            shutil.rmtree(tmp)
+        dst = self.write('copy.LUMAT', read(os.path.join(EXAMPLES, 'materials_all_layers.orvmat')))
+        self.assertEqual(PyOrvXml.getOrvmatXml(dst), PyOrvXml.getOrvmatXml(example('materials_all_layers.orvmat')))
 
     def test_damaged_record_takes_the_text_road(self):
-        tmp = tempfile.mkdtemp()
-        try:
-            data = read(os.path.join(EXAMPLES, 'materials_all_layers.orvmat'))
-            bad = os.path.join(tmp, 'bad.orvmat')
-            # Break the first material's version tag (behind header, block count, type tag).
-            with open(bad, 'wb') as f:
-                f.write(data[:18] + b'\x07\x00' + data[20:])
-            self.assertEqual(PyOrvXml.getOrvmatXml(text(bad)), u'')
-        finally:
-            shutil.rmtree(tmp)
+        data = read(os.path.join(EXAMPLES, 'materials_all_layers.orvmat'))
+        # Break the first material's version tag (behind header, block count, type tag).
+        bad = self.write('bad.orvmat', data[:18] + b'\x07\x00' + data[20:])
+        self.assertEqual(PyOrvXml.getOrvmatXml(bad), u'')
 
 
 class DocumentSun(unittest.TestCase):
@@ -84,7 +69,7 @@ class WrappedTrees(unittest.TestCase):
             self.assertEqual(xml.count(u'<Asset '), xml.count(u'</Asset>'))
 
 
-class OptionsDocuments(unittest.TestCase):
+class OptionsDocuments(ScratchTest):
     def test_saved_and_old_files_give_22_blocks(self):
         for name in ('render_settings.orvopt', 'old_settings_v4.luopt'):
             xml = PyOrvXml.getOrvoptXml(example(name))
@@ -94,16 +79,10 @@ class OptionsDocuments(unittest.TestCase):
             self.assertEqual(len(re.findall(u'<Asset layout="" renderer="lumo" type="settings"', xml)) >= 22, True)
 
     def test_damaged_options_file_gives_its_first_character(self):
-        tmp = tempfile.mkdtemp()
-        try:
-            data = read(os.path.join(EXAMPLES, 'render_settings.orvopt'))
-            # The tag's low half stays 1; the version (15) is one no file has.
-            bad_version = os.path.join(tmp, 'badversion.orvopt')
-            with open(bad_version, 'wb') as f:
-                f.write(b'\x01\x00\x0f\x00' + data[4:])
-            self.assertEqual(PyOrvXml.getOrvoptXml(text(bad_version)), u'\x01')
-        finally:
-            shutil.rmtree(tmp)
+        data = read(os.path.join(EXAMPLES, 'render_settings.orvopt'))
+        # The tag's low half stays 1; the version (15) is one no file has.
+        bad_version = self.write('badversion.orvopt', b'\x01\x00\x0f\x00' + data[4:])
+        self.assertEqual(PyOrvXml.getOrvoptXml(bad_version), u'\x01')
 
 
 if __name__ == '__main__':

@@ -54,11 +54,8 @@ class ModuleSurface(ScratchTest):
                     self.fail(path)
 
     def test_dot_in_directory_name_only(self):
-        sub = os.path.join(self.dir, 'lib.orvmat')
-        os.mkdir(sub)
-        with open(os.path.join(sub, 'file'), 'wb') as f:
-            f.write(b'x')
-        self.assertRaises(SystemError, PyOrvXml.getOrvmatXml, text(sub) + u'/file')
+        os.mkdir(os.path.join(self.dir, 'lib.orvmat'))
+        self.assertRaises(SystemError, PyOrvXml.getOrvmatXml, self.write('lib.orvmat/file', b'x'))
 
     def test_missing_file_gives_empty_string(self):
         self.assertEqual(PyOrvXml.getOrvmatXml(u'/no/such/file.orvmat'), u'')

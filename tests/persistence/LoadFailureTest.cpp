@@ -117,10 +117,8 @@ TEST(LoadFailure, MaterialFileNotesTheFirstRefusal) {
 TEST(LoadFailure, OptionsRecordNotesItsVersion) {
     // The options record reads its own tag: a refused one is seen as the
     // record failing after its first four bytes.
-    QuickArchive ar = [] {
-        const std::string bytes = Bytes().u32(0x7F0001).zeros(64).s;
-        return QuickArchive(bytes.data(), bytes.size());
-    }();
+    const std::string bytes = Bytes().u32(0x7F0001).zeros(64).s;
+    QuickArchive ar(bytes.data(), bytes.size());
     AllOptions options;
     ASSERT_FALSE(loadRecord(ar, options));
     const LoadNote& note = ar.trace.note;

@@ -90,16 +90,12 @@ std::string formatted(double value) {
     return std::string(text, text + n);
 }
 
-double fromBits(std::uint64_t bits) {
-    double d;
-    std::memcpy(&d, &bits, sizeof d);
-    return d;
-}
-
-float floatFromBits(std::uint32_t bits) {
-    float f;
-    std::memcpy(&f, &bits, sizeof f);
-    return f;
+template <class To, class From>
+To fromBits(From bits) {
+    static_assert(sizeof(To) == sizeof(From), "same width");
+    To v;
+    std::memcpy(&v, &bits, sizeof v);
+    return v;
 }
 
 // Counts and names the first few values where the two texts differ.
@@ -142,11 +138,8 @@ TEST(NumberFormatReference, EdgeValues) {
                           std::numeric_limits<float>::max(),        std::numeric_limits<float>::denorm_min(),
                           0.0, 1.0, 0.5, 0.1, 1.0 / 3, 2.0 / 3};
     for (double v : lim) c.checkAround(v);
-    c.check(std::numeric_limits<double>::infinity());
-    c.check(-std::numeric_limits<double>::infinity());
-    c.check(std::numeric_limits<double>::quiet_NaN());
-    c.check(-std::numeric_limits<double>::quiet_NaN());
-    c.check(std::numeric_limits<double>::signaling_NaN());
+    using D = std::numeric_limits<double>;
+    for (double v : {D::infinity(), -D::infinity(), D::quiet_NaN(), -D::quiet_NaN(), D::signaling_NaN()}) c.check(v);
     // Powers of ten and the six-digit boundaries around each, where the
     // exponent changes and rounding carries.
     for (int e = -330; e <= 310; ++e) {
@@ -182,16 +175,20 @@ TEST(NumberFormatReference, EdgeValues) {
     EXPECT_GT(c.checked(), 500000u);
 }
 
-TEST(NumberFormatReference, RandomFloats) {
+// Random bit patterns, then values of ordinary size, uniform in their exponent.
+template <class Real, class Bits, class Rng>
+void randomSweep(Rng rng, int minExponent, int maxExponent) {
     Comparison c;
-    std::mt19937 rng(20261124);
     const std::size_t n = sweepSize();
-    for (std::size_t i = 0; i < n; ++i) c.check(floatFromBits(static_cast<std::uint32_t>(rng())));
-    // Floats of ordinary size, uniformly in their exponent.
-    std::uniform_real_distribution<float> unit(1.0f, 2.0f);
-    std::uniform_int_distribution<int> exponent(-40, 40);
+    for (std::size_t i = 0; i < n; ++i) c.check(fromBits<Real>(static_cast<Bits>(rng())));
+    std::uniform_real_distribution<Real> unit(1, 2);
+    std::uniform_int_distribution<int> exponent(minExponent, maxExponent);
     for (std::size_t i = 0; i < n; ++i) c.check(std::ldexp(unit(rng), exponent(rng)));
 }
+
+TEST(NumberFormatReference, RandomFloats) { randomSweep<float, std::uint32_t>(std::mt19937(20261124), -40, 40); }
+
+TEST(NumberFormatReference, RandomDoubles) { randomSweep<double, std::uint64_t>(std::mt19937_64(1124), -100, 130); }
 
 // Whole numbers, which take a road of their own below 10^6: every one up to
 // past the bound, both signs, and powers of two around it.
@@ -205,16 +202,6 @@ TEST(NumberFormatReference, WholeNumbers) {
         for (double f : {1.0, 3.0, 0.75, 999999.0, 1000001.0}) c.check(std::ldexp(f, k));
     }
     EXPECT_GT(c.checked(), 2200000u);
-}
-
-TEST(NumberFormatReference, RandomDoubles) {
-    Comparison c;
-    std::mt19937_64 rng(1124);
-    const std::size_t n = sweepSize();
-    for (std::size_t i = 0; i < n; ++i) c.check(fromBits(rng()));
-    std::uniform_real_distribution<double> unit(1.0, 2.0);
-    std::uniform_int_distribution<int> exponent(-100, 130);
-    for (std::size_t i = 0; i < n; ++i) c.check(std::ldexp(unit(rng), exponent(rng)));
 }
 
 TEST(NumberFormatReference, IntegersMatchPrintf) {

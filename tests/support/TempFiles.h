@@ -1,11 +1,13 @@
 #pragma once
 // Scratch files for tests that need real paths: a private folder, large
-// sparse files, special files, and the peak memory of work done in a child.
+// sparse files, special files, the example files, and the peak memory of
+// work done in a child.
 #include <sys/resource.h>
 #include <sys/socket.h>
 #include <sys/stat.h>
 #include <sys/un.h>
 #include <sys/wait.h>
+#include <gtest/gtest.h>
 #include <fcntl.h>
 #include <unistd.h>
 
@@ -16,6 +18,7 @@
 #include <fstream>
 #include <functional>
 #include <string>
+#include <vector>
 
 #include "persistence/QuickArchive.h"
 
@@ -62,6 +65,16 @@ inline std::string readFile(const std::string& path) {
     return std::string((std::istreambuf_iterator<char>(in)), std::istreambuf_iterator<char>());
 }
 
+inline std::string examplePath(const std::string& name) { return std::string(ORVXML_SOURCE_DIR) + "/examples/" + name; }
+inline std::string example(const std::string& name) { return readFile(examplePath(name)); }
+
+// A u32 as little-endian bytes.
+inline std::string le32(std::uint32_t v) {
+    std::string s(4, '\0');
+    for (int i = 0; i < 4; ++i) s[i] = static_cast<char>(v >> (8 * i));
+    return s;
+}
+
 // A socket file at `path`; it stays behind when the socket is closed.
 inline bool makeSocket(const std::string& path) {
     const int fd = ::socket(AF_UNIX, SOCK_STREAM, 0);
@@ -75,6 +88,22 @@ inline bool makeSocket(const std::string& path) {
     }
     ::close(fd);
     return bound;
+}
+
+// Paths in `dir` that are not regular files (folders, fifos without a writer,
+// a socket) and two devices, under both file extensions.
+inline std::vector<std::string> specialFiles(const TempDir& dir) {
+    std::vector<std::string> paths;
+    for (const char* ext : {".orvmat", ".orvopt"}) {
+        const std::string folder = dir.file(std::string("folder") + ext), fifo = dir.file(std::string("fifo") + ext);
+        const std::string socket = dir.file(std::string("socket") + ext);
+        EXPECT_TRUE(std::filesystem::create_directory(folder));
+        EXPECT_EQ(0, ::mkfifo(fifo.c_str(), 0600));
+        EXPECT_TRUE(makeSocket(socket));
+        paths.insert(paths.end(), {folder, fifo, socket});
+    }
+    paths.insert(paths.end(), {"/dev/null", "/dev/zero"});
+    return paths;
 }
 
 // Runs `work` in a forked child. Returns the child's peak resident memory
@@ -92,12 +121,15 @@ inline long peakMiBOfChild(const std::function<bool()>& work, bool& passed) {
     return usage.ru_maxrss / 1024;
 }
 
-// The child's peak above that of a child that does nothing.
-inline long extraMiBOfChild(const std::function<bool()>& work, bool& passed) {
-    bool idle = false;
+// `work` succeeds in a child whose peak stays under 100 MiB above that of a
+// child that does nothing.
+inline void expectSmallChild(const std::function<bool()>& work, const std::string& what) {
+    bool idle = false, passed = false;
     const long base = peakMiBOfChild([] { return true; }, idle);
     const long peak = peakMiBOfChild(work, passed);
-    return peak < 0 || base < 0 ? -1 : peak - base;
+    EXPECT_TRUE(passed) << what;
+    EXPECT_TRUE(base >= 0 && peak >= base) << what << ": " << base << " then " << peak;
+    EXPECT_LT(peak - base, 100) << what;
 }
 
 }  // namespace tempfiles
