@@ -1,14 +1,18 @@
 #pragma once
-// Files named by wide paths. A path is opened through its UTF-8 form; other
-// processes may have the file open at the same time.
+// Files named by wide paths. On POSIX systems a path is opened through its
+// UTF-8 form, on Windows as it is (paths beyond 260 characters included).
+// Other processes may have the file open, for reading or writing, at the
+// same time.
 #include <cstddef>
 #include <cstdint>
+#include <filesystem>
 #include <fstream>
 #include <string>
 
 namespace platform {
 
-std::string pathToNative(const std::u16string& path);
+// The path in the form the system's file calls take.
+std::filesystem::path nativePath(const std::u16string& path);
 
 // Streams on a path. Reading opens regular files only (see RegularFile);
 // anything else leaves the stream closed.
@@ -50,9 +54,9 @@ public:
     RegularFile& operator=(const RegularFile&) = delete;
 
     bool open(const std::u16string& path);
-    bool isOpen() const { return fd_ >= 0; }
+    bool isOpen() const { return handle_ != kClosed; }
     // Why the last open failed: the path opened but isn't a regular file,
-    // or the system's error number.
+    // or the error number (errno) of the system's error.
     bool notRegular() const { return notRegular_; }
     int error() const { return error_; }
 
@@ -60,7 +64,11 @@ public:
     std::size_t readAt(std::uint64_t offset, void* dst, std::size_t n) const override;
 
 private:
-    int fd_ = -1;
+    // A file descriptor, or a Windows HANDLE; -1 is the closed value of both.
+    static constexpr std::intptr_t kClosed = -1;
+    void close();
+
+    std::intptr_t handle_ = kClosed;
     std::uint64_t size_ = 0;
     bool notRegular_ = false;
     int error_ = 0;

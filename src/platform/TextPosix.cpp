@@ -1,3 +1,5 @@
+// The text converters of Linux and other POSIX systems: our own strict UTF-8
+// and Windows-1252 tables, which give what the Windows converters give.
 #include "platform/Text.h"
 
 namespace platform {

@@ -1,3 +1,5 @@
+// New UUIDs where there is no RPC runtime: version 4 from a random engine,
+// seeded once per process.
 #include "platform/Uuid.h"
 
 #include <cstdint>
