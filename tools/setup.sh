@@ -9,6 +9,11 @@ command -v make >/dev/null || need+=(make)
 [ -f /usr/include/boost/any.hpp ] || need+=(libboost-dev)
 [ -f /usr/include/gtest/gtest.h ] || need+=(libgtest-dev)
 [ -f /usr/include/benchmark/benchmark.h ] || need+=(libbenchmark-dev)
+# The Windows leg: the mingw-w64 cross compiler, GoogleTest's sources (from
+# libgtest-dev) and Wine to run the programs.
+command -v x86_64-w64-mingw32-g++-posix >/dev/null || need+=(g++-mingw-w64-x86-64-posix)
+[ -f /usr/src/googletest/CMakeLists.txt ] || need+=(googletest)
+command -v wine >/dev/null && [ -e /usr/lib/wine/wine64 ] || need+=(wine wine64)
 if [ ${#need[@]} -gt 0 ]; then
   echo "Installing: ${need[*]}"
   SUDO=""

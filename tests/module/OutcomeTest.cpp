@@ -4,8 +4,6 @@
 
 #include <string>
 
-#include <sys/stat.h>
-
 #include "lights/SunIesDome.h"
 #include "module/Outcome.h"
 #include "persistence/OrvMatFile.h"
@@ -77,9 +75,29 @@ TEST(Outcome, DocumentSunStartsAfreshForEachFile) {
     EXPECT_TRUE(documentSun()->isEqual(boost::make_shared<SunLight>(u"Default", documentSunId)));
 }
 
+// Names far from any ANSI code page (Greek, CJK, a character beyond the
+// 16-bit plane) reach the file: the path travels as UTF-16 to the system's
+// wide calls on Windows, and as UTF-8 elsewhere.
+TEST(Outcome, NamesOutsideTheAnsiCodePage) {
+    TempDir dir;
+    const std::u16string folder = tempfiles::wide(dir.file(""));
+    for (const char* name : {"materials_folded_wrappers.orvmat", "render_settings.orvopt", "notes.luopt"}) {
+        SCOPED_TRACE(name);
+        const std::u16string copy = folder + u"\u03a9\u03bc\u03ad\u03b3\u03b1 \u6750\u6599 \U0001F600 " +
+                                    tempfiles::wide(name);
+        ASSERT_TRUE(std::filesystem::copy_file(tempfiles::examplePath(name), std::filesystem::path(copy)));
+        FileKind kind;
+        ASSERT_TRUE(kindOfPath(copy, kind));
+        const ConversionOutcome o = convertFile(copy, kind), original = convertFile(example(name), kind);
+        EXPECT_EQ(o.status, original.status);
+        EXPECT_EQ(explainOutcome(o, kind), explainOutcome(original, kind));
+        EXPECT_TRUE(o.text == original.text);
+    }
+}
+
 TEST(Outcome, PathsThatAreNotReadAtAll) {
     TempDir dir;
-    ASSERT_EQ(::mkdir(dir.file("folder.orvmat").c_str(), 0777), 0);
+    ASSERT_TRUE(std::filesystem::create_directory(dir.file("folder.orvmat")));
     const struct {
         std::string path;
         LoadRule rule;

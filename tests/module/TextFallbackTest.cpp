@@ -38,11 +38,4 @@ TEST(TextFallback, TextEndsAtTheFirstZeroByte) {
     }
 }
 
-TEST(TextFallback, ALargeFileCostsItsText) {
-    TempDir dir;
-    const std::string path = dir.file("large.orvmat");
-    ASSERT_TRUE(writeSparse(path, "short text", 1ull << 30));
-    expectSmallChild([&] { return readFileAsText(wide(path)) == u"short text"; }, path);
-}
-
 }  // namespace

@@ -1,24 +1,14 @@
 #pragma once
-// Scratch files for tests that need real paths: a private folder, large
-// sparse files, special files, the example files, and the peak memory of
-// work done in a child.
-#include <sys/resource.h>
-#include <sys/socket.h>
-#include <sys/stat.h>
-#include <sys/un.h>
-#include <sys/wait.h>
+// Scratch files for tests that need real paths, on every system: a private
+// folder, file contents, the example files. PosixFiles.h adds sparse and
+// special files and the peak memory of work done in a child.
 #include <gtest/gtest.h>
-#include <fcntl.h>
-#include <unistd.h>
 
 #include <cstdint>
-#include <cstdlib>
-#include <cstring>
 #include <filesystem>
 #include <fstream>
-#include <functional>
+#include <random>
 #include <string>
-#include <vector>
 
 #include "persistence/QuickArchive.h"
 
@@ -28,8 +18,13 @@ namespace tempfiles {
 class TempDir {
 public:
     TempDir() {
-        std::string pattern = (std::filesystem::temp_directory_path() / "orvxml-XXXXXX").string();
-        if (::mkdtemp(&pattern[0])) path_ = pattern;
+        std::random_device random;
+        const std::filesystem::path base = std::filesystem::temp_directory_path();
+        for (int attempt = 0; attempt < 100 && path_.empty(); ++attempt) {
+            const std::filesystem::path p = base / ("orvxml-" + std::to_string(random()));
+            std::error_code ec;
+            if (std::filesystem::create_directory(p, ec)) path_ = p.generic_string();
+        }
     }
     ~TempDir() {
         std::error_code ec;
@@ -46,18 +41,10 @@ private:
 
 inline std::u16string wide(const std::string& path) { return OrvaneLumoCore::utf8ToWide(path); }
 
-// Writes `head` and extends the file with a hole to `size` bytes, if larger.
-inline bool writeSparse(const std::string& path, const std::string& head, std::uint64_t size) {
-    {
-        std::ofstream out(path, std::ios::binary | std::ios::trunc);
-        out.write(head.data(), static_cast<std::streamsize>(head.size()));
-        if (!out) return false;
-    }
-    return size <= head.size() || ::truncate(path.c_str(), static_cast<off_t>(size)) == 0;
-}
-
 inline bool writeFile(const std::string& path, const std::string& bytes) {
-    return writeSparse(path, bytes, 0);
+    std::ofstream out(path, std::ios::binary | std::ios::trunc);
+    out.write(bytes.data(), static_cast<std::streamsize>(bytes.size()));
+    return static_cast<bool>(out.flush());
 }
 
 inline std::string readFile(const std::string& path) {
@@ -73,63 +60,6 @@ inline std::string le32(std::uint32_t v) {
     std::string s(4, '\0');
     for (int i = 0; i < 4; ++i) s[i] = static_cast<char>(v >> (8 * i));
     return s;
-}
-
-// A socket file at `path`; it stays behind when the socket is closed.
-inline bool makeSocket(const std::string& path) {
-    const int fd = ::socket(AF_UNIX, SOCK_STREAM, 0);
-    if (fd < 0) return false;
-    sockaddr_un address = {};
-    address.sun_family = AF_UNIX;
-    bool bound = false;
-    if (path.size() < sizeof address.sun_path) {
-        std::memcpy(address.sun_path, path.c_str(), path.size() + 1);
-        bound = ::bind(fd, reinterpret_cast<sockaddr*>(&address), sizeof address) == 0;
-    }
-    ::close(fd);
-    return bound;
-}
-
-// Paths in `dir` that are not regular files (folders, fifos without a writer,
-// a socket) and two devices, under both file extensions.
-inline std::vector<std::string> specialFiles(const TempDir& dir) {
-    std::vector<std::string> paths;
-    for (const char* ext : {".orvmat", ".orvopt"}) {
-        const std::string folder = dir.file(std::string("folder") + ext), fifo = dir.file(std::string("fifo") + ext);
-        const std::string socket = dir.file(std::string("socket") + ext);
-        EXPECT_TRUE(std::filesystem::create_directory(folder));
-        EXPECT_EQ(0, ::mkfifo(fifo.c_str(), 0600));
-        EXPECT_TRUE(makeSocket(socket));
-        paths.insert(paths.end(), {folder, fifo, socket});
-    }
-    paths.insert(paths.end(), {"/dev/null", "/dev/zero"});
-    return paths;
-}
-
-// Runs `work` in a forked child. Returns the child's peak resident memory
-// in MiB, or -1 if the child didn't exit normally; `passed` is what `work`
-// returned.
-inline long peakMiBOfChild(const std::function<bool()>& work, bool& passed) {
-    passed = false;
-    const pid_t pid = ::fork();
-    if (pid < 0) return -1;
-    if (pid == 0) _exit(work() ? 0 : 1);
-    int status = 0;
-    rusage usage = {};
-    if (::wait4(pid, &status, 0, &usage) != pid || !WIFEXITED(status)) return -1;
-    passed = WEXITSTATUS(status) == 0;
-    return usage.ru_maxrss / 1024;
-}
-
-// `work` succeeds in a child whose peak stays under 100 MiB above that of a
-// child that does nothing.
-inline void expectSmallChild(const std::function<bool()>& work, const std::string& what) {
-    bool idle = false, passed = false;
-    const long base = peakMiBOfChild([] { return true; }, idle);
-    const long peak = peakMiBOfChild(work, passed);
-    EXPECT_TRUE(passed) << what;
-    EXPECT_TRUE(base >= 0 && peak >= base) << what << ": " << base << " then " << peak;
-    EXPECT_LT(peak - base, 100) << what;
 }
 
 }  // namespace tempfiles
