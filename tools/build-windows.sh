@@ -1,9 +1,11 @@
 #!/usr/bin/env bash
 # Cross-compiles the library, the orvxml command and the C++ unit tests for
 # Windows x64 into build-windows/ (build-windows/orvxml.exe), with Debian's
-# mingw-w64. The compiler's output is shown only on failure.
+# mingw-w64, installing what is missing first. The compiler's output is shown
+# only on failure. Run the result with Wine: wine build-windows/orvxml.exe
 set -euo pipefail
 cd "$(dirname "$0")/.."
+tools/setup.sh
 mkdir -p build-windows
 if ! { cmake -S . -B build-windows -DCMAKE_BUILD_TYPE=Release \
          -DCMAKE_TOOLCHAIN_FILE=cmake/mingw-w64-x86_64.cmake &&
