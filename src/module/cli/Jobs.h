@@ -30,10 +30,16 @@ FileResult runJob(const Job& job, std::FILE* textOut);
 typedef std::function<void(std::size_t index, const FileResult& result)> ResultSink;
 
 // Runs every job once, on up to `workers` processes, and hands each result
-// to `sink` in this process as it comes in. A worker that dies leaves its
-// file unreadable, with the signal as its reason; jobs no worker took are
-// run here.
+// to `sink` in this process as it comes in (from one thread at a time). A
+// worker that dies leaves its file unreadable, with the signal or status as
+// its reason; jobs no worker took are run here. Once the process is
+// interrupted no job is started; the jobs under way are finished.
 void runJobs(const std::vector<Job>& jobs, unsigned workers, const ResultSink& sink);
+
+// Where workers are separate programs (Windows), a process started with the
+// hidden worker argument first serves its parent's jobs: then this returns
+// true with the exit status. Elsewhere it returns false.
+bool runAsWorker(const std::vector<std::string>& args, int& status);
 
 // The text as UTF-8; a lone surrogate becomes U+FFFD.
 std::string toUtf8(const std::u16string& text);

@@ -57,12 +57,12 @@ std::string jsonLine(const Job& job, const FileResult& r) {
            ", \"characters\": " + std::to_string(r.characters) + ", \"milliseconds\": " + ms + "}";
 }
 
-Collector::Collector(const std::vector<Job>& jobs, bool explain, bool quiet, bool progress,
+Collector::Collector(const std::vector<Job>& jobs, bool explain, bool quiet, platform::Terminal progress,
                      std::FILE* report)
     : jobs_(jobs),
       explain_(explain),
       quiet_(quiet),
-      progress_(progress && !quiet),
+      progress_(quiet ? platform::Terminal::None : progress),
       report_(report),
       results_(jobs.size()),
       arrived_(jobs.size(), false),
@@ -101,25 +101,41 @@ void Collector::emit(std::size_t index) {
 }
 
 void Collector::showProgress(bool force) {
-    if (!progress_) return;
+    if (progress_ == platform::Terminal::None) return;
     const auto now = std::chrono::steady_clock::now();
     // The first file shows the line at once, then it changes ten times a second.
     if (!force && done_ > 1 && now - lastProgress_ < std::chrono::milliseconds(100)) return;
     lastProgress_ = now;
     const double seconds = std::chrono::duration<double>(now - start_).count();
-    std::fprintf(stderr, "\r\033[Korvxml: %zu of %zu files, %.0f files/s", done_, jobs_.size(),
-                 seconds > 0 ? done_ / seconds : 0.0);
+    char line[128];
+    std::snprintf(line, sizeof line, "orvxml: %zu of %zu files, %.0f files/s", done_, jobs_.size(),
+                  seconds > 0 ? done_ / seconds : 0.0);
+    showLine(line);
     std::fflush(stderr);
-    progressShown_ = true;
 }
 
 void Collector::clearProgress() {
     if (!progressShown_) return;
-    std::fputs("\r\033[K", stderr);
-    progressShown_ = false;
+    showLine(std::string());
 }
 
-int Collector::finish() {
+// Replaces the progress line: erased to its end, or where the terminal
+// can't do that, written over with spaces.
+void Collector::showLine(const std::string& line) {
+    if (progress_ == platform::Terminal::Escapes) {
+        std::fprintf(stderr, "\r\033[K%s", line.c_str());
+    } else {
+        const std::size_t pad = progressShown_ > line.size() ? progressShown_ - line.size() : 0;
+        std::fprintf(stderr, "\r%s%s", line.c_str(), std::string(pad, ' ').c_str());
+        if (line.empty()) std::fputc('\r', stderr);
+    }
+    progressShown_ = line.size();
+}
+
+int Collector::finish(int interruption) {
+    // An interrupted run leaves gaps: what came in after one still shows.
+    for (std::size_t i = next_; i < results_.size(); ++i)
+        if (arrived_[i]) emit(i);
     std::fflush(stdout);
     clearProgress();
     if (!quiet_) {
@@ -129,6 +145,11 @@ int Collector::finish() {
                      texts_, unreadable_);
         if (notWritten_) std::fprintf(stderr, ", %zu not written", notWritten_);
         std::fprintf(stderr, " (%.2f s)\n", seconds);
+    }
+    if (interruption) {
+        std::fprintf(stderr, "orvxml: interrupted, %zu of %zu files not converted\n", jobs_.size() - done_,
+                     jobs_.size());
+        return 128 + interruption;
     }
     return documents_ == jobs_.size() && notWritten_ == 0 ? 0 : 1;
 }

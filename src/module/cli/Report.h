@@ -8,6 +8,7 @@
 #include <vector>
 
 #include "module/cli/Jobs.h"
+#include "platform/System.h"
 
 namespace orvxml {
 
@@ -20,25 +21,31 @@ std::string jsonLine(const Job& job, const FileResult& result);
 // the number of workers.
 class Collector {
 public:
-    // `progress`: show the progress line on standard error (a terminal).
-    Collector(const std::vector<Job>& jobs, bool explain, bool quiet, bool progress, std::FILE* report);
+    // `progress`: the terminal that standard error shows on, if any, which
+    // gets the progress line.
+    Collector(const std::vector<Job>& jobs, bool explain, bool quiet, platform::Terminal progress,
+              std::FILE* report);
     void add(std::size_t index, const FileResult& result);
     // Ends the progress line, prints the summary; returns the exit status.
-    int finish();
+    // `interruption`: the signal that stopped the run early, or 0; the
+    // results that came in are passed on all the same.
+    int finish(int interruption);
 
 private:
     void emit(std::size_t index);
     void showProgress(bool force);
     void clearProgress();
+    void showLine(const std::string& line);
 
     const std::vector<Job>& jobs_;
-    const bool explain_, quiet_, progress_;
+    const bool explain_, quiet_;
+    const platform::Terminal progress_;
     std::FILE* report_;
     std::vector<FileResult> results_;
     std::vector<bool> arrived_;
     std::size_t next_ = 0, done_ = 0;
     std::size_t documents_ = 0, texts_ = 0, unreadable_ = 0, notWritten_ = 0;
-    bool progressShown_ = false;
+    std::size_t progressShown_ = 0;  // the length of the line on the terminal
     std::chrono::steady_clock::time_point start_, lastProgress_;
 };
 

@@ -1,13 +1,10 @@
 #include "module/cli/Tree.h"
 
 #include <algorithm>
-#include <cerrno>
 #include <cstring>
 #include <set>
 
-#include <dirent.h>
-#include <sys/stat.h>
-
+#include "platform/System.h"
 #include "platform/Text.h"
 
 namespace orvxml {
@@ -34,15 +31,25 @@ Job makeJob(const std::string& source, const std::string& output) {
     return job;
 }
 
+bool isSeparator(char c) { return std::strchr(platform::kPathSeparators, c) != nullptr && c != '\0'; }
+
+// The separator that a path joined to `dir` takes: the last one that `dir`
+// holds, so that C:\libs gives C:\libs\a.orvmat on Windows; "/" for a
+// path with none.
+char separatorOf(const std::string& dir) {
+    const std::size_t at = dir.find_last_of(platform::kPathSeparators);
+    return at == std::string::npos ? '/' : dir[at];
+}
+
 std::string joinPath(const std::string& dir, const std::string& name) {
-    if (dir.empty() || dir.back() == '/') return dir + name;
-    return dir + "/" + name;
+    if (dir.empty() || isSeparator(dir.back())) return dir + name;
+    return dir + separatorOf(dir) + name;
 }
 
 std::string baseName(const std::string& path) {
     std::string p = path;
-    while (p.size() > 1 && p.back() == '/') p.pop_back();
-    const std::size_t slash = p.rfind('/');
+    while (p.size() > 1 && isSeparator(p.back())) p.pop_back();
+    const std::size_t slash = p.find_last_of(platform::kPathSeparators);
     return slash == std::string::npos ? p : p.substr(slash + 1);
 }
 
@@ -51,32 +58,23 @@ std::string baseName(const std::string& path) {
 // links to folders are not followed, so a loop of links can't trap the walk.
 void walk(const std::string& dir, const std::string& rel, const std::string& outDir,
           std::vector<Job>& jobs) {
-    DIR* d = ::opendir(dir.c_str());
-    if (!d) {
+    std::vector<platform::FolderEntry> entries;
+    if (const int error = platform::listFolder(dir, entries)) {
         Job job = makeJob(dir, std::string());
-        job.refusal = std::string("the folder can't be read: ") + std::strerror(errno);
+        job.refusal = std::string("the folder can't be read: ") + std::strerror(error);
         jobs.push_back(job);
         return;
     }
-    std::vector<std::string> names;
-    while (const dirent* e = ::readdir(d)) {
-        const std::string name = e->d_name;
-        if (name != "." && name != "..") names.push_back(name);
-    }
-    ::closedir(d);
-    std::sort(names.begin(), names.end());
-    for (const std::string& name : names) {
-        const std::string path = joinPath(dir, name);
-        const std::string relPath = rel.empty() ? name : rel + "/" + name;
-        struct stat own;
-        if (::lstat(path.c_str(), &own) != 0) continue;
-        if (S_ISDIR(own.st_mode)) {
+    std::sort(entries.begin(), entries.end(),
+              [](const platform::FolderEntry& a, const platform::FolderEntry& b) { return a.name < b.name; });
+    for (const platform::FolderEntry& entry : entries) {
+        const std::string path = joinPath(dir, entry.name);
+        const std::string relPath = rel.empty() ? entry.name : rel + separatorOf(outDir) + entry.name;
+        if (entry.kind == platform::FolderEntry::Folder) {
             walk(path, relPath, outDir, jobs);
             continue;
         }
-        struct stat target;
-        if (S_ISLNK(own.st_mode) && ::stat(path.c_str(), &target) == 0 && S_ISDIR(target.st_mode))
-            continue;
+        if (entry.kind == platform::FolderEntry::LinkToFolder) continue;
         Job job = makeJob(path, outDir.empty() ? std::string() : joinPath(outDir, relPath + ".xml"));
         if (job.hasKind) jobs.push_back(job);
     }
@@ -87,9 +85,10 @@ void walk(const std::string& dir, const std::string& rel, const std::string& out
 bool collectJobs(const std::vector<std::string>& paths, const std::string& outDir, bool walkFolders,
                  std::vector<Job>& jobs, std::string& error) {
     for (const std::string& path : paths) {
-        struct stat st;
-        const bool exists = ::stat(path.c_str(), &st) == 0;
-        if (exists && S_ISDIR(st.st_mode)) {
+        int openError = 0;
+        const platform::PathKind pathKind = platform::pathKind(path, openError);
+        const bool exists = pathKind != platform::PathKind::Missing;
+        if (pathKind == platform::PathKind::Folder) {
             if (!walkFolders) {
                 error = path + " is a folder: give -o DIR to convert a tree";
                 return false;
@@ -97,7 +96,6 @@ bool collectJobs(const std::vector<std::string>& paths, const std::string& outDi
             walk(path, std::string(), outDir, jobs);
             continue;
         }
-        const int openError = errno;
         Job job = makeJob(path, outDir.empty() ? std::string() : joinPath(outDir, baseName(path) + ".xml"));
         if (!job.hasKind) {
             job.refusal = exists ? "not a .orvmat, .lumat, .orvopt or .luopt file"

@@ -1,50 +1,71 @@
 // orvxml: converts material libraries and render options files to XML, one
 // file, a list or whole trees, and says why a file fell back to text.
+#include <algorithm>
 #include <cerrno>
 #include <cstdio>
 #include <cstring>
 #include <set>
 #include <string>
+#include <thread>
 #include <vector>
-
-#include <sys/stat.h>
-#include <unistd.h>
 
 #include "module/cli/Args.h"
 #include "module/cli/Jobs.h"
 #include "module/cli/Report.h"
 #include "module/cli/Tree.h"
+#include "platform/Interrupt.h"
+#include "platform/Program.h"
+#include "platform/System.h"
 
 namespace {
+
+using platform::PathKind;
 
 int usageError(const std::string& message) {
     std::fprintf(stderr, "orvxml: %s\nTry 'orvxml --help' for more information.\n", message.c_str());
     return 2;
 }
 
-// Creates `dir` and the folders above it that are missing.
-bool makeFolders(const std::string& dir) {
-    for (std::size_t at = dir.find('/', 1);; at = dir.find('/', at + 1)) {
-        const std::string part = dir.substr(0, at);
-        if (!part.empty() && ::mkdir(part.c_str(), 0777) != 0 && errno != EEXIST) return false;
-        if (at == std::string::npos) break;
+bool isFolder(const std::string& path, int& error) { return platform::pathKind(path, error) == PathKind::Folder; }
+
+// Creates `dir` and the folders above it that are missing. Returns 0, or
+// the errno of the failure.
+int makeFolders(const std::string& dir) {
+    int error = 0;
+    if (isFolder(dir, error)) return 0;
+    error = platform::makeFolder(dir);
+    if (error == ENOENT) {
+        const std::size_t end = dir.find_last_not_of(platform::kPathSeparators);
+        const std::size_t at = end == std::string::npos ? end : dir.find_last_of(platform::kPathSeparators, end);
+        if (at != std::string::npos && at > 0 && makeFolders(dir.substr(0, at)) == 0)
+            error = platform::makeFolder(dir);
     }
-    struct stat st;
-    return ::stat(dir.c_str(), &st) == 0 && S_ISDIR(st.st_mode);
+    // Something else of that name, or a link that leads nowhere.
+    if (error == EEXIST) {
+        int why = 0;
+        const PathKind kind = platform::pathKind(dir, why);
+        if (kind == PathKind::Folder) return 0;
+        if (kind == PathKind::Missing) return why;
+    }
+    return error;
 }
 
 std::string folderOf(const std::string& path) {
-    const std::size_t slash = path.rfind('/');
+    const std::size_t slash = path.find_last_of(platform::kPathSeparators);
     return slash == std::string::npos ? std::string(".") : path.substr(0, slash);
 }
 
 }  // namespace
 
-int main(int argc, char** argv) {
+int runProgram(const std::vector<std::string>& args) {
     using namespace orvxml;
+    platform::catchInterrupts();
+    int status = 0;
+    if (runAsWorker(args, status)) return status;
+
     Settings settings;
     std::string error;
-    switch (parseArgs(std::vector<std::string>(argv + 1, argv + argc), settings, error)) {
+    switch (parseArgs(args, settings, error)) {
     case Parsed::Help: std::fputs(kUsage, stdout); return 0;
     case Parsed::Version: std::fputs(kVersion, stdout); return 0;
     case Parsed::UsageError: return usageError(error);
@@ -56,8 +77,8 @@ int main(int argc, char** argv) {
     if (!collectJobs(settings.paths, settings.outDir, !toStdout, jobs, error)) return usageError(error);
 
     if (!settings.outDir.empty()) {
-        if (!makeFolders(settings.outDir))
-            return usageError("can't create the folder " + settings.outDir + ": " + std::strerror(errno));
+        if (const int e = makeFolders(settings.outDir))
+            return usageError("can't create the folder " + settings.outDir + ": " + std::strerror(e));
         std::set<std::string> made;
         for (const Job& job : jobs) {
             if (job.output.empty()) continue;
@@ -67,29 +88,27 @@ int main(int argc, char** argv) {
     }
     std::FILE* report = nullptr;
     if (!settings.reportPath.empty()) {
-        report = std::fopen(settings.reportPath.c_str(), "w");
+        report = platform::openOutputFile(settings.reportPath);
         if (!report)
             return usageError("can't write the report " + settings.reportPath + ": " + std::strerror(errno));
     }
 
     // A lone file on standard output needs no progress line.
-    const bool progress = !toStdout && ::isatty(STDERR_FILENO);
+    const platform::Terminal progress = toStdout ? platform::Terminal::None : platform::errorTerminal();
     Collector collector(jobs, settings.explain, settings.quiet, progress, report);
     if (toStdout) {
-        for (std::size_t i = 0; i < jobs.size(); ++i) collector.add(i, runJob(jobs[i], stdout));
+        for (std::size_t i = 0; i < jobs.size() && !platform::interruption(); ++i)
+            collector.add(i, runJob(jobs[i], stdout));
     } else {
         unsigned workers = settings.jobs;
-        if (workers == 0) {
-            const long cores = ::sysconf(_SC_NPROCESSORS_ONLN);
-            workers = cores > 0 ? static_cast<unsigned>(cores) : 1;
-        }
+        if (workers == 0) workers = std::max(1u, std::thread::hardware_concurrency());
         runJobs(jobs, workers, [&](std::size_t i, const FileResult& r) { collector.add(i, r); });
     }
-    int status = collector.finish();
+    status = collector.finish(platform::interruption());
     if (report && std::fclose(report) != 0) {
         std::fprintf(stderr, "orvxml: can't write the report %s: %s\n", settings.reportPath.c_str(),
                      std::strerror(errno));
-        status = 1;
+        if (status == 0) status = 1;
     }
     return status;
 }

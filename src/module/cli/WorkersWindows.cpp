@@ -1,0 +1,168 @@
+// Workers on Windows, which has no fork(): the program starts itself again
+// with a hidden first argument, as a fresh process. A thread of the parent
+// feeds each worker one job at a time through its standard input and reads
+// the result back from its standard output.
+#include <atomic>
+#include <cstdio>
+#include <memory>
+#include <mutex>
+#include <thread>
+
+#include <io.h>
+
+#include "module/cli/Workers.h"
+#include "platform/Interrupt.h"
+#include "platform/Process.h"
+#include "platform/System.h"
+
+namespace orvxml {
+
+namespace {
+
+// The first argument of a worker; no path starts with "--".
+const char kWorkerArgument[] = "--orvxml-worker";
+
+// Paths are as long as the system allows; the other texts are short.
+constexpr std::size_t kMaxPath = 0xFFFFFFFF;
+
+std::string packJob(std::uint64_t index, const Job& job) {
+    Packer body;
+    body.put(index);
+    body.put(static_cast<std::uint8_t>(job.kind));
+    body.put(static_cast<std::uint8_t>(job.hasKind));
+    body.putText(job.source, kMaxPath);
+    body.putText(std::string(reinterpret_cast<const char*>(job.widePath.data()), 2 * job.widePath.size()),
+                 kMaxPath);
+    body.putText(job.output, kMaxPath);
+    body.putText(job.refusal, kMaxPath);
+    return frame(body.bytes);
+}
+
+bool parseJob(const std::string& body, std::uint64_t& index, Job& job) {
+    Unpacker in(body.data(), body.size());
+    std::uint8_t kind = 0, hasKind = 0;
+    std::string wide;
+    if (!in.get(index) || !in.get(kind) || !in.get(hasKind) || !in.getText(job.source, kMaxPath) ||
+        !in.getText(wide, kMaxPath) || !in.getText(job.output, kMaxPath) || !in.getText(job.refusal, kMaxPath))
+        return false;
+    job.kind = static_cast<OrvaneLumoCore::FileKind>(kind);
+    job.hasKind = hasKind != 0;
+    job.widePath.resize(wide.size() / 2);
+    std::memcpy(&job.widePath[0], wide.data(), 2 * job.widePath.size());
+    return true;
+}
+
+bool writeAll(int fd, const std::string& bytes) {
+    for (std::size_t at = 0; at < bytes.size();) {
+        const int n = ::_write(fd, bytes.data() + at, static_cast<unsigned>(std::min<std::size_t>(bytes.size() - at, 1 << 20)));
+        if (n <= 0) return false;
+        at += static_cast<std::size_t>(n);
+    }
+    return true;
+}
+
+// A worker that was interrupted ends with 128 plus the signal.
+bool interruptedStatus(unsigned long status) { return status > 128 && status < 128 + 32; }
+
+std::string stopReason(unsigned long status) {
+    char text[32];
+    // Exceptions (0xC0000005, an access violation) read best in hex.
+    std::snprintf(text, sizeof text, status >= 0xC0000000ul ? "0x%08lX" : "%lu", status);
+    return std::string("the conversion stopped with status ") + text;
+}
+
+// Feeds one worker until no job is left, the process is interrupted or the
+// worker ends.
+void feed(platform::ChildProcess& child, const std::vector<Job>& jobs, std::atomic<std::size_t>& next,
+          std::vector<bool>& reported, std::mutex& lock, const ResultSink& sink) {
+    FrameReader frames;
+    std::string body;
+    char chunk[1 << 16];
+    while (!platform::interruption()) {
+        const std::size_t i = next.fetch_add(1);
+        if (i >= jobs.size()) break;
+        // A worker gone before it got the job leaves it to the others.
+        if (!child.write(packJob(i, jobs[i]))) break;
+        bool whole = false;
+        while (!(whole = frames.next(body))) {
+            const std::size_t n = child.read(chunk, sizeof chunk);
+            if (n == 0) break;
+            frames.append(chunk, n);
+        }
+        Message m;
+        if (whole && parseMessage(body.data(), body.size(), m) && m.type == MessageType::Finished &&
+            m.index == i) {
+            std::lock_guard<std::mutex> hold(lock);
+            reported[i] = true;
+            sink(i, m.result);
+            continue;
+        }
+        // The worker ended while it held job i: unless it stopped for an
+        // interruption, the file is what ended it.
+        child.closeInput();
+        const unsigned long status = child.wait();
+        if (!interruptedStatus(status) && !platform::interruption()) {
+            if (!jobs[i].output.empty()) platform::removeFile(partPath(jobs[i].output, child.id()));
+            std::lock_guard<std::mutex> hold(lock);
+            reported[i] = true;
+            sink(i, stopped(stopReason(status)));
+        }
+        return;
+    }
+    child.closeInput();
+    child.wait();
+}
+
+}  // namespace
+
+bool runAsWorker(const std::vector<std::string>& args, int& status) {
+    if (args.empty() || args[0] != kWorkerArgument) return false;
+    FrameReader frames;
+    std::string body;
+    char chunk[1 << 16];
+    status = 0;
+    for (;;) {
+        while (!frames.next(body)) {
+            const int n = ::_read(0, chunk, sizeof chunk);
+            if (n <= 0) {
+                status = platform::interruption() ? 128 + platform::interruption() : 0;
+                return true;
+            }
+            frames.append(chunk, static_cast<std::size_t>(n));
+        }
+        Message m;
+        Job job;
+        if (!parseJob(body, m.index, job)) {
+            status = 2;
+            return true;
+        }
+        m.type = MessageType::Finished;
+        m.result = runJob(job, nullptr);
+        if (!writeAll(1, packMessage(m))) return true;
+        // A job taken is finished; an interrupted worker takes no more.
+        if (platform::interruption()) {
+            status = 128 + platform::interruption();
+            return true;
+        }
+    }
+}
+
+void runJobs(const std::vector<Job>& jobs, unsigned workers, const ResultSink& sink) {
+    std::vector<bool> reported(jobs.size(), false);
+    if (workers > jobs.size()) workers = static_cast<unsigned>(jobs.size());
+    std::vector<std::unique_ptr<platform::ChildProcess>> children;
+    for (unsigned w = 0; workers > 1 && w < workers; ++w) {
+        std::unique_ptr<platform::ChildProcess> child(new platform::ChildProcess);
+        if (child->startSelf({kWorkerArgument})) children.push_back(std::move(child));
+    }
+    std::atomic<std::size_t> next(0);
+    std::mutex lock;
+    std::vector<std::thread> threads;
+    for (auto& child : children)
+        threads.emplace_back([&, worker = child.get()] { feed(*worker, jobs, next, reported, lock, sink); });
+    for (std::thread& t : threads) t.join();
+    // Jobs that no worker finished, if workers stopped early or couldn't start.
+    runHere(jobs, reported, sink);
+}
+
+}  // namespace orvxml

@@ -1,0 +1,4 @@
+// The entry point on POSIX systems: the arguments are bytes already.
+#include "platform/Program.h"
+
+int main(int argc, char** argv) { return runProgram(std::vector<std::string>(argv + 1, argv + argc)); }
