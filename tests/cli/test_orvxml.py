@@ -7,10 +7,12 @@ Standard library only; ORVXML names the binary, ORVXML_SOURCE_DIR the tree.
 import json
 import os
 import shutil
+import signal
 import struct
 import subprocess
 import sys
 import tempfile
+import time
 import unittest
 
 ORVXML = os.environ.get('ORVXML', 'build/orvxml')
@@ -272,6 +274,52 @@ class Report(Tree):
             written = self.read(self.path('out', name)).decode('utf-8')
             self.assertEqual(r['characters'], len(written))
         self.assertEqual(rows[2]['characters'], 0)
+
+
+class Interrupts(Tree):
+    """An interrupted run stops between files: every output is whole, no part
+    file is left, and the status says which signal stopped it."""
+    COPIES = 3000
+
+    def interrupt(self, sig, jobs, whole_group):
+        source = self.copy('materials_all_layers.orvmat', 'in/0000.orvmat')
+        for i in range(1, self.COPIES):
+            shutil.copyfile(source, self.path('in', '%04d.orvmat' % i))
+        out, report = self.path('out'), self.path('report.jsonl')
+        p = subprocess.Popen([ORVXML, '-j', str(jobs), '--report', report, '-o', out,
+                              self.path('in')], stdout=subprocess.PIPE, stderr=subprocess.PIPE,
+                             start_new_session=True)
+        # The signal comes once the first file is written, long before the last.
+        deadline = time.time() + 30
+        while not (os.path.isdir(out) and os.listdir(out)) and time.time() < deadline:
+            time.sleep(0.002)
+        if whole_group:  # as a terminal's Ctrl-C reaches every process of the job
+            os.killpg(p.pid, sig)
+        else:
+            p.send_signal(sig)
+        _, err = p.communicate(timeout=60)
+        self.assertEqual(p.returncode, 128 + sig, err)
+        last = err.decode('utf-8').splitlines()[-1]
+        self.assertRegex(last, r'^orvxml: interrupted, \d+ of %d files not converted$' % self.COPIES)
+        missing = int(last.split()[2])
+        self.assertGreater(missing, 0)
+        written = os.listdir(out)
+        self.assertEqual(len(written), self.COPIES - missing)
+        self.assertEqual([n for n in written if not n.endswith('.orvmat.xml')], [])
+        expected = run(source)[1]
+        for name in written:
+            self.assertEqual(self.read(os.path.join(out, name)), expected, name)
+        with open(report) as f:
+            self.assertEqual(len(f.readlines()), len(written))
+
+    def test_ctrl_c_reaches_every_process(self):
+        self.interrupt(signal.SIGINT, 2, True)
+
+    def test_sigterm_to_the_parent_is_passed_to_the_workers(self):
+        self.interrupt(signal.SIGTERM, 2, False)
+
+    def test_sighup_without_workers(self):
+        self.interrupt(signal.SIGHUP, 1, False)
 
 
 if __name__ == '__main__':
