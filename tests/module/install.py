@@ -17,12 +17,13 @@ from support import BUILD, SOURCE, ScratchTest, convert_elsewhere, convert_here,
 
 WHEELS = '/usr/share/python-wheels'   # Debian's pip and setuptools, for --find-links
 STUB = os.path.join(SOURCE, 'src', 'module', 'python', 'PyOrvXml.pyi')
-# The module file and the wheel's tag for the interpreter that runs the tests.
+# The module file and the wheel's tag for the interpreter that runs the tests:
+# a manylinux tag for Python 3, from what the files need of the system.
 if sys.version_info[0] < 3:
     MODULE, TAG = 'PyOrvXml.so', 'cp27-cp27mu-linux_x86_64'
 else:
     MODULE = 'PyOrvXml' + sysconfig.get_config_var('EXT_SUFFIX')
-    TAG = 'cp%d%d-cp%d%d-linux_x86_64' % (sys.version_info[:2] * 2)
+    TAG = 'cp%d%d-cp%d%d-manylinux_2_34_x86_64' % (sys.version_info[:2] * 2)
 
 
 def build_has_command():
@@ -91,6 +92,25 @@ class Install(ScratchTest):
             self.assertIn('\nVersion: %s\n' % version, meta)
             self.assertEqual(wheel.getinfo(module_name).external_attr >> 16, 0o100755)
             self.assertEqual(wheel.read('PyOrvXml.pyi'), read(STUB))
+            if 'manylinux' in tag:
+                self.check_platform(wheel, tag.split('-')[2])
+
+    def check_platform(self, wheel, platform):
+        """The wheel's ELF files, as binutils read them, earn its platform tag."""
+        from test3_manylinux import manylinux, readelf_needs
+        needs = {}
+        folder = os.path.join(self.dir, 'elf')
+        os.mkdir(folder)
+        for name in wheel.namelist():
+            data = wheel.read(name)
+            if data.startswith(b'\x7fELF'):
+                path = os.path.join(folder, os.path.basename(name))
+                with open(path, 'wb') as f:
+                    f.write(data)
+                needs[name] = readelf_needs(path)
+                self.assertEqual(manylinux.read_needs(path), needs[name], name)
+        self.assertEqual(len(needs), 2 if build_has_command() else 1)
+        self.assertEqual(manylinux.platform_tag(needs) + '_x86_64', platform)
 
     def check_command(self, bin_dir):
         command = os.path.join(bin_dir, 'orvxml')

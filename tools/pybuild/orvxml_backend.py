@@ -5,8 +5,9 @@ A PEP 517 build backend (pyproject.toml names it, with backend-path) that
 needs nothing beyond the interpreter and CMake: it configures the project in a
 temporary folder for the interpreter that runs it, builds only the model
 library, that interpreter's module and the command-line program (when the
-project has one), and writes the wheel itself. It runs under CPython 2.7 too,
-where tools/wheel.sh calls it directly:
+project has one), and writes the wheel itself, for Python 3 tagged with the
+manylinux policy that its ELF files satisfy (manylinux.py reads them). It runs
+under CPython 2.7 too, where tools/wheel.sh calls it directly:
 
     python orvxml_backend.py OUTDIR     # prints the path of the wheel
 """
@@ -22,6 +23,8 @@ import sys
 import sysconfig
 import tempfile
 import zipfile
+
+import manylinux
 
 ROOT = os.path.dirname(os.path.dirname(os.path.dirname(os.path.abspath(__file__))))
 STUB = os.path.join('src', 'module', 'python', 'PyOrvXml.pyi')
@@ -50,11 +53,10 @@ def normalized(name):
     return re.sub(r'[-_.]+', '_', name).lower()
 
 
-def tags():
+def tags(platform):
     """(python, abi, platform) of the wheel for the running interpreter."""
     if getattr(sys, 'implementation', None) is not None and sys.implementation.name != 'cpython':
         raise RuntimeError('PyOrvXml builds for CPython only')
-    platform = re.sub(r'[-.]', '_', sysconfig.get_platform())
     if sys.version_info[0] >= 3:
         if sys.version_info[:2] < OLDEST_PYTHON3:
             raise RuntimeError('PyOrvXml needs Python 2.7 or %d.%d and later' % OLDEST_PYTHON3)
@@ -67,13 +69,30 @@ def tags():
     return 'cp27', abi, platform
 
 
-def wheel_name():
+def platform_tag(paths):
+    """The wheel's platform tag. For Python 3 on x86-64 Linux, the oldest
+    manylinux policy that the ELF files among paths satisfy, so that pip
+    installs the wheel on other distributions too, and only where it loads;
+    else, and for 2.7 (whose pip 19 knows no manylinux_2_NN tag), the
+    interpreter's own platform."""
+    platform = re.sub(r'[-.]', '_', sysconfig.get_platform())
+    if sys.version_info[0] < 3 or platform != 'linux_x86_64':
+        return platform
+    needs = dict((os.path.basename(path), manylinux.read_needs(path))
+                 for path in paths if manylinux.is_elf(path))
+    try:
+        return manylinux.platform_tag(needs) + '_x86_64'
+    except manylinux.PolicyError as e:
+        raise RuntimeError('the wheel fits no manylinux tag:\n%s' % e)
+
+
+def wheel_name(platform):
     meta = project()
-    return '%s-%s-%s.whl' % (normalized(meta['name']), meta['version'], '-'.join(tags()))
+    return '%s-%s-%s.whl' % (normalized(meta['name']), meta['version'], '-'.join(tags(platform)))
 
 
-def metadata_files():
-    """Name and content of METADATA and WHEEL."""
+def metadata():
+    """The content of METADATA."""
     meta = project()
     metadata = ['Metadata-Version: 2.1',
                 'Name: ' + meta['name'],
@@ -82,11 +101,16 @@ def metadata_files():
                        ('license', 'License')):
         if key in meta:
             metadata.append('%s: %s' % (field, meta[key]))
+    return '\n'.join(metadata) + '\n'
+
+
+def wheel_file(platform):
+    """The content of WHEEL, with the wheel's tag."""
     wheel = ['Wheel-Version: 1.0',
-             'Generator: orvxml_backend (%s)' % meta['version'],
+             'Generator: orvxml_backend (%s)' % project()['version'],
              'Root-Is-Purelib: false',
-             'Tag: ' + '-'.join(tags())]
-    return [('METADATA', '\n'.join(metadata) + '\n'), ('WHEEL', '\n'.join(wheel) + '\n')]
+             'Tag: ' + '-'.join(tags(platform))]
+    return '\n'.join(wheel) + '\n'
 
 
 def dist_info():
@@ -153,11 +177,12 @@ def record_line(name, data):
     return '%s,sha256=%s,%d' % (name, digest.decode('ascii'), len(data))
 
 
-def write_wheel(path, files):
+def write_wheel(path, files, platform):
     """Writes the wheel: files is [(name in the wheel, bytes, executable)]."""
     info = dist_info()
     files = list(files) + [(info + '/' + name, text.encode('utf-8'), False)
-                           for name, text in metadata_files()]
+                           for name, text in (('METADATA', metadata()),
+                                              ('WHEEL', wheel_file(platform)))]
     record = [record_line(name, data) for name, data, _ in files]
     record.append(info + '/RECORD,,')
     files.append((info + '/RECORD', ('\n'.join(record) + '\n').encode('utf-8'), False))
@@ -181,12 +206,13 @@ def get_requires_for_build_wheel(config_settings=None):
 
 
 def prepare_metadata_for_build_wheel(metadata_directory, config_settings=None):
+    # METADATA alone: the WHEEL file's tag comes from the built files, so it
+    # is written only into the wheel.
     folder = os.path.join(metadata_directory, dist_info())
     if not os.path.isdir(folder):
         os.makedirs(folder)
-    for name, text in metadata_files():
-        with open(os.path.join(folder, name), 'wb') as f:
-            f.write(text.encode('utf-8'))
+    with open(os.path.join(folder, 'METADATA'), 'wb') as f:
+        f.write(metadata().encode('utf-8'))
     return dist_info()
 
 
@@ -203,10 +229,11 @@ def build_wheel(wheel_directory, config_settings=None, metadata_directory=None):
                 files.append((scripts + name, read(path), True))
             else:
                 files.append((name, read(path), True))
-        name = wheel_name()
+        platform = platform_tag([path for _, path in built])
+        name = wheel_name(platform)
         if not os.path.isdir(wheel_directory):
             os.makedirs(wheel_directory)
-        write_wheel(os.path.join(wheel_directory, name), files)
+        write_wheel(os.path.join(wheel_directory, name), files, platform)
         return name
     finally:
         shutil.rmtree(folder, ignore_errors=True)
