@@ -114,7 +114,9 @@ int listFolder(const std::string& dir, std::vector<FolderEntry>& entries) {
     if (h == INVALID_HANDLE_VALUE) {
         // A drive's root may hold no entry at all, not even ".".
         const DWORD e = GetLastError();
-        return e == ERROR_FILE_NOT_FOUND || e == ERROR_NO_MORE_FILES ? 0 : errnoOf(e);
+        const DWORD attributes = GetFileAttributesW(native(dir).c_str());
+        const bool folder = attributes != INVALID_FILE_ATTRIBUTES && (attributes & FILE_ATTRIBUTE_DIRECTORY);
+        return e == ERROR_FILE_NOT_FOUND && folder ? 0 : errnoOf(e);
     }
     do {
         FolderEntry entry;
