@@ -16,6 +16,10 @@ namespace platform {
 // also "\".
 extern const char kPathSeparators[];
 
+// Whether names that differ only in the case of letters name one file, as
+// on Windows.
+extern const bool kNamesIgnoreCase;
+
 enum class PathKind { Missing, Folder, Other };
 
 // What `path` names, following links. For Missing, `error` says why.

@@ -11,6 +11,7 @@
 namespace platform {
 
 const char kPathSeparators[] = "/";
+const bool kNamesIgnoreCase = false;
 
 PathKind pathKind(const std::string& path, int& error) {
     struct stat st;

@@ -82,6 +82,7 @@ int lastErrno() { return errnoOf(GetLastError()); }
 }  // namespace
 
 const char kPathSeparators[] = "/\\";
+const bool kNamesIgnoreCase = true;
 
 PathKind pathKind(const std::string& path, int& error) {
     const std::wstring wide = native(path);

@@ -251,6 +251,21 @@ class WindowsCases(Scratch):
         self.assertEqual(sorted(files_under(self.path('w'))),
                          ['inner.orvmat.xml', 'x.orvmat/inner.orvmat.xml'])
 
+    def test_outputs_whose_names_differ_only_in_case(self):
+        first = self.copy('render_settings.orvopt', 'x', 'a.orvopt')
+        second = self.copy('old_settings_v4.luopt', 'y', 'A.ORVOPT')
+        code, out, _ = run('linux', ['-q', '-o', self.path('linux'), first, second], self.tmp)
+        self.assertEqual(sorted(os.listdir(self.path('linux'))), ['A.ORVOPT.xml', 'a.orvopt.xml'])
+        # One file on Windows: the second is refused, the first stays whole.
+        code, out, _ = run('windows', ['-q', '--explain', '-o', self.path('out'), first, second],
+                           self.tmp)
+        self.assertEqual(code, 1)
+        self.assertEqual(out.decode('utf-8').splitlines()[1],
+                         '%s: unreadable: its output %s is written for an earlier file'
+                         % (second, self.path('out', 'A.ORVOPT.xml')))
+        self.assertEqual(files_under(self.path('out')),
+                         {'a.orvopt.xml': read(self.path('linux', 'a.orvopt.xml'))})
+
     def test_the_nul_device(self):
         code, out, _ = run('windows', ['--explain', 'NUL'], self.tmp)
         self.assertEqual((code, out), (1, b'NUL: unreadable: not a .orvmat, .lumat, .orvopt or .luopt file\n'))

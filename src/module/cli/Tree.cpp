@@ -53,6 +53,18 @@ std::string baseName(const std::string& path) {
     return slash == std::string::npos ? p : p.substr(slash + 1);
 }
 
+// What two paths of one file have in common, as far as the names tell:
+// every separator as "/", and where case doesn't matter, ASCII letters in
+// lower case.
+std::string sameFileKey(const std::string& path) {
+    std::string key = path;
+    for (char& c : key) {
+        if (isSeparator(c)) c = '/';
+        if (platform::kNamesIgnoreCase && c >= 'A' && c <= 'Z') c = static_cast<char>(c - 'A' + 'a');
+    }
+    return key;
+}
+
 // Walks `dir` (mirrored as `rel` under the output folder): files of the four
 // extensions become jobs, other files are skipped, subfolders are walked;
 // links to folders are not followed, so a loop of links can't trap the walk.
@@ -108,7 +120,7 @@ bool collectJobs(const std::vector<std::string>& paths, const std::string& outDi
     std::set<std::string> outputs;
     for (Job& job : jobs) {
         if (job.output.empty() || !job.refusal.empty()) continue;
-        if (!outputs.insert(job.output).second) {
+        if (!outputs.insert(sameFileKey(job.output)).second) {
             job.refusal = "its output " + job.output + " is written for an earlier file";
             job.output.clear();
         }
