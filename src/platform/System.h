@@ -50,6 +50,10 @@ int replaceFile(const std::string& from, const std::string& to);
 
 void removeFile(const std::string& path);
 
+// Writes all of `bytes` to the open file descriptor `fd` (a pipe, standard
+// output), through any number of partial writes. False on an error.
+bool writeAll(int fd, const std::string& bytes);
+
 // Opens `path` for writing bytes as they are given (no line end
 // translation), emptied first. nullptr with errno set if it can't.
 std::FILE* openOutputFile(const std::string& path);

@@ -48,9 +48,9 @@ int listFolder(const std::string& dir, std::vector<FolderEntry>& entries) {
 
 int makeFolder(const std::string& path) { return ::mkdir(path.c_str(), 0777) == 0 ? 0 : errno; }
 
-namespace {
-
-bool writeAll(int fd, const char* data, std::size_t size) {
+bool writeAll(int fd, const std::string& bytes) {
+    const char* data = bytes.data();
+    std::size_t size = bytes.size();
     while (size > 0) {
         const ssize_t n = ::write(fd, data, size);
         if (n < 0 && errno == EINTR) continue;
@@ -61,12 +61,10 @@ bool writeAll(int fd, const char* data, std::size_t size) {
     return true;
 }
 
-}  // namespace
-
 int writeNewFile(const std::string& path, const std::string& bytes) {
     const int fd = ::open(path.c_str(), O_WRONLY | O_CREAT | O_TRUNC | O_CLOEXEC, 0666);
     if (fd < 0) return errno;
-    const bool written = writeAll(fd, bytes.data(), bytes.size());
+    const bool written = writeAll(fd, bytes);
     const int writeErrno = errno;
     if (::close(fd) != 0 || !written) {
         const int e = written ? errno : writeErrno;

@@ -2,10 +2,12 @@
 // paths, in the "\\?\" form beyond the classic length limit.
 #include "platform/System.h"
 
+#include <algorithm>
 #include <cerrno>
 #include <cstdio>
 #include <cwchar>
 
+#include <io.h>
 #include <windows.h>
 
 #include "platform/Windows.h"
@@ -172,6 +174,16 @@ int replaceFile(const std::string& from, const std::string& to) {
 }
 
 void removeFile(const std::string& path) { DeleteFileW(native(path).c_str()); }
+
+bool writeAll(int fd, const std::string& bytes) {
+    for (std::size_t at = 0; at < bytes.size();) {
+        const unsigned piece = static_cast<unsigned>(std::min<std::size_t>(bytes.size() - at, 1u << 20));
+        const int n = _write(fd, bytes.data() + at, piece);
+        if (n <= 0) return false;
+        at += static_cast<std::size_t>(n);
+    }
+    return true;
+}
 
 std::FILE* openOutputFile(const std::string& path) { return _wfopen(native(path).c_str(), L"wb"); }
 

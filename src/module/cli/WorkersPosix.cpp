@@ -29,19 +29,6 @@ namespace {
 static_assert(4 + 1 + 4 + 8 + 1 + 8 + 8 + 3 * (2 + kMaxText) <= PIPE_BUF,
               "a message is written in one piece");
 
-bool writeAll(int fd, const std::string& bytes) {
-    const char* data = bytes.data();
-    std::size_t size = bytes.size();
-    while (size > 0) {
-        const ssize_t n = ::write(fd, data, size);
-        if (n < 0 && errno == EINTR) continue;
-        if (n <= 0) return false;
-        data += n;
-        size -= static_cast<std::size_t>(n);
-    }
-    return true;
-}
-
 // The next job's index, shared by all workers through a shared page.
 struct SharedCounter {
     SharedCounter() {
@@ -65,10 +52,10 @@ static_assert(std::atomic<std::uint64_t>::is_always_lock_free, "the counter is s
         m.worker = worker;
         m.index = next.fetch_add(1);
         if (m.index >= jobs.size()) break;
-        if (!writeAll(fd, packMessage(m))) break;
+        if (!platform::writeAll(fd, packMessage(m))) break;
         m.type = MessageType::Finished;
         m.result = runJob(jobs[m.index], nullptr);
-        if (!writeAll(fd, packMessage(m))) break;
+        if (!platform::writeAll(fd, packMessage(m))) break;
     }
     ::_exit(platform::interruption() ? 128 + platform::interruption() : 0);
 }

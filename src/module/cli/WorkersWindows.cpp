@@ -52,15 +52,6 @@ bool parseJob(const std::string& body, std::uint64_t& index, Job& job) {
     return true;
 }
 
-bool writeAll(int fd, const std::string& bytes) {
-    for (std::size_t at = 0; at < bytes.size();) {
-        const int n = ::_write(fd, bytes.data() + at, static_cast<unsigned>(std::min<std::size_t>(bytes.size() - at, 1 << 20)));
-        if (n <= 0) return false;
-        at += static_cast<std::size_t>(n);
-    }
-    return true;
-}
-
 // A worker that was interrupted ends with 128 plus the signal.
 bool interruptedStatus(unsigned long status) { return status > 128 && status < 128 + 32; }
 
@@ -138,7 +129,7 @@ bool runAsWorker(const std::vector<std::string>& args, int& status) {
         }
         m.type = MessageType::Finished;
         m.result = runJob(job, nullptr);
-        if (!writeAll(1, packMessage(m))) return true;
+        if (!platform::writeAll(1, packMessage(m))) return true;
         // A job taken is finished; an interrupted worker takes no more.
         if (platform::interruption()) {
             status = 128 + platform::interruption();
