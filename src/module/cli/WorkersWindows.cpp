@@ -89,11 +89,12 @@ void feed(platform::ChildProcess& child, const std::vector<Job>& jobs, std::atom
             continue;
         }
         // The worker ended while it held job i: unless it stopped for an
-        // interruption, the file is what ended it.
+        // interruption, the file is what ended it. Either way a write it
+        // began is gone.
         child.closeInput();
         const unsigned long status = child.wait();
-        if (!interruptedStatus(status) && !platform::interruption()) {
-            if (!jobs[i].output.empty()) platform::removeFile(partPath(jobs[i].output, child.id()));
+        if (!jobs[i].output.empty()) platform::removeFile(partPath(jobs[i].output, child.id()));
+        if (!interruptedStatus(status)) {
             std::lock_guard<std::mutex> hold(lock);
             reported[i] = true;
             sink(i, stopped(stopReason(status)));
