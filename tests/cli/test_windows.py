@@ -339,8 +339,11 @@ class Processes(Scratch):
                               '-o', self.out, self.path('in')], cwd=self.tmp, env=env,
                              stdout=subprocess.PIPE, stderr=subprocess.PIPE)
         self.addCleanup(self.stop, p)
+        # Each of the first jobs went to a worker of its own: once all are
+        # written, every worker runs and has its handlers in place.
+        first = [os.path.join(self.out, '%04d.orvmat.xml' % i) for i in range(jobs)]
         deadline = time.time() + 60
-        while not (os.path.isdir(self.out) and os.listdir(self.out)) and time.time() < deadline:
+        while not all(map(os.path.exists, first)) and time.time() < deadline:
             time.sleep(0.005)
         self.expected = run('linux', [source], self.tmp)[1]
         return p

@@ -52,8 +52,11 @@ bool parseJob(const std::string& body, std::uint64_t& index, Job& job) {
     return true;
 }
 
-// A worker that was interrupted ends with 128 plus the signal.
-bool interruptedStatus(unsigned long status) { return status > 128 && status < 128 + 32; }
+// A worker that was interrupted ends with 128 plus the signal, or, ended
+// by Ctrl-C before its handler was in place, with STATUS_CONTROL_C_EXIT.
+bool interruptedStatus(unsigned long status) {
+    return (status > 128 && status < 128 + 32) || status == 0xC000013Aul;
+}
 
 std::string stopReason(unsigned long status) {
     char text[32];
@@ -89,12 +92,15 @@ void feed(platform::ChildProcess& child, const std::vector<Job>& jobs, std::atom
             continue;
         }
         // The worker ended while it held job i: unless it stopped for an
-        // interruption, the file is what ended it. Either way a write it
-        // began is gone.
+        // interruption, the file is what ended it. A Ctrl-C reaches every
+        // process of the console, and one that comes while a worker starts
+        // ends it before its handler is in place: once this process is
+        // interrupted too, the file is left unconverted, not unreadable.
+        // Either way a write the worker began is gone.
         child.closeInput();
         const unsigned long status = child.wait();
         if (!jobs[i].output.empty()) platform::removeFile(partPath(jobs[i].output, child.id()));
-        if (!interruptedStatus(status)) {
+        if (!interruptedStatus(status) && !platform::interruption()) {
             std::lock_guard<std::mutex> hold(lock);
             reported[i] = true;
             sink(i, stopped(stopReason(status)));
