@@ -47,15 +47,15 @@ def setUpModule():
             raise AssertionError('%s is missing: build it first' % path)
     if not shutil.which('wine'):
         raise AssertionError('wine is not installed')
+    # The first start may make the prefix and say so on standard error.
+    subprocess.run(['wine', WINDOWS, '--version'], env=WINE_ENV, stdout=subprocess.DEVNULL,
+                   stderr=subprocess.DEVNULL, timeout=300, check=True)
     # Wine's server lives on while a Windows process of the prefix does. One
     # that a run started would hold that run's output pipes open until it
     # ends, seconds later: a cmd waiting on its input keeps one server,
     # started without those pipes, for the whole module.
     KEEPER = subprocess.Popen(['wine', 'cmd'], env=WINE_ENV, stdin=subprocess.PIPE,
                               stdout=subprocess.DEVNULL, stderr=subprocess.DEVNULL)
-    # The first start may make the prefix and say so on standard error.
-    subprocess.run(['wine', WINDOWS, '--version'], env=WINE_ENV, stdout=subprocess.DEVNULL,
-                   stderr=subprocess.DEVNULL, timeout=300, check=True)
 
 
 def tearDownModule():
