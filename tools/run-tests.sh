@@ -13,7 +13,7 @@ tools/build.sh
 
 tools/build-windows.sh
 # The first start makes Wine's prefix (about 15 s); the tests then share it.
-WINEPREFIX="$PWD/build-windows/wineprefix" WINEDEBUG=-all LC_ALL=en_US.UTF-8 wine build-windows/orvxml.exe --version
+WINEPREFIX="$PWD/build-windows/wineprefix" WINEDEBUG=-all LC_ALL=C.UTF-8 wine build-windows/orvxml.exe --version
 (cd build-windows && ctest --output-on-failure -j"$(nproc)")
 
 mkdir -p build-asan
