@@ -16,6 +16,16 @@ void openForWriting(std::ofstream& file, const std::u16string& path) {
     file.open(nativePath(path), std::ios::out | std::ios::binary | std::ios::trunc);
 }
 
+RegularFile::~RegularFile() { close(); }
+
+bool RegularFile::open(const std::u16string& path) {
+    close();
+    size_ = 0;
+    notRegular_ = false;
+    error_ = 0;
+    return openNative(path);
+}
+
 std::size_t MemoryBytes::readAt(std::uint64_t offset, void* dst, std::size_t n) const {
     if (offset >= size_) return 0;
     const std::size_t count = static_cast<std::size_t>(std::min<std::uint64_t>(n, size_ - offset));

@@ -67,6 +67,8 @@ private:
     // A file descriptor, or a Windows HANDLE; -1 is the closed value of both.
     static constexpr std::intptr_t kClosed = -1;
     void close();
+    // The system's part of open(), on a closed file with no error noted.
+    bool openNative(const std::u16string& path);
 
     std::intptr_t handle_ = kClosed;
     std::uint64_t size_ = 0;

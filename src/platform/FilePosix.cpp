@@ -17,18 +17,12 @@ std::filesystem::path nativePath(const std::u16string& path) {
     return std::filesystem::path(encodeUtf8(path.data(), path.size()));
 }
 
-RegularFile::~RegularFile() { close(); }
-
 void RegularFile::close() {
     if (handle_ != kClosed) ::close(static_cast<int>(handle_));
     handle_ = kClosed;
 }
 
-bool RegularFile::open(const std::u16string& path) {
-    close();
-    size_ = 0;
-    notRegular_ = false;
-    error_ = 0;
+bool RegularFile::openNative(const std::u16string& path) {
     const std::string native = nativePath(path).native();
     // O_NONBLOCK: opening a FIFO with no writer returns at once instead of
     // waiting. It has no effect on reads from a regular file.

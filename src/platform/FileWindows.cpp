@@ -58,18 +58,12 @@ int errnoOf(unsigned long windowsError) {
 
 std::filesystem::path nativePath(const std::u16string& path) { return std::filesystem::path(extendedPath(path)); }
 
-RegularFile::~RegularFile() { close(); }
-
 void RegularFile::close() {
     if (handle_ != kClosed) CloseHandle(reinterpret_cast<HANDLE>(handle_));
     handle_ = kClosed;
 }
 
-bool RegularFile::open(const std::u16string& path) {
-    close();
-    size_ = 0;
-    notRegular_ = false;
-    error_ = 0;
+bool RegularFile::openNative(const std::u16string& path) {
     if (path.empty()) {
         error_ = ENOENT;
         return false;
