@@ -37,8 +37,12 @@ const char kUsage[] =
     "Progress goes to standard error while it is a terminal; a summary line\n"
     "(converted, fell back to text, unreadable) ends every run.\n"
     "\n"
+    "Ctrl-C, SIGINT, SIGTERM and SIGHUP stop the run between two files: the\n"
+    "outputs written so far stay, and no partial file is left.\n"
+    "\n"
     "Exit status: 0 if every file became a document, 1 if any file fell back to\n"
-    "text or could not be read (its text is still written), 2 for a usage error.\n";
+    "text or could not be read (its text is still written), 2 for a usage error,\n"
+    "128 + the signal's number if the run was stopped (130 for Ctrl-C).\n";
 
 namespace {
 
