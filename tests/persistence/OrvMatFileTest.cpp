@@ -9,7 +9,7 @@ using namespace OrvaneLumoCore;
 
 namespace {
 
-std::string header(std::uint32_t tag, std::uint32_t count) {
+std::string containerHeader(std::uint32_t tag, std::uint32_t count) {
     std::string h(8, '\0');
     for (int i = 0; i < 4; ++i) {
         h[i] = static_cast<char>(tag >> (8 * i));
@@ -23,12 +23,12 @@ TEST(OrvMatFile, RefusedHeaders) {
     const std::string files[] = {
         "",                             // nothing
         std::string("\0\0\3\0", 4),     // shorter than the header
-        header(0x30000, 0) + body,      // no materials
-        header(0x20001, 1) + body,      // low half set
-        header(0x40000, 1) + body,      // unknown container version
-        header(0x30000, 1) + std::string("\0\0\0\0", 4),  // no blocks
-        header(0x20000, 1) + std::string("\x0F\0\0\0", 4) + body,  // type tag without a class
-        header(0x20000, 1000) + body,   // more materials than bytes
+        containerHeader(0x30000, 0) + body,      // no materials
+        containerHeader(0x20001, 1) + body,      // low half set
+        containerHeader(0x40000, 1) + body,      // unknown container version
+        containerHeader(0x30000, 1) + std::string("\0\0\0\0", 4),  // no blocks
+        containerHeader(0x20000, 1) + std::string("\x0F\0\0\0", 4) + body,  // type tag without a class
+        containerHeader(0x20000, 1000) + body,   // more materials than bytes
     };
     for (const std::string& f : files) {
         OrvMatFile file;
