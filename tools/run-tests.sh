@@ -17,8 +17,9 @@ WINEPREFIX="$PWD/build-windows/wineprefix" WINEDEBUG=-all LC_ALL=C.UTF-8 wine bu
 (cd build-windows && ctest --output-on-failure -j"$(nproc)")
 
 mkdir -p build-asan
+# A unity build, as the Windows leg's: it compiles in less than half the time.
 if ! { cmake -S . -B build-asan -DCMAKE_BUILD_TYPE=Debug -DORVXML_SANITIZE=ON \
-         -DORVXML_BUILD_MODULE=OFF -DORVXML_BUILD_BENCH=OFF &&
+         -DORVXML_BUILD_MODULE=OFF -DORVXML_BUILD_BENCH=OFF -DCMAKE_UNITY_BUILD=ON &&
        cmake --build build-asan -j"$(nproc)"; } > build-asan/build.log 2>&1; then
   cat build-asan/build.log
   echo "sanitizer build failed" >&2

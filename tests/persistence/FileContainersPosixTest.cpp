@@ -16,9 +16,6 @@ namespace {
 
 const std::uint64_t kGiB = 1ull << 30;
 
-// A v3 library whose block count claims far more than the file holds.
-std::string claimsMore() { return example("materials_all_layers.orvmat").replace(8, 4, le32(0xFFFFFFFFu)); }
-
 std::u16string convert(const std::string& path) {
     const bool options = path.compare(path.size() - 3, 3, "opt") == 0;
     return options ? OrvOptFile().getXml(wide(path)) : OrvMatFile().getXml(wide(path));

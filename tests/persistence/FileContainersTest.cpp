@@ -16,9 +16,6 @@ using namespace tempfiles;
 
 namespace {
 
-// A v3 library whose block count claims far more than the file holds.
-std::string claimsMore() { return example("materials_all_layers.orvmat").replace(8, 4, le32(0xFFFFFFFFu)); }
-
 // Remembers how many bytes were asked of the source.
 class CountingBytes : public platform::ByteSource {
 public:

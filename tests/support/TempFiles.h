@@ -62,4 +62,7 @@ inline std::string le32(std::uint32_t v) {
     return s;
 }
 
+// A v3 library whose block count claims far more than the file holds.
+inline std::string claimsMore() { return example("materials_all_layers.orvmat").replace(8, 4, le32(0xFFFFFFFFu)); }
+
 }  // namespace tempfiles
