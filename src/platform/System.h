@@ -50,6 +50,10 @@ int replaceFile(const std::string& from, const std::string& to);
 
 void removeFile(const std::string& path);
 
+// Whether the errno of a failed write means that the disk or the user's
+// quota is full, so that any further write fails as well.
+bool isNoSpace(int error);
+
 // Writes all of `bytes` to the open file descriptor `fd` (a pipe, standard
 // output), through any number of partial writes. False on an error.
 bool writeAll(int fd, const std::string& bytes);

@@ -82,6 +82,8 @@ void removeFile(const std::string& path) { ::unlink(path.c_str()); }
 
 std::FILE* openOutputFile(const std::string& path) { return std::fopen(path.c_str(), "wb"); }
 
+bool isNoSpace(int error) { return error == ENOSPC || error == EDQUOT; }
+
 unsigned long processId() { return static_cast<unsigned long>(::getpid()); }
 
 Terminal errorTerminal() { return ::isatty(STDERR_FILENO) ? Terminal::Escapes : Terminal::None; }

@@ -187,6 +187,10 @@ bool writeAll(int fd, const std::string& bytes) {
 
 std::FILE* openOutputFile(const std::string& path) { return _wfopen(native(path).c_str(), L"wb"); }
 
+// ERROR_DISK_FULL and ERROR_HANDLE_DISK_FULL come as ENOSPC; a quota that is
+// full says ERROR_DISK_FULL as well.
+bool isNoSpace(int error) { return error == ENOSPC; }
+
 unsigned long processId() { return GetCurrentProcessId(); }
 
 Terminal errorTerminal() {

@@ -140,7 +140,7 @@ class CommandLine(Tree):
         good = self.copy('render_settings.orvopt', 'good.orvopt')
         self.assertEqual(run('-q', '-o', self.path('out'), good)[2], '')
         code, _, err = run('-q', '-o', self.path('out'), good, self.path('gone.orvmat'))
-        self.assertEqual(code, 1)
+        self.assertEqual(code, 3)
         self.assertEqual(err.splitlines(), [
             'orvxml: %s: can\'t be opened: No such file or directory' % self.path('gone.orvmat')])
 
@@ -200,7 +200,7 @@ class Trees(Tree):
         self.assertEqual(self.read(os.path.join(out, 'text.orvmat.xml')),
                          self.read(text).split(b'\0')[0])
         code, _, err = run('-o', out, good, other)
-        self.assertEqual(code, 1)
+        self.assertEqual(code, 3)
         self.assertIn('notes.txt: not a .orvmat, .lumat, .orvopt or .luopt file', err)
         self.assertIn('1 converted, 0 fell back to text, 1 unreadable', err)
         self.assertFalse(os.path.exists(os.path.join(out, 'notes.txt.xml')))
@@ -231,7 +231,7 @@ class Explanations(Tree):
         paths = [self.put(os.path.join('bad', name), data) for name, data, _ in DAMAGED]
         good = self.copy('materials_folded_wrappers.orvmat', 'good.orvmat')
         code, out, _ = run('-q', '--explain', good, *paths)
-        self.assertEqual(code, 1)
+        self.assertEqual(code, 3)  # a missing file and a FIFO among them
         lines = out.decode('utf-8').splitlines()
         self.assertEqual(lines[0], good + ': document, 3 materials, 4108 bytes')
         self.assertEqual(len(lines), 1 + len(DAMAGED))
@@ -255,7 +255,7 @@ class Report(Tree):
         report = self.path('report.jsonl')
         code, _, _ = run('-q', '-j', '2', '--report', report, '-o', self.path('out'),
                          self.path('in'), self.path('in/missing.lumat'))
-        self.assertEqual(code, 1)
+        self.assertEqual(code, 3)
         with open(report) as f:
             rows = [json.loads(line) for line in f]
         self.assertEqual([r['path'] for r in rows],
@@ -274,6 +274,135 @@ class Report(Tree):
             written = self.read(self.path('out', name)).decode('utf-8')
             self.assertEqual(r['characters'], len(written))
         self.assertEqual(rows[2]['characters'], 0)
+
+
+class ExitStatus(Tree):
+    """Each outcome has its own status: 0 documents, 1 text, 2 usage, 3 a
+    file that can't be read or an output that can't be written."""
+
+    def run_to(self, stdout, *args):
+        with open(stdout, 'wb') as out:
+            p = subprocess.run([ORVXML] + list(args), stdout=out, stderr=subprocess.PIPE)
+        return p.returncode, p.stderr.decode('utf-8')
+
+    def summary(self, err):
+        """The summary line without its time."""
+        line = [l for l in err.splitlines() if ' converted, ' in l][-1]
+        return line[:line.rindex(' (')]
+
+    def test_each_outcome(self):
+        good = self.copy('materials_old_records_v2.orvmat', 'in/good.orvmat')
+        self.assertEqual(run('-o', self.path('out'), good)[0], 0)
+        self.copy('text_export.orvmat', 'in/sub/text.orvmat')
+        code, _, err = run('-o', self.path('out'), self.path('in'))
+        self.assertEqual((code, self.summary(err)),
+                         (1, 'orvxml: 1 converted, 1 fell back to text, 0 unreadable'))
+        self.assertEqual(run('-o', self.path('out'), '--bogus', good)[0], 2)
+        fifo = self.put('pipe.orvmat', 'fifo')
+        for unreadable in (self.path('missing.orvmat'), fifo):
+            code, _, err = run('-o', self.path('out'), self.path('in'), unreadable)
+            self.assertEqual((code, self.summary(err)),
+                             (3, 'orvxml: 1 converted, 1 fell back to text, 1 unreadable'), unreadable)
+            self.assertEqual(run(unreadable)[0], 3)
+            self.assertEqual(run('--explain', unreadable)[0], 3)
+
+    def test_standard_output_that_cant_be_written(self):
+        good = self.copy('materials_all_layers.orvmat', 'good.orvmat')
+        code, err = self.run_to('/dev/full', good)
+        self.assertEqual(code, 3)
+        self.assertIn('orvxml: can\'t write standard output: No space left on device\n', err)
+        self.assertEqual(self.summary(err),
+                         'orvxml: 0 converted, 0 fell back to text, 0 unreadable, 1 not written')
+        code, err = self.run_to('/dev/full', '-q', '--explain', good)
+        self.assertEqual((code, err), (3, 'orvxml: can\'t write standard output: No space left on device\n'))
+        # A line too long for the stream's buffer fails before the end of the run.
+        many = [self.copy('materials_all_layers.orvmat', 'in/%s.orvmat' % ('x' * 200 + str(i)))
+                for i in range(40)]
+        code, err = self.run_to('/dev/full', '-q', '--explain', *many)
+        self.assertEqual(code, 3)
+        self.assertIn('orvxml: can\'t write standard output: No space left on device\n', err)
+
+    def test_an_output_folder_or_report_that_cant_be_made(self):
+        good = self.copy('materials_old_records_v2.orvmat', 'good.orvmat')
+        blocker = self.put('file', b'a file where a folder would go')
+        for out, why in ((blocker, 'File exists'), (os.path.join(blocker, 'out'), 'Not a directory')):
+            code, out_text, err = run('-o', out, good)
+            self.assertEqual((code, out_text), (3, b''))
+            self.assertEqual(err, 'orvxml: can\'t create the folder %s: %s\n' % (out, why))
+        report = os.path.join(blocker, 'report.jsonl')
+        code, _, err = run('--report', report, '-o', self.path('out'), good)
+        self.assertEqual(code, 3)
+        self.assertEqual(err, 'orvxml: can\'t write the report %s: Not a directory\n' % report)
+        self.assertFalse(os.path.exists(self.path('out', 'good.orvmat.xml')))
+
+    def test_outputs_that_cant_be_written_are_counted_apart(self):
+        self.copy('materials_old_records_v2.orvmat', 'in/a.orvmat')
+        self.copy('render_settings.orvopt', 'in/sub/b.orvopt')
+        self.copy('text_export.orvmat', 'in/c.orvmat')
+        # Running as root ignores permissions: a file where a folder must go,
+        # and a folder where a file must go, can't be written over all the same.
+        self.put('out/sub', b'not a folder')
+        os.makedirs(self.path('out', 'c.orvmat.xml'))
+        for jobs in ('1', '2'):
+            report = self.path('report%s.jsonl' % jobs)
+            code, _, err = run('-j', jobs, '--report', report, '-o', self.path('out'), self.path('in'))
+            self.assertEqual(code, 3, err)
+            self.assertIn('orvxml: can\'t write %s: Not a directory\n'
+                          % self.path('out', 'sub', 'b.orvopt.xml'), err)
+            self.assertIn('orvxml: can\'t write %s: Is a directory\n'
+                          % self.path('out', 'c.orvmat.xml'), err)
+            self.assertEqual(self.summary(err),
+                             'orvxml: 1 converted, 0 fell back to text, 0 unreadable, 2 not written')
+            with open(report) as f:
+                rows = [json.loads(line) for line in f]
+            reasons = [r['reason'] for r in rows]
+            self.assertIsNone(reasons[0])
+            self.assertTrue(reasons[1].endswith('; not written: %s: Is a directory'
+                                                % self.path('out', 'c.orvmat.xml')), reasons)
+            self.assertEqual(reasons[2],
+                             'not written: %s: Not a directory' % self.path('out', 'sub', 'b.orvopt.xml'))
+        self.assertEqual(self.files_under(self.path('out')), ['a.orvmat.xml', 'sub'])
+
+
+class FullDisk(Tree):
+    """The first output that finds no space stops the run; what is written
+    is whole and no part file stays."""
+    COPIES = 60
+
+    def setUp(self):
+        Tree.setUp(self)
+        self.disk = tempfile.mkdtemp(prefix='orvxml-full-')
+        self.addCleanup(os.rmdir, self.disk)
+        mounted = subprocess.run(['mount', '-t', 'tmpfs', '-o', 'size=64k', 'tmpfs', self.disk],
+                                 stdout=subprocess.DEVNULL, stderr=subprocess.DEVNULL)
+        if mounted.returncode != 0:
+            self.skipTest('a small tmpfs can\'t be mounted here')
+        self.addCleanup(subprocess.run, ['umount', self.disk], check=True)
+
+    def test_the_run_stops_at_the_first_full_write(self):
+        source = self.copy('materials_all_layers.orvmat', 'in/000.orvmat')
+        for i in range(1, self.COPIES):
+            shutil.copyfile(source, self.path('in', '%03d.orvmat' % i))
+        expected = run(source)[1]  # each output takes a page at least: 60 don't fit in 64 KiB
+        for jobs in (1, 2):
+            out = os.path.join(self.disk, 'out%d' % jobs)
+            code, _, err = run('-j', str(jobs), '-o', out, self.path('in'))
+            self.assertEqual(code, 3, err)
+            lines = err.splitlines()
+            self.assertRegex(lines[-1], r'^orvxml: stopped: no space for the outputs '
+                             r'\(No space left on device\), \d+ of %d files not converted$' % self.COPIES)
+            left = int(lines[-1].split()[-6])
+            failed = [l for l in lines if l.startswith('orvxml: can\'t write ')]
+            self.assertTrue(failed and all(l.endswith(': No space left on device') for l in failed), err)
+            # Only the files under way when the disk filled were tried.
+            self.assertLessEqual(len(failed), jobs)
+            written = os.listdir(out)
+            self.assertEqual(len(written) + len(failed) + left, self.COPIES, err)
+            self.assertGreater(left, 0)
+            for name in written:
+                self.assertTrue(name.endswith('.orvmat.xml'), name)
+                self.assertEqual(self.read(os.path.join(out, name)), expected, name)
+            shutil.rmtree(out)
 
 
 class Interrupts(Tree):

@@ -218,6 +218,33 @@ class SameAsLinux(Scratch):
             self.assertEqual(run('windows', args, self.tmp), run('linux', args, self.tmp), args)
 
 
+    def test_what_cant_be_read_or_written(self):
+        # The status and the lines of each, but for the system's words for why.
+        good = os.path.join(EXAMPLES, 'materials_old_records_v2.orvmat')
+        write(self.path('in', 'a.orvmat'), read(good))
+        write(self.path('in', 'sub', 'b.orvmat'), read(good))
+        write(self.path('in', 'c.orvmat'), read(os.path.join(EXAMPLES, 'text_export.orvmat')))
+        write(self.path('blocker'), b'a file where a folder would go')
+        for args in (['-o', 'blocker', good], ['-o', os.path.join('blocker', 'out'), good],
+                     ['--report', os.path.join('blocker', 'r.jsonl'), good],
+                     ['missing.orvmat'], ['--explain', 'in', 'missing.lumat']):
+            linux, windows = run('linux', args, self.tmp), run('windows', args, self.tmp)
+            self.assertEqual(linux[0], 3, args)
+            self.assertEqual(windows[0], 3, args)
+            self.assertEqual(windows[1], linux[1], args)
+            why = r': [A-Z][a-z ]+$'
+            self.assertEqual([re.sub(why, '', l) for l in masked_errors(windows[2]).splitlines()],
+                             [re.sub(why, '', l) for l in masked_errors(linux[2]).splitlines()], args)
+        # Outputs in the way: a file where a folder goes, and a folder where a file goes.
+        for command in ('linux', 'windows'):
+            write(self.path(command, 'sub'), b'not a folder')
+            os.makedirs(self.path(command, 'c.orvmat.xml'))
+            code, _, err = run(command, ['-o', command, 'in'], self.tmp)
+            self.assertEqual(code, 3, command)
+            self.assertIn('1 converted, 0 fell back to text, 0 unreadable, 2 not written', err)
+            self.assertEqual(sorted(files_under(self.path(command))), ['a.orvmat.xml', 'sub'])
+
+
 class WindowsCases(Scratch):
     def copy(self, example, *parts):
         path = self.path(*parts)
@@ -259,7 +286,7 @@ class WindowsCases(Scratch):
         # One file on Windows: the second is refused, the first stays whole.
         code, out, _ = run('windows', ['-q', '--explain', '-o', self.path('out'), first, second],
                            self.tmp)
-        self.assertEqual(code, 1)
+        self.assertEqual(code, 3)
         self.assertEqual(out.decode('utf-8').splitlines()[1],
                          '%s: unreadable: its output %s is written for an earlier file'
                          % (second, self.path('out', 'A.ORVOPT.xml')))
@@ -268,15 +295,15 @@ class WindowsCases(Scratch):
 
     def test_the_nul_device(self):
         code, out, _ = run('windows', ['--explain', 'NUL'], self.tmp)
-        self.assertEqual((code, out), (1, b'NUL: unreadable: not a .orvmat, .lumat, .orvopt or .luopt file\n'))
+        self.assertEqual((code, out), (3, b'NUL: unreadable: not a .orvmat, .lumat, .orvopt or .luopt file\n'))
         code, out, _ = run('windows', ['--explain', 'NUL.orvmat'], self.tmp)
-        self.assertEqual((code, out), (1, b'NUL.orvmat: unreadable: not a regular file\n'))
+        self.assertEqual((code, out), (3, b'NUL.orvmat: unreadable: not a regular file\n'))
         code, out, err = run('windows', ['NUL.orvmat'], self.tmp)
-        self.assertEqual((code, out), (1, b''))
+        self.assertEqual((code, out), (3, b''))
         self.assertIn('orvxml: NUL.orvmat: not a regular file', err)
         # Its output would be the device again: nothing is left behind.
         code, _, err = run('windows', ['-o', self.path('out'), 'nul.luopt'], self.tmp)
-        self.assertEqual(code, 1)
+        self.assertEqual(code, 3)
         self.assertIn('orvxml: can\'t write ', err)
         self.assertEqual(os.listdir(self.path('out')), [])
 
@@ -313,7 +340,7 @@ class WindowsCases(Scratch):
         line = '%s -o out held.orvmat 2>>out\\held.orvmat.xml' % windows_path(WINDOWS)
         p = subprocess.run(['wine', 'cmd', '/c', line], cwd=self.tmp, env=WINE_ENV,
                            stdout=subprocess.PIPE, stderr=subprocess.PIPE, timeout=120)
-        self.assertEqual(p.returncode, 1)
+        self.assertEqual(p.returncode, 3)
         self.assertEqual(os.listdir(self.path('out')), ['held.orvmat.xml'])
         lines = read(target).decode('utf-8').splitlines()
         self.assertEqual(lines[:2], ['old', 'orvxml: can\'t write out/held.orvmat.xml: Permission denied'])
@@ -409,7 +436,7 @@ class Processes(Scratch):
         p = self.start(2)
         os.kill(self.workers()[0], signal.SIGKILL)
         code, err, written = self.finish(p)
-        self.assertEqual(code, 1, err)
+        self.assertEqual(code, 3, err)
         rows = masked_report(self.path('r.jsonl'))
         self.assertEqual(len(rows), self.COPIES)
         lost = [r for r in rows if r['status'] != 'document']

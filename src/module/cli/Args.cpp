@@ -35,14 +35,21 @@ const char kUsage[] =
     "      --version      show the version and exit\n"
     "\n"
     "Progress goes to standard error while it is a terminal; a summary line\n"
-    "(converted, fell back to text, unreadable) ends every run.\n"
+    "(converted, fell back to text, unreadable, and outputs not written) ends\n"
+    "every run.\n"
     "\n"
     "Ctrl-C, SIGINT, SIGTERM and SIGHUP stop the run between two files: the\n"
-    "outputs written so far stay, and no partial file is left.\n"
+    "outputs written so far stay, and no partial file is left. An output that\n"
+    "finds no space left on its disk stops the run too: no further file is\n"
+    "converted.\n"
     "\n"
-    "Exit status: 0 if every file became a document, 1 if any file fell back to\n"
-    "text or could not be read (its text is still written), 2 for a usage error,\n"
-    "128 + the signal's number if the run was stopped (130 for Ctrl-C).\n";
+    "Exit status:\n"
+    "  0        every file became a document\n"
+    "  1        some file fell back to text (its text is written), nothing worse\n"
+    "  2        a usage error\n"
+    "  3        some input could not be read, or some output (a file, standard\n"
+    "           output, the output folder, the report) could not be written\n"
+    "  128 + N  the run was stopped by signal N (130 for Ctrl-C)\n";
 
 namespace {
 

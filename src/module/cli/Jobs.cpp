@@ -1,5 +1,6 @@
 #include "module/cli/Jobs.h"
 
+#include <cerrno>
 #include <chrono>
 #include <cstring>
 
@@ -32,15 +33,25 @@ std::uint64_t codePoints(const std::u16string& text) {
 }
 
 // Writes `bytes` to `path` through a temporary file beside it, so that a
-// reader never sees half a file. Returns why it failed, or nothing.
-std::string writeFile(const std::string& path, const std::string& bytes) {
+// reader never sees half a file. Returns 0 or the errno of the failure.
+int writeFile(const std::string& path, const std::string& bytes) {
     const std::string part = partPath(path, platform::processId());
     int error = platform::writeNewFile(part, bytes);
     if (error == 0 && (error = platform::replaceFile(part, path)) != 0) platform::removeFile(part);
-    return error == 0 ? std::string() : path + ": " + std::strerror(error);
+    return error;
+}
+
+// Writes the whole text to a stream and flushes it. Returns 0 or the errno.
+int writeStream(std::FILE* out, const std::string& bytes) {
+    errno = 0;
+    if (std::fwrite(bytes.data(), 1, bytes.size(), out) != bytes.size() || std::fflush(out) != 0)
+        return errno ? errno : EIO;
+    return 0;
 }
 
 }  // namespace
+
+bool stopsTheRun(const FileResult& result) { return platform::isNoSpace(result.writeErrno); }
 
 FileResult runJob(const Job& job, std::FILE* textOut) {
     const auto start = std::chrono::steady_clock::now();
@@ -55,12 +66,11 @@ FileResult runJob(const Job& job, std::FILE* textOut) {
         r.line = OrvaneLumoCore::explainOutcome(o, job.kind);
         if (o.status != FileStatus::Document) r.reason = OrvaneLumoCore::describe(o.note);
         if (!job.output.empty()) {
-            r.writeError = writeFile(job.output, toUtf8(o.text));
+            if ((r.writeErrno = writeFile(job.output, toUtf8(o.text))) != 0)
+                r.writeError = job.output + ": " + std::strerror(r.writeErrno);
         } else if (textOut) {
-            const std::string bytes = toUtf8(o.text);
-            if (std::fwrite(bytes.data(), 1, bytes.size(), textOut) != bytes.size() ||
-                std::fflush(textOut) != 0)
-                r.writeError = std::string("standard output: ") + std::strerror(errno);
+            if ((r.writeErrno = writeStream(textOut, toUtf8(o.text))) != 0)
+                r.writeError = std::string("standard output: ") + std::strerror(r.writeErrno);
         }
     }
     r.milliseconds =
@@ -70,7 +80,7 @@ FileResult runJob(const Job& job, std::FILE* textOut) {
 
 void runHere(const std::vector<Job>& jobs, const std::vector<bool>& done, const ResultSink& sink) {
     for (std::size_t i = 0; i < jobs.size() && !platform::interruption(); ++i)
-        if (!done[i]) sink(i, runJob(jobs[i], nullptr));
+        if (!done[i] && !sink(i, runJob(jobs[i], nullptr))) return;
 }
 
 FileResult stopped(const std::string& reason) {
@@ -116,6 +126,7 @@ std::string packMessage(const Message& m) {
         body.putText(m.result.line);
         body.putText(m.result.reason);
         body.putText(m.result.writeError);
+        body.put(static_cast<std::int32_t>(m.result.writeErrno));
     }
     return frame(body.bytes);
 }
@@ -125,9 +136,11 @@ bool parseMessage(const char* p, std::size_t n, Message& m) {
     if (!in.get(m.type) || !in.get(m.worker) || !in.get(m.index)) return false;
     if (m.type != MessageType::Finished) return m.type == MessageType::Started;
     std::uint8_t status = 0;
+    std::int32_t writeErrno = 0;
     return in.get(status) && (m.result.status = static_cast<FileStatus>(status), true) &&
            in.get(m.result.characters) && in.get(m.result.milliseconds) && in.getText(m.result.line) &&
-           in.getText(m.result.reason) && in.getText(m.result.writeError);
+           in.getText(m.result.reason) && in.getText(m.result.writeError) && in.get(writeErrno) &&
+           (m.result.writeErrno = writeErrno, true);
 }
 
 }  // namespace orvxml

@@ -21,19 +21,26 @@ struct FileResult {
     std::string line;        // the --explain line, behind the path
     std::string reason;      // why the file isn't a document; empty for one
     std::string writeError;  // why the output couldn't be written; empty if it was
+    int writeErrno = 0;      // the errno of that failure
 };
 
 // Converts one job in this process: the output file gets the text as UTF-8,
 // or, if the job has none and `textOut` is given, the text goes there.
 FileResult runJob(const Job& job, std::FILE* textOut);
 
-typedef std::function<void(std::size_t index, const FileResult& result)> ResultSink;
+// Whether the output failed for lack of space: then no further job is
+// started, since its output couldn't be written either.
+bool stopsTheRun(const FileResult& result);
+
+// Takes a result; returns false when no further job is to be started.
+typedef std::function<bool(std::size_t index, const FileResult& result)> ResultSink;
 
 // Runs every job once, on up to `workers` processes, and hands each result
 // to `sink` in this process as it comes in (from one thread at a time). A
 // worker that dies leaves its file unreadable, with the signal or status as
 // its reason; jobs no worker took are run here. Once the process is
-// interrupted no job is started; the jobs under way are finished.
+// interrupted, or a result stops the run (the sink says so, or a worker
+// finds the disk full), no job is started; the jobs under way are finished.
 void runJobs(const std::vector<Job>& jobs, unsigned workers, const ResultSink& sink);
 
 // Where workers are separate programs (Windows), a process started with the

@@ -1,5 +1,8 @@
 #include "module/cli/Report.h"
 
+#include <cerrno>
+#include <cstring>
+
 #include "platform/Text.h"
 
 namespace orvxml {
@@ -69,23 +72,28 @@ Collector::Collector(const std::vector<Job>& jobs, bool explain, bool quiet, pla
       start_(std::chrono::steady_clock::now()),
       lastProgress_(start_) {}
 
-void Collector::add(std::size_t index, const FileResult& result) {
-    if (index >= results_.size() || arrived_[index]) return;
+bool Collector::add(std::size_t index, const FileResult& result) {
+    if (index >= results_.size() || arrived_[index]) return noSpace_ == 0;
     results_[index] = result;
     arrived_[index] = true;
     ++done_;
-    switch (result.status) {
-    case FileStatus::Document: ++documents_; break;
-    case FileStatus::Text: ++texts_; break;
-    case FileStatus::Unreadable: ++unreadable_; break;
+    if (!result.writeError.empty()) {
+        ++notWritten_;
+        if (!noSpace_ && stopsTheRun(result)) noSpace_ = result.writeErrno;
+    } else {
+        switch (result.status) {
+        case FileStatus::Document: ++documents_; break;
+        case FileStatus::Text: ++texts_; break;
+        case FileStatus::Unreadable: ++unreadable_; break;
+        }
     }
-    if (!result.writeError.empty()) ++notWritten_;
     while (next_ < results_.size() && arrived_[next_]) {
         emit(next_);
         results_[next_] = FileResult();  // its text is no longer needed
         ++next_;
     }
     showProgress(false);
+    return noSpace_ == 0;
 }
 
 void Collector::emit(std::size_t index) {
@@ -93,7 +101,10 @@ void Collector::emit(std::size_t index) {
     const FileResult& r = results_[index];
     const bool error = r.status == FileStatus::Unreadable || !r.writeError.empty();
     if (error || explain_) clearProgress();
-    if (explain_) std::printf("%s: %s\n", job.source.c_str(), r.line.c_str());
+    if (explain_ && std::printf("%s: %s\n", job.source.c_str(), r.line.c_str()) < 0 && !stdoutError_) {
+        stdoutError_ = errno ? errno : EIO;
+        if (platform::isNoSpace(stdoutError_) && !noSpace_) noSpace_ = stdoutError_;
+    }
     if (r.status == FileStatus::Unreadable)
         std::fprintf(stderr, "orvxml: %s: %s\n", job.source.c_str(), r.reason.c_str());
     if (!r.writeError.empty()) std::fprintf(stderr, "orvxml: can't write %s\n", r.writeError.c_str());
@@ -136,8 +147,11 @@ int Collector::finish(int interruption) {
     // An interrupted run leaves gaps: what came in after one still shows.
     for (std::size_t i = next_; i < results_.size(); ++i)
         if (arrived_[i]) emit(i);
-    std::fflush(stdout);
+    errno = 0;
+    if (std::fflush(stdout) != 0 && !stdoutError_) stdoutError_ = errno ? errno : EIO;
     clearProgress();
+    if (stdoutError_)
+        std::fprintf(stderr, "orvxml: can't write standard output: %s\n", std::strerror(stdoutError_));
     if (!quiet_) {
         const double seconds =
             std::chrono::duration<double>(std::chrono::steady_clock::now() - start_).count();
@@ -151,7 +165,11 @@ int Collector::finish(int interruption) {
                      jobs_.size());
         return 128 + interruption;
     }
-    return documents_ == jobs_.size() && notWritten_ == 0 ? 0 : 1;
+    if (noSpace_ && done_ < jobs_.size())
+        std::fprintf(stderr, "orvxml: stopped: no space for the outputs (%s), %zu of %zu files not "
+                     "converted\n", std::strerror(noSpace_), jobs_.size() - done_, jobs_.size());
+    if (unreadable_ || notWritten_ || stdoutError_) return 3;
+    return texts_ ? 1 : 0;
 }
 
 }  // namespace orvxml

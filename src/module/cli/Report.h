@@ -25,10 +25,13 @@ public:
     // gets the progress line.
     Collector(const std::vector<Job>& jobs, bool explain, bool quiet, platform::Terminal progress,
               std::FILE* report);
-    void add(std::size_t index, const FileResult& result);
-    // Ends the progress line, prints the summary; returns the exit status.
-    // `interruption`: the signal that stopped the run early, or 0; the
-    // results that came in are passed on all the same.
+    // Returns false once the run is to stop: an output found no space.
+    bool add(std::size_t index, const FileResult& result);
+    // Ends the progress line, prints the summary; returns the exit status:
+    // 0 all documents, 1 some text, 3 some file unreadable or some output
+    // (standard output included) not written. `interruption`: the signal
+    // that stopped the run early, or 0; the results that came in are passed
+    // on all the same.
     int finish(int interruption);
 
 private:
@@ -44,7 +47,10 @@ private:
     std::vector<FileResult> results_;
     std::vector<bool> arrived_;
     std::size_t next_ = 0, done_ = 0;
+    // Each result counts once: not written if its output failed, else by its status.
     std::size_t documents_ = 0, texts_ = 0, unreadable_ = 0, notWritten_ = 0;
+    int noSpace_ = 0;      // the errno of the write that stopped the run, or 0
+    int stdoutError_ = 0;  // the errno of the first failed --explain line, or 0
     std::size_t progressShown_ = 0;  // the length of the line on the terminal
     std::chrono::steady_clock::time_point start_, lastProgress_;
 };

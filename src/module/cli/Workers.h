@@ -99,7 +99,7 @@ std::string partPath(const std::string& path, unsigned long pid);
 FileResult stopped(const std::string& reason);
 
 // Runs the jobs that `done` doesn't mark in this process, in order, until
-// the process is interrupted.
+// the process is interrupted or the sink stops the run.
 void runHere(const std::vector<Job>& jobs, const std::vector<bool>& done, const ResultSink& sink);
 
 }  // namespace orvxml

@@ -25,8 +25,9 @@ namespace {
 
 // Each message is written with a single write() of at most PIPE_BUF bytes,
 // so messages of different workers never interleave.
-// Length, type, worker, index, status, characters, milliseconds, three texts.
-static_assert(4 + 1 + 4 + 8 + 1 + 8 + 8 + 3 * (2 + kMaxText) <= PIPE_BUF,
+// Length, type, worker, index, status, characters, milliseconds, three
+// texts, the write's errno.
+static_assert(4 + 1 + 4 + 8 + 1 + 8 + 8 + 3 * (2 + kMaxText) + 4 <= PIPE_BUF,
               "a message is written in one piece");
 
 // The next job's index, shared by all workers through a shared page.
@@ -44,7 +45,8 @@ struct SharedCounter {
 static_assert(std::atomic<std::uint64_t>::is_always_lock_free, "the counter is shared by processes");
 
 // Takes jobs until none is left or the process is interrupted; a job taken
-// is always finished, its file written or its part file removed.
+// is always finished, its file written or its part file removed. A write
+// that finds the disk full leaves no job for any worker.
 [[noreturn]] void workerLoop(const std::vector<Job>& jobs, std::uint32_t worker,
                              std::atomic<std::uint64_t>& next, int fd) {
     while (!platform::interruption()) {
@@ -55,6 +57,7 @@ static_assert(std::atomic<std::uint64_t>::is_always_lock_free, "the counter is s
         if (!platform::writeAll(fd, packMessage(m))) break;
         m.type = MessageType::Finished;
         m.result = runJob(jobs[m.index], nullptr);
+        if (stopsTheRun(m.result)) next.store(jobs.size());
         if (!platform::writeAll(fd, packMessage(m))) break;
     }
     ::_exit(platform::interruption() ? 128 + platform::interruption() : 0);
@@ -96,7 +99,7 @@ void runJobs(const std::vector<Job>& jobs, unsigned workers, const ResultSink& s
     FrameReader frames;
     std::string body;
     char chunk[1 << 16];
-    bool forwarded = false;
+    bool forwarded = false, goOn = true;
     for (;;) {
         // A signal that reached only this process (a SIGTERM to its pid) is
         // passed on to the workers, which stop after their current file.
@@ -120,7 +123,10 @@ void runJobs(const std::vector<Job>& jobs, unsigned workers, const ResultSink& s
             } else {
                 holding[m.worker] = kNone;
                 reported[m.index] = true;
-                sink(static_cast<std::size_t>(m.index), m.result);
+                if (!sink(static_cast<std::size_t>(m.index), m.result)) {
+                    goOn = false;
+                    counter.next->store(jobs.size());  // the workers take no further job
+                }
             }
         }
     }
@@ -137,7 +143,7 @@ void runJobs(const std::vector<Job>& jobs, unsigned workers, const ResultSink& s
         sink(static_cast<std::size_t>(held), crashed(status));
     }
     // Jobs that no worker finished, if workers stopped early or couldn't start.
-    runHere(jobs, reported, sink);
+    if (goOn) runHere(jobs, reported, sink);
 }
 
 }  // namespace orvxml

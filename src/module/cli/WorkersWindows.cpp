@@ -65,10 +65,11 @@ std::string stopReason(unsigned long status) {
     return std::string("the conversion stopped with status ") + text;
 }
 
-// Feeds one worker until no job is left, the process is interrupted or the
-// worker ends.
+// Feeds one worker until no job is left, the process is interrupted, the
+// sink stops the run (`stop` is set then, and no feeder starts a job) or
+// the worker ends.
 void feed(platform::ChildProcess& child, const std::vector<Job>& jobs, std::atomic<std::size_t>& next,
-          std::vector<bool>& reported, std::mutex& lock, const ResultSink& sink) {
+          std::atomic<bool>& stop, std::vector<bool>& reported, std::mutex& lock, const ResultSink& sink) {
     FrameReader frames;
     std::string body;
     char chunk[1 << 16];
@@ -88,7 +89,10 @@ void feed(platform::ChildProcess& child, const std::vector<Job>& jobs, std::atom
             m.index == i) {
             std::lock_guard<std::mutex> hold(lock);
             reported[i] = true;
-            sink(i, m.result);
+            if (!sink(i, m.result)) {
+                stop = true;
+                next.store(jobs.size());
+            }
             continue;
         }
         // The worker ended while it held job i: unless it stopped for an
@@ -154,13 +158,15 @@ void runJobs(const std::vector<Job>& jobs, unsigned workers, const ResultSink& s
         if (child->startSelf({kWorkerArgument})) children.push_back(std::move(child));
     }
     std::atomic<std::size_t> next(0);
+    std::atomic<bool> stop(false);
     std::mutex lock;
     std::vector<std::thread> threads;
     for (auto& child : children)
-        threads.emplace_back([&, worker = child.get()] { feed(*worker, jobs, next, reported, lock, sink); });
+        threads.emplace_back(
+            [&, worker = child.get()] { feed(*worker, jobs, next, stop, reported, lock, sink); });
     for (std::thread& t : threads) t.join();
     // Jobs that no worker finished, if workers stopped early or couldn't start.
-    runHere(jobs, reported, sink);
+    if (!stop) runHere(jobs, reported, sink);
 }
 
 }  // namespace orvxml

@@ -26,6 +26,12 @@ int usageError(const std::string& message) {
     return 2;
 }
 
+// A failure of the run's own files (the output folder, the report): exit 3.
+int runError(const std::string& message, int error) {
+    std::fprintf(stderr, "orvxml: %s: %s\n", message.c_str(), std::strerror(error));
+    return 3;
+}
+
 bool isFolder(const std::string& path, int& error) { return platform::pathKind(path, error) == PathKind::Folder; }
 
 // Creates `dir` and the folders above it that are missing. Returns 0, or
@@ -78,7 +84,7 @@ int runProgram(const std::vector<std::string>& args) {
 
     if (!settings.outDir.empty()) {
         if (const int e = makeFolders(settings.outDir))
-            return usageError("can't create the folder " + settings.outDir + ": " + std::strerror(e));
+            return runError("can't create the folder " + settings.outDir, e);
         std::set<std::string> made;
         for (const Job& job : jobs) {
             if (job.output.empty()) continue;
@@ -89,8 +95,7 @@ int runProgram(const std::vector<std::string>& args) {
     std::FILE* report = nullptr;
     if (!settings.reportPath.empty()) {
         report = platform::openOutputFile(settings.reportPath);
-        if (!report)
-            return usageError("can't write the report " + settings.reportPath + ": " + std::strerror(errno));
+        if (!report) return runError("can't write the report " + settings.reportPath, errno);
     }
 
     // A lone file on standard output needs no progress line.
@@ -98,17 +103,16 @@ int runProgram(const std::vector<std::string>& args) {
     Collector collector(jobs, settings.explain, settings.quiet, progress, report);
     if (toStdout) {
         for (std::size_t i = 0; i < jobs.size() && !platform::interruption(); ++i)
-            collector.add(i, runJob(jobs[i], stdout));
+            if (!collector.add(i, runJob(jobs[i], stdout))) break;
     } else {
         unsigned workers = settings.jobs;
         if (workers == 0) workers = std::max(1u, std::thread::hardware_concurrency());
-        runJobs(jobs, workers, [&](std::size_t i, const FileResult& r) { collector.add(i, r); });
+        runJobs(jobs, workers, [&](std::size_t i, const FileResult& r) { return collector.add(i, r); });
     }
     status = collector.finish(platform::interruption());
     if (report && std::fclose(report) != 0) {
-        std::fprintf(stderr, "orvxml: can't write the report %s: %s\n", settings.reportPath.c_str(),
-                     std::strerror(errno));
-        if (status == 0) status = 1;
+        const int e = runError("can't write the report " + settings.reportPath, errno);
+        if (status < 128) status = e;
     }
     return status;
 }
