@@ -364,6 +364,21 @@ class ExitStatus(Tree):
         self.assertEqual(self.files_under(self.path('out')), ['a.orvmat.xml', 'sub'])
 
 
+    def test_unreadable_inputs_get_no_output(self):
+        self.copy('materials_old_records_v2.orvmat', 'in/good.orvmat')
+        self.put('in/pipe.orvmat', 'fifo')
+        os.symlink(self.path('nowhere.orvmat'), self.path('in', 'dangling.lumat'))
+        for jobs in ('1', '2'):
+            out = self.path('out' + jobs)
+            code, _, err = run('-j', jobs, '-o', out, self.path('in'), self.path('missing.orvopt'))
+            self.assertEqual(code, 3, err)
+            self.assertEqual(self.summary(err), 'orvxml: 1 converted, 0 fell back to text, 3 unreadable')
+            self.assertEqual(self.files_under(out), ['good.orvmat.xml'])
+        # A FIFO named on its own: the output folder is made and stays empty.
+        code, _, _ = run('-o', self.path('out3'), self.path('in', 'pipe.orvmat'))
+        self.assertEqual((code, os.listdir(self.path('out3'))), (3, []))
+
+
 class FullDisk(Tree):
     """The first output that finds no space stops the run; what is written
     is whole and no part file stays."""

@@ -36,7 +36,7 @@ const char kUsage[] =
     "\n"
     "Progress goes to standard error while it is a terminal; a summary line\n"
     "(converted, fell back to text, unreadable, and outputs not written) ends\n"
-    "every run.\n"
+    "every run. A file that can't be read gets no output file.\n"
     "\n"
     "Ctrl-C, SIGINT, SIGTERM and SIGHUP stop the run between two files: the\n"
     "outputs written so far stay, and no partial file is left. An output that\n"

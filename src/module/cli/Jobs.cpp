@@ -65,7 +65,8 @@ FileResult runJob(const Job& job, std::FILE* textOut) {
         r.characters = codePoints(o.text);
         r.line = OrvaneLumoCore::explainOutcome(o, job.kind);
         if (o.status != FileStatus::Document) r.reason = OrvaneLumoCore::describe(o.note);
-        if (!job.output.empty()) {
+        // A file that can't be read has no text of its own: it gets no output file.
+        if (!job.output.empty() && o.status != FileStatus::Unreadable) {
             if ((r.writeErrno = writeFile(job.output, toUtf8(o.text))) != 0)
                 r.writeError = job.output + ": " + std::strerror(r.writeErrno);
         } else if (textOut) {
