@@ -1,5 +1,8 @@
 #include "module/Outcome.h"
 
+#include <new>
+#include <stdexcept>
+
 #include "lights/SunIesDome.h"
 #include "module/Extension.h"
 #include "module/TextFallback.h"
@@ -23,20 +26,11 @@ bool kindOfPath(const std::u16string& path, FileKind& kind) {
 }
 
 
-ConversionOutcome convertFile(const std::u16string& path, FileKind kind) {
-    ConversionOutcome out;
-    resetDocumentSun();
-    // The file is opened once, as the containers open it; a path that isn't
-    // a regular file is never read.
-    platform::RegularFile file;
-    if (!file.open(path)) {
-        if (file.notRegular())
-            out.note.fail(LoadRule::NotRegularFile, 0);
-        else
-            out.note.fail(LoadRule::CannotOpen, 0, static_cast<std::uint64_t>(file.error()));
-        return out;
-    }
-    out.fileSize = file.size();
+namespace {
+
+// The load and the text of an open file into `out`; may throw std::bad_alloc.
+void convertOpenFile(const std::u16string& path, FileKind kind, platform::RegularFile& file,
+                     ConversionOutcome& out) {
     bool loaded = false;
     if (kind == FileKind::Materials) {
         OrvMatFile materials;
@@ -60,10 +54,43 @@ ConversionOutcome convertFile(const std::u16string& path, FileKind kind) {
     }
     if (loaded) {
         out.status = FileStatus::Document;
-        return out;
+        return;
     }
     out.status = FileStatus::Text;
     out.text = readFileAsText(path);
+}
+
+}  // namespace
+
+ConversionOutcome convertFile(const std::u16string& path, FileKind kind, SunStart sun) {
+    ConversionOutcome out;
+    if (sun == SunStart::Fresh) resetDocumentSun();
+    // The file is opened once, as the containers open it; a path that isn't
+    // a regular file is never read.
+    platform::RegularFile file;
+    if (!file.open(path)) {
+        if (file.notRegular())
+            out.note.fail(LoadRule::NotRegularFile, 0);
+        else
+            out.note.fail(LoadRule::CannotOpen, 0, static_cast<std::uint64_t>(file.error()));
+        return out;
+    }
+    out.fileSize = file.size();
+    // What the failed conversion had built is freed by the time it is caught,
+    // so the outcome itself can still be made.
+    bool outOfMemory = false;
+    try {
+        convertOpenFile(path, kind, file, out);
+    } catch (const std::bad_alloc&) {
+        outOfMemory = true;
+    } catch (const std::length_error&) {
+        outOfMemory = true;
+    }
+    if (outOfMemory) {
+        out = ConversionOutcome();
+        out.fileSize = file.size();
+        out.note.fail(LoadRule::OutOfMemory, 0);
+    }
     return out;
 }
 

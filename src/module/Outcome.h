@@ -30,12 +30,20 @@ struct ConversionOutcome {
     LoadNote note;              // why a file took the text road or is unreadable
 };
 
-// Converts the file at `path` as the first call in a fresh process would: the
-// document sun is put back to its start state first, so the result doesn't
-// depend on what was converted before. The text is byte for byte what
-// OrvMatFile::getXml or OrvOptFile::getXml returns then; a path that isn't a
-// regular file gives the empty text and is never read.
-ConversionOutcome convertFile(const std::u16string& path, FileKind kind);
+// Where the document sun starts for a conversion: put back to its start state
+// (as for the first file of a fresh process), or as the conversions before
+// left it (a version 3 sky record replaces it in place).
+enum class SunStart { Fresh, Carried };
+
+// Converts the file at `path`. With SunStart::Fresh (as the command converts
+// every file) the result doesn't depend on what was converted before. The
+// text is byte for byte what OrvMatFile::getXml or OrvOptFile::getXml returns
+// from the same sun; a path that isn't a regular file gives the empty text
+// and is never read. Running out of memory (std::bad_alloc, or a container
+// asked to grow past its limit) is not thrown: the outcome is Unreadable, the
+// empty text and a note of rule OutOfMemory.
+ConversionOutcome convertFile(const std::u16string& path, FileKind kind,
+                              SunStart sun = SunStart::Fresh);
 
 // One line on an outcome: "document, 3 materials, 12300 bytes" or
 // "text: <why>" or "unreadable: <why>".

@@ -34,6 +34,7 @@ const char* ruleText(LoadRule rule) {
     case LoadRule::RecordRefused: return "record refused by its class";
     case LoadRule::NotRegularFile: return "not a regular file";
     case LoadRule::CannotOpen: return "can't be opened";
+    case LoadRule::OutOfMemory: return "out of memory";
     }
     return "?";
 }
@@ -76,7 +77,9 @@ std::string refusedValue(const LoadNote& note) {
 
 std::string describe(const LoadNote& note) {
     std::string line = ruleText(note.rule);
-    if (note.rule == LoadRule::None || note.rule == LoadRule::NotRegularFile) return line;
+    if (note.rule == LoadRule::None || note.rule == LoadRule::NotRegularFile ||
+        note.rule == LoadRule::OutOfMemory)
+        return line;
     if (note.rule != LoadRule::CannotOpen) line += " at byte " + std::to_string(note.offset);
     if (note.record.type) {
         line += ", reading " + className(note.record.type);

@@ -24,6 +24,7 @@ enum class LoadRule : std::uint8_t {
     RecordRefused,   // a check of the record's own class
     NotRegularFile,
     CannotOpen,
+    OutOfMemory,     // memory ran out while the file was converted
 };
 
 // A record being read: where it starts, the type tag it was read under, its

@@ -18,6 +18,7 @@ sys.path.insert(0, BUILD)
 import PyOrvXml  # noqa: E402,F401
 
 PY3 = sys.version_info[0] >= 3
+COMMAND = os.path.join(BUILD, 'orvxml')
 
 
 def text(path):
@@ -27,6 +28,20 @@ def text(path):
 
 def example(name):
     return text(os.path.join(EXAMPLES, name))
+
+
+def explain(path, scratch, preexec_fn=None):
+    """The --explain line of one file, behind "<path>: ", as the command prints it."""
+    args = [COMMAND, '--explain', '--jobs', '1', '-o', scratch, path]
+    p = subprocess.Popen([a.encode('utf-8') if not PY3 else a for a in args],
+                         stdout=subprocess.PIPE, stderr=subprocess.PIPE, preexec_fn=preexec_fn)
+    out, err = p.communicate()
+    lines = out.decode('utf-8').splitlines()
+    prefix = path + u': '
+    found = [line[len(prefix):] for line in lines if line.startswith(prefix)]
+    if len(found) != 1:
+        raise AssertionError('no --explain line for %r in %r (%r)' % (path, out, err))
+    return found[0]
 
 
 def read(path):

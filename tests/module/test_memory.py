@@ -1,24 +1,27 @@
 # -*- coding: utf-8 -*-
 """Running out of memory inside a conversion is the interpreter's MemoryError,
 and the interpreter goes on: tried in a child interpreter under an address
-space limit."""
+space limit. The command says "out of memory" for the file and goes on."""
 import os
 import struct
 import subprocess
 import sys
 import unittest
 
-from support import BUILD, EXAMPLES, ScratchTest, example, read, PyOrvXml
+from support import BUILD, EXAMPLES, ScratchTest, example, explain, read, PyOrvXml
+
+LIMIT_MB = 400
 
 CHILD = """
 import resource, sys
 import PyOrvXml
 big, small = [p if sys.version_info[0] >= 3 else p.decode('utf-8') for p in sys.argv[1:3]]
 limit = int(sys.argv[3]) << 20
+function = getattr(PyOrvXml, sys.argv[4])
 resource.setrlimit(resource.RLIMIT_AS, (limit, limit))
 for attempt in range(2):
     try:
-        PyOrvXml.getOrvmatXml(big)
+        function(big)
         sys.stdout.write('converted ')
     except MemoryError:
         sys.stdout.write('MemoryError ')
@@ -38,11 +41,19 @@ class MemoryLimit(ScratchTest):
     def test_allocation_failure_raises_and_the_next_call_works(self):
         big = self.large_library(40000)
         small = example('materials_all_layers.orvmat')
-        out = subprocess.check_output(
-            [sys.executable, '-c', CHILD, big.encode('utf-8'), small.encode('utf-8'), '400'],
-            env=dict(os.environ, PYTHONPATH=BUILD))
-        self.assertEqual(out.decode('ascii').split(),
-                         ['MemoryError', 'MemoryError', str(len(PyOrvXml.getOrvmatXml(small)))])
+        for function in ('getOrvmatXml',):
+            out = subprocess.check_output(
+                [sys.executable, '-c', CHILD, big.encode('utf-8'), small.encode('utf-8'),
+                 str(LIMIT_MB), function], env=dict(os.environ, PYTHONPATH=BUILD))
+            self.assertEqual(out.decode('ascii').split(),
+                             ['MemoryError', 'MemoryError', str(len(PyOrvXml.getOrvmatXml(small)))])
+
+    def test_command_gives_out_of_memory_as_the_reason(self):
+        def limit():
+            import resource
+            resource.setrlimit(resource.RLIMIT_AS, (LIMIT_MB << 20, LIMIT_MB << 20))
+        self.assertEqual(explain(self.large_library(40000), self.dir, limit),
+                         'unreadable: out of memory')
 
     def test_the_same_file_converts_without_the_limit(self):
         # The library is valid: what fails above is memory, not the file.
