@@ -118,7 +118,8 @@ class CommandLine(Tree):
         code, out, _ = run('--help')
         self.assertEqual(code, 0)
         self.assertTrue(out.startswith(b'Usage: orvxml '))
-        for option in (b'--output', b'--jobs', b'--explain', b'--report', b'--quiet', b'--version'):
+        for option in (b'--output', b'--jobs', b'--explain', b'--report', b'--fallbacks', b'--quiet',
+                       b'--version'):
             self.assertIn(option, out)
         code, out, _ = run('--version')
         self.assertEqual(code, 0)
@@ -377,6 +378,33 @@ class ExitStatus(Tree):
         # A FIFO named on its own: the output folder is made and stays empty.
         code, _, _ = run('-o', self.path('out3'), self.path('in', 'pipe.orvmat'))
         self.assertEqual((code, os.listdir(self.path('out3'))), (3, []))
+
+
+    def test_fallbacks_can_be_skipped(self):
+        good = self.copy('materials_old_records_v2.orvmat', 'in/good.orvmat')
+        text = self.copy('text_export.orvmat', 'in/sub/text.orvmat')
+        for jobs in ('1', '2'):
+            out, report = self.path('out' + jobs), self.path('report%s.jsonl' % jobs)
+            code, explain, err = run('-j', jobs, '--fallbacks', 'skip', '--explain', '--report', report,
+                                     '-o', out, self.path('in'))
+            self.assertEqual(code, 1, err)
+            self.assertEqual(self.files_under(out), ['good.orvmat.xml'])
+            self.assertEqual(self.summary(err), 'orvxml: 1 converted, 1 fell back to text, 0 unreadable')
+            lines = explain.decode('utf-8').splitlines()
+            self.assertEqual(len(lines), 2, lines)
+            self.assertTrue(lines[0].startswith(good + ': document, '), lines)
+            self.assertTrue(lines[1].startswith(text + ': text: '), lines)
+            with open(report) as f:
+                rows = [json.loads(line) for line in f]
+            self.assertEqual([(r['status'], r['characters'] > 0) for r in rows],
+                             [('document', True), ('text', True)])
+        code, _, _ = run('--fallbacks=write', '-o', self.path('out'), self.path('in'))
+        self.assertEqual(code, 1)
+        self.assertEqual(self.files_under(self.path('out')), ['good.orvmat.xml', 'sub/text.orvmat.xml'])
+        for bad in (['--fallbacks', 'maybe', good], ['--fallbacks'], ['--fallbacks=', good]):
+            code, _, err = run(*bad)
+            self.assertEqual(code, 2, bad)
+            self.assertIn('Try \'orvxml --help\'', err)
 
 
 class FullDisk(Tree):

@@ -245,6 +245,16 @@ class SameAsLinux(Scratch):
             self.assertEqual(sorted(files_under(self.path(command))), ['a.orvmat.xml', 'sub'])
 
 
+    def test_fallbacks_skipped(self):
+        for command in ('linux', 'windows'):
+            code, _, err = run(command, ['-q', '-j', '2', '--fallbacks', 'skip', '-o', command, EXAMPLES],
+                               self.tmp)
+            self.assertEqual((code, err), (1, ''), command)
+        self.assertEqual(files_under(self.path('windows')), files_under(self.path('linux')))
+        self.assertIn('render_settings.orvopt.xml', os.listdir(self.path('linux')))
+        self.assertNotIn('text_export.orvmat.xml', os.listdir(self.path('linux')))
+
+
 class WindowsCases(Scratch):
     def copy(self, example, *parts):
         path = self.path(*parts)

@@ -30,6 +30,10 @@ const char kUsage[] =
     "                     why the file fell back to text\n"
     "      --report=FILE  write JSON Lines to FILE, one object per file: path,\n"
     "                     kind, status, reason, characters, milliseconds\n"
+    "      --fallbacks=write|skip\n"
+    "                     with -o, write the text of a file that falls back to\n"
+    "                     text as its output (the default), or skip it: no\n"
+    "                     file, but it is still explained, reported and counted\n"
     "  -q, --quiet        print nothing but errors\n"
     "  -h, --help         show this help and exit\n"
     "      --version      show the version and exit\n"
@@ -90,7 +94,7 @@ Parsed parseArgs(const std::vector<std::string>& args, Settings& s, std::string&
             hasValue = true;
         }
         const bool takesValue = name == "-o" || name == "--output" || name == "-j" ||
-                                name == "--jobs" || name == "--report";
+                                name == "--jobs" || name == "--report" || name == "--fallbacks";
         if (takesValue && !hasValue) {
             if (i + 1 >= args.size()) {
                 error = "option " + name + " needs a value";
@@ -125,6 +129,12 @@ Parsed parseArgs(const std::vector<std::string>& args, Settings& s, std::string&
                 return Parsed::UsageError;
             }
             s.reportPath = value;
+        } else if (name == "--fallbacks") {
+            if (value != "write" && value != "skip") {
+                error = "--fallbacks takes write or skip, not '" + value + "'";
+                return Parsed::UsageError;
+            }
+            s.writeFallbacks = value == "write";
         } else if (name == "-j" || name == "--jobs") {
             if (!parseJobs(value, s.jobs)) {
                 error = "--jobs needs a whole number from 1 on, not '" + value + "'";

@@ -12,6 +12,7 @@ struct Settings {
     unsigned jobs = 0;       // 0: one per core
     bool explain = false;
     bool quiet = false;
+    bool writeFallbacks = true;  // --fallbacks skip: a file that falls back to text gets no output
 };
 
 enum class Parsed { Run, Help, Version, UsageError };

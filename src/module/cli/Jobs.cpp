@@ -65,8 +65,11 @@ FileResult runJob(const Job& job, std::FILE* textOut) {
         r.characters = codePoints(o.text);
         r.line = OrvaneLumoCore::explainOutcome(o, job.kind);
         if (o.status != FileStatus::Document) r.reason = OrvaneLumoCore::describe(o.note);
-        // A file that can't be read has no text of its own: it gets no output file.
-        if (!job.output.empty() && o.status != FileStatus::Unreadable) {
+        // A file that can't be read has no text of its own: it gets no output
+        // file, and a text gets one unless the run skips them.
+        const bool written =
+            o.status == FileStatus::Document || (o.status == FileStatus::Text && job.writeText);
+        if (!job.output.empty() && written) {
             if ((r.writeErrno = writeFile(job.output, toUtf8(o.text))) != 0)
                 r.writeError = job.output + ": " + std::strerror(r.writeErrno);
         } else if (textOut) {

@@ -13,6 +13,7 @@ struct Job {
     std::string output;      // the file to write; empty: none
     OrvaneLumoCore::FileKind kind = OrvaneLumoCore::FileKind::Materials;
     bool hasKind = false;
+    bool writeText = true;   // false: a file that falls back to text gets no output
     std::string refusal;     // why the path isn't converted at all; empty: it is
 };
 

@@ -30,6 +30,7 @@ std::string packJob(std::uint64_t index, const Job& job) {
     body.put(index);
     body.put(static_cast<std::uint8_t>(job.kind));
     body.put(static_cast<std::uint8_t>(job.hasKind));
+    body.put(static_cast<std::uint8_t>(job.writeText));
     body.putText(job.source, kMaxPath);
     body.putText(std::string(reinterpret_cast<const char*>(job.widePath.data()), 2 * job.widePath.size()),
                  kMaxPath);
@@ -40,13 +41,14 @@ std::string packJob(std::uint64_t index, const Job& job) {
 
 bool parseJob(const std::string& body, std::uint64_t& index, Job& job) {
     Unpacker in(body.data(), body.size());
-    std::uint8_t kind = 0, hasKind = 0;
+    std::uint8_t kind = 0, hasKind = 0, writeText = 0;
     std::string wide;
-    if (!in.get(index) || !in.get(kind) || !in.get(hasKind) || !in.getText(job.source, kMaxPath) ||
+    if (!in.get(index) || !in.get(kind) || !in.get(hasKind) || !in.get(writeText) || !in.getText(job.source, kMaxPath) ||
         !in.getText(wide, kMaxPath) || !in.getText(job.output, kMaxPath) || !in.getText(job.refusal, kMaxPath))
         return false;
     job.kind = static_cast<OrvaneLumoCore::FileKind>(kind);
     job.hasKind = hasKind != 0;
+    job.writeText = writeText != 0;
     job.widePath.resize(wide.size() / 2);
     std::memcpy(&job.widePath[0], wide.data(), 2 * job.widePath.size());
     return true;

@@ -81,6 +81,7 @@ int runProgram(const std::vector<std::string>& args) {
     const bool toStdout = settings.outDir.empty() && !settings.explain;
     std::vector<Job> jobs;
     if (!collectJobs(settings.paths, settings.outDir, !toStdout, jobs, error)) return usageError(error);
+    for (Job& job : jobs) job.writeText = settings.writeFallbacks;
 
     if (!settings.outDir.empty()) {
         if (const int e = makeFolders(settings.outDir))
