@@ -25,10 +25,23 @@ class Arguments(ScratchTest):
             self.assertEqual(PyOrvXml.getOrvmatXml(arg), '<a/>')
             self.assertIs(type(PyOrvXml.getOrvmatXml(arg)), str)
 
+    def test_outcome_takes_the_same_paths(self):
+        path = self.write('a.luopt', b'<a/>')
+        for arg in (path, pathlib.Path(path), PathLike(path)):
+            self.assertEqual(PyOrvXml.getXmlWithOutcome(arg),
+                             ('<a/>', 'text', PyOrvXml.getXmlWithOutcome(path).reason, 'options', 0))
+        for arg in (path.encode(), PathLike(path.encode()), PathLike(3)):
+            self.assertRaises(TypeError, PyOrvXml.getXmlWithOutcome, arg)
+        with self.assertRaises(TypeError) as caught:
+            PyOrvXml.getXmlWithOutcome(path, True)  # the options are keywords only
+        self.assertIn('positional', str(caught.exception))
+
     def test_no_reference_to_the_path_is_kept(self):
         path = self.write('a.orvmat', b'<a/>')
         for arg, function in ((path, PyOrvXml.getOrvmatXml), (path.encode(), PyOrvXml.getOrvmatXml),
-                              (path, PyOrvXml.getOrvoptXml), (path + '\0', PyOrvXml.getOrvmatXml)):
+                              (path, PyOrvXml.getOrvoptXml), (path + '\0', PyOrvXml.getOrvmatXml),
+                              (path, PyOrvXml.getXmlWithOutcome),
+                              (path + '\0', PyOrvXml.getXmlWithOutcome)):
             before = sys.getrefcount(arg)
             for _ in range(100):
                 try:

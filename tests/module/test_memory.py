@@ -41,7 +41,7 @@ class MemoryLimit(ScratchTest):
     def test_allocation_failure_raises_and_the_next_call_works(self):
         big = self.large_library(40000)
         small = example('materials_all_layers.orvmat')
-        for function in ('getOrvmatXml',):
+        for function in ('getOrvmatXml', 'getXmlWithOutcome'):
             out = subprocess.check_output(
                 [sys.executable, '-c', CHILD, big.encode('utf-8'), small.encode('utf-8'),
                  str(LIMIT_MB), function], env=dict(os.environ, PYTHONPATH=BUILD))

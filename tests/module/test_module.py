@@ -15,16 +15,24 @@ class ModuleSurface(ScratchTest):
             kind = ext[0][1:]
             self.assertTrue(function.__doc__.startswith('Gets the xml from a %s file.\n' % kind))
             for word in ext + ('Returns', 'SystemError', 'TypeError', 'MemoryError',
-                               'PyOrvXml.error', 'unicode' if not PY3 else 'os.PathLike'):
+                               'PyOrvXml.error', 'unicode' if not PY3 else 'os.PathLike',
+                               'document sun carries'):
                 self.assertIn(word, function.__doc__)
-        self.assertIn('getOrvmatXml', PyOrvXml.__doc__)
-        self.assertIn('getOrvoptXml', PyOrvXml.__doc__)
+        for word in ('.orvmat', '.luopt', 'freshSun', 'document sun', 'SystemError', 'TypeError',
+                     'MemoryError', '(text, status, reason, kind, count)', '--explain'):
+            self.assertIn(word, PyOrvXml.getXmlWithOutcome.__doc__)
+        for word in ('getOrvmatXml', 'getOrvoptXml', 'getXmlWithOutcome', 'document sun carries'):
+            self.assertIn(word, PyOrvXml.__doc__)
+        # A struct sequence, as os.stat_result: a tuple subclass on 3 only.
+        self.assertEqual(issubclass(PyOrvXml.Outcome, tuple), PY3)
+        self.assertEqual(PyOrvXml.Outcome.__name__, 'Outcome')
+        self.assertEqual(PyOrvXml.Outcome.__module__, 'PyOrvXml')
         self.assertTrue(issubclass(PyOrvXml.error, Exception))
         self.assertEqual(PyOrvXml.error.__name__, 'error')
         self.assertEqual(PyOrvXml.error.__module__, 'PyOrvXml')
         self.assertIn('MemoryError', PyOrvXml.error.__doc__)
         self.assertEqual(sorted(n for n in dir(PyOrvXml) if not n.startswith('_')),
-                         ['error', 'getOrvmatXml', 'getOrvoptXml'])
+                         ['Outcome', 'error', 'getOrvmatXml', 'getOrvoptXml', 'getXmlWithOutcome'])
 
     def test_extensions_in_any_case_pass_their_own_function_only(self):
         for name in ('a.orvmat', 'b.ORVMAT', 'c.LuMat', 'd.lumat'):
