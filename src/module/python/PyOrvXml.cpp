@@ -318,9 +318,9 @@ const char kOutcomeDoc[] =
     "does for every file, so the result doesn't depend on what was converted\n"
     "before (the file's own sky record still replaces it for later calls). Without\n"
     "it the sun carries over as in getOrvmatXml and getOrvoptXml.\n"
-    "A path of another extension " ORVXML_REFUSED "; bytes raise TypeError;\n"
-    "MemoryError when memory runs out, PyOrvXml.error for any other failure inside\n"
-    "the library.";
+    "A path of another extension " ORVXML_REFUSED ";\n"
+    "bytes raise TypeError; MemoryError when memory runs out, PyOrvXml.error for any\n"
+    "other failure inside the library.";
 
 PyMethodDef kMethods[] = {
     {"getOrvmatXml", getOrvmatXml, METH_VARARGS,
