@@ -22,6 +22,15 @@ extern const bool kNamesIgnoreCase;
 
 enum class PathKind { Missing, Folder, Other };
 
+// The absolute form of `path`, with "." and ".." steps resolved (on POSIX
+// systems links too); `path` itself if that can't be told.
+std::string fullPath(const std::string& path);
+
+// When the file at `path` was last written, in nanoseconds
+// since an epoch that is the same for every file of the system. False if it
+// can't be told.
+bool modificationTime(const std::string& path, long long& nanoseconds);
+
 // What `path` names, following links. For Missing, `error` says why.
 PathKind pathKind(const std::string& path, int& error);
 
@@ -70,5 +79,9 @@ unsigned long processId();
 // that doesn't, where a shorter line must be padded with spaces.
 enum class Terminal { None, Escapes, Plain };
 Terminal errorTerminal();
+
+// How many columns the terminal that standard error shows on has; 80 when
+// that can't be told.
+int errorTerminalColumns();
 
 }  // namespace platform

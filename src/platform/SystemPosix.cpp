@@ -2,9 +2,11 @@
 #include "platform/System.h"
 
 #include <cerrno>
+#include <cstdlib>
 
 #include <dirent.h>
 #include <fcntl.h>
+#include <sys/ioctl.h>
 #include <sys/stat.h>
 #include <unistd.h>
 
@@ -87,5 +89,30 @@ bool isNoSpace(int error) { return error == ENOSPC || error == EDQUOT; }
 unsigned long processId() { return static_cast<unsigned long>(::getpid()); }
 
 Terminal errorTerminal() { return ::isatty(STDERR_FILENO) ? Terminal::Escapes : Terminal::None; }
+
+int errorTerminalColumns() {
+    winsize size = {};
+    if (::ioctl(STDERR_FILENO, TIOCGWINSZ, &size) == 0 && size.ws_col > 0) return size.ws_col;
+    // A terminal that doesn't tell its size (a serial line) may still be
+    // described by the shell.
+    const char* columns = std::getenv("COLUMNS");
+    const long n = columns ? std::strtol(columns, nullptr, 10) : 0;
+    return n > 0 && n < 10000 ? static_cast<int>(n) : 80;
+}
+
+std::string fullPath(const std::string& path) {
+    char* full = ::realpath(path.c_str(), nullptr);
+    if (!full) return path;
+    const std::string result(full);
+    std::free(full);
+    return result;
+}
+
+bool modificationTime(const std::string& path, long long& nanoseconds) {
+    struct stat st;
+    if (::stat(path.c_str(), &st) != 0) return false;
+    nanoseconds = static_cast<long long>(st.st_mtim.tv_sec) * 1000000000LL + st.st_mtim.tv_nsec;
+    return true;
+}
 
 }  // namespace platform

@@ -203,4 +203,32 @@ Terminal errorTerminal() {
     return Terminal::Plain;
 }
 
+int errorTerminalColumns() {
+    CONSOLE_SCREEN_BUFFER_INFO info;
+    if (GetConsoleScreenBufferInfo(GetStdHandle(STD_ERROR_HANDLE), &info))
+        return info.srWindow.Right - info.srWindow.Left + 1;
+    return 80;
+}
+
+std::string fullPath(const std::string& path) {
+    const std::wstring wide = toWide(utf16Path(path));
+    const DWORD n = GetFullPathNameW(wide.c_str(), 0, nullptr, nullptr);
+    if (n == 0) return path;
+    std::wstring full(n, L'\0');
+    const DWORD written = GetFullPathNameW(wide.c_str(), n, &full[0], nullptr);
+    if (written == 0 || written >= n) return path;
+    return utf8Path(full.data(), written);
+}
+
+bool modificationTime(const std::string& path, long long& nanoseconds) {
+    WIN32_FILE_ATTRIBUTE_DATA data;
+    if (!GetFileAttributesExW(native(path).c_str(), GetFileExInfoStandard, &data)) return false;
+    // A FILETIME counts 100 ns steps.
+    const unsigned long long ticks =
+        (static_cast<unsigned long long>(data.ftLastWriteTime.dwHighDateTime) << 32) |
+        data.ftLastWriteTime.dwLowDateTime;
+    nanoseconds = static_cast<long long>(ticks) * 100;
+    return true;
+}
+
 }  // namespace platform

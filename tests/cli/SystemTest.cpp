@@ -4,6 +4,9 @@
 #include <gtest/gtest.h>
 
 #include <algorithm>
+#include <chrono>
+#include <cstring>
+#include <thread>
 #include <cerrno>
 #include <string>
 #include <vector>
@@ -53,6 +56,27 @@ TEST(SystemPaths, KindsOfPaths) {
     error = 0;
     EXPECT_EQ(platform::pathKind(dir.file("a.orvmat/below"), error), PathKind::Missing);
     EXPECT_NE(error, 0);
+}
+
+TEST(SystemPaths, FullPathsResolveDotsAndTimesFollowWrites) {
+    TempDir dir;
+    ASSERT_EQ(platform::makeFolder(dir.file("sub")), 0);
+    const std::string sub = platform::fullPath(dir.file("sub"));
+    EXPECT_EQ(platform::fullPath(dir.file("sub/../sub/.")), sub);
+    ASSERT_GT(sub.size(), 4u);
+    EXPECT_EQ(sub.compare(sub.size() - 3, 3, "sub"), 0) << sub;
+    EXPECT_NE(std::strchr(platform::kPathSeparators, sub[sub.size() - 4]), nullptr) << sub;
+    EXPECT_EQ(platform::fullPath(sub), sub);  // already absolute and resolved
+
+    long long before = 0, after = 0;
+    EXPECT_FALSE(platform::modificationTime(dir.file("gone.orvmat"), before));
+    ASSERT_EQ(platform::writeNewFile(dir.file("a.orvmat"), "x"), 0);
+    ASSERT_TRUE(platform::modificationTime(dir.file("a.orvmat"), before));
+    std::this_thread::sleep_for(std::chrono::milliseconds(50));
+    ASSERT_EQ(platform::writeNewFile(dir.file("b.orvmat"), "y"), 0);
+    ASSERT_TRUE(platform::modificationTime(dir.file("b.orvmat"), after));
+    EXPECT_GT(after, before);
+    EXPECT_LT(after - before, 60LL * 1000000000LL);  // nanoseconds, not some coarser unit
 }
 
 TEST(SystemFolders, ListingHoldsEveryEntryButDots) {

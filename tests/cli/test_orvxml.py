@@ -15,7 +15,7 @@ import tempfile
 import time
 import unittest
 
-ORVXML = os.environ.get('ORVXML', 'build/orvxml')
+ORVXML = os.path.abspath(os.environ.get('ORVXML', 'build/orvxml'))
 EXAMPLES = os.path.join(os.environ.get('ORVXML_SOURCE_DIR', '.'), 'examples')
 
 
@@ -118,8 +118,8 @@ class CommandLine(Tree):
         code, out, _ = run('--help')
         self.assertEqual(code, 0)
         self.assertTrue(out.startswith(b'Usage: orvxml '))
-        for option in (b'--output', b'--jobs', b'--explain', b'--report', b'--fallbacks', b'--quiet',
-                       b'--version'):
+        for option in (b'--output', b'--jobs', b'--update', b'--explain', b'--report', b'--fallbacks',
+                       b'--quiet', b'--version'):
             self.assertIn(option, out)
         code, out, _ = run('--version')
         self.assertEqual(code, 0)
@@ -145,20 +145,18 @@ class CommandLine(Tree):
         self.assertEqual(err.splitlines(), [
             'orvxml: %s: can\'t be opened: No such file or directory' % self.path('gone.orvmat')])
 
-    def test_progress_only_on_a_terminal(self):
-        tree = self.path('tree')
-        for i in range(30):
-            self.copy('materials_old_records_v2.orvmat', os.path.join('tree', '%02d.orvmat' % i))
-        code, _, err = run('-o', self.path('out'), tree)
-        self.assertEqual(code, 0)
-        self.assertEqual(len(err.splitlines()), 1)
-        self.assertNotIn('files/s', err)
+    def on_terminal(self, columns, *args):
+        """Runs with standard error on a pseudo terminal of `columns` columns;
+        the status and what the terminal was sent."""
         try:
+            import fcntl
             import pty
+            import termios
             master, slave = pty.openpty()
         except (ImportError, OSError):
             self.skipTest('no pseudo terminal')
-        code, _, _ = run('-o', self.path('out2'), tree, stderr=slave)
+        fcntl.ioctl(slave, termios.TIOCSWINSZ, struct.pack('HHHH', 24, columns, 0, 0))
+        code = run(*args, stderr=slave)[0]
         os.close(slave)
         shown = b''
         try:
@@ -167,10 +165,34 @@ class CommandLine(Tree):
         except OSError:
             pass
         os.close(master)
+        return code, shown
+
+    def test_progress_only_on_a_terminal_and_within_its_width(self):
+        first = self.copy('materials_all_layers.orvmat', 'tree/0000.orvmat')
+        for i in range(1, 3000):
+            shutil.copyfile(first, self.path('tree', '%04d.orvmat' % i))
+        code, _, err = run('-o', self.path('out'), self.path('tree'))
         self.assertEqual(code, 0)
-        self.assertIn(b' of 30 files, ', shown)
-        self.assertIn(b'files/s', shown)
-        self.assertIn(b'30 converted, 0 fell back to text, 0 unreadable', shown)
+        self.assertEqual(len(err.splitlines()), 1)
+        self.assertNotIn(' of ', err)
+        for columns in (30, 160):
+            code, shown = self.on_terminal(columns, '-j1', '-o', self.path('out%d' % columns),
+                                           self.path('tree'))
+            self.assertEqual(code, 0)
+            # The summary starts on a clean line, the progress line erased.
+            end = shown.rindex(b'\r\x1b[Korvxml: 3000 converted, 0 fell back to text, 0 unreadable (')
+            # Each draw replaces the line; none reaches the last column, so none wraps.
+            draws = [d.replace(b'\x1b[K', b'') for d in shown[:end].split(b'\r') if d]
+            self.assertEqual([d for d in draws if len(d) >= columns], [], columns)
+            # The count while the tree is walked, then done of found, the rate, the time left.
+            self.assertRegex(draws[0], br'^(orvxml: )?finding files, \d+ found$')
+            self.assertRegex(draws[1], br'^(orvxml: )?1 of 3000 files$')
+            timed = [d for d in draws if d.endswith(b' left')]
+            self.assertTrue(timed, draws)
+            if columns == 160:
+                self.assertRegex(timed[0], br'^orvxml: \d+ of 3000 files, \d+ files/s, \d+:\d\d left$')
+            else:
+                self.assertRegex(timed[0], br'^\d+/3000, \d+/s, \d+:\d\d left$')
 
 
 class Trees(Tree):
@@ -187,6 +209,41 @@ class Trees(Tree):
             'a.orvmat.xml', 'single.luopt.xml', 'sub/b.LUOPT.xml', 'sub/deeper/c.LuMat.xml'])
         _, alone, _ = run(self.path('lib/sub/b.LUOPT'))
         self.assertEqual(self.read(self.path('out/sub/b.LUOPT.xml')), alone)
+
+    def test_several_folders_go_under_their_own_names(self):
+        for lib in ('a/lib', 'b/lib2'):
+            self.copy('materials_old_records_v2.orvmat', lib + '/x.orvmat')
+            self.copy('render_settings.orvopt', lib + '/sub/y.orvopt')
+        single = self.copy('old_settings_v4.luopt', 'single.luopt')
+        code, _, err = run('-o', self.path('out'), self.path('a', 'lib'), self.path('b', 'lib2') + os.sep,
+                           single)
+        self.assertEqual(code, 0, err)
+        self.assertEqual(self.files_under(self.path('out')), [
+            'lib/sub/y.orvopt.xml', 'lib/x.orvmat.xml', 'lib2/sub/y.orvopt.xml', 'lib2/x.orvmat.xml',
+            'single.luopt.xml'])
+        # "." and ".." go under the names that the folders really have.
+        code, _, err = run('-o', self.path('dots'), '.', '..', cwd=self.path('a', 'lib'))
+        self.assertEqual(code, 0, err)
+        self.assertEqual(self.files_under(self.path('dots')), [
+            'a/lib/sub/y.orvopt.xml', 'a/lib/x.orvmat.xml', 'lib/sub/y.orvopt.xml', 'lib/x.orvmat.xml'])
+        # Inputs that still meet in one output: a usage error that names both,
+        # before anything is written.
+        self.copy('render_settings.orvopt', 'c/lib/x.orvmat')
+        clash = self.path('clash')
+        for args, first, second, output in (
+                ([self.path('a', 'lib'), self.path('c', 'lib')], self.path('a', 'lib', 'x.orvmat'),
+                 self.path('c', 'lib', 'x.orvmat'), os.path.join(clash, 'lib', 'x.orvmat.xml')),
+                ([self.path('c', 'lib'), self.path('a', 'lib', 'x.orvmat')], self.path('c', 'lib', 'x.orvmat'),
+                 self.path('a', 'lib', 'x.orvmat'), os.path.join(clash, 'x.orvmat.xml'))):
+            code, out, err = run('-o', clash, *args)
+            self.assertEqual((code, out), (2, b''))
+            self.assertEqual(err.splitlines()[0],
+                             'orvxml: %s and %s would both be written to %s' % (first, second, output))
+            self.assertFalse(os.path.exists(clash))
+        # The same path twice is one file, converted once.
+        code, _, err = run('-o', clash, single, single)
+        self.assertEqual(code, 0)
+        self.assertIn('orvxml: 1 converted, ', err)
 
     def test_exit_status_follows_the_worst_file(self):
         good = self.copy('materials_old_records_v2.orvmat', 'good.orvmat')
@@ -225,6 +282,40 @@ class Trees(Tree):
             _, alone, _ = run(path)
             self.assertEqual(self.read(self.path('two', name)), alone, name)
             self.assertEqual(self.read(self.path('one', name)), alone, name)
+
+
+class Update(Tree):
+    def summary(self, err):
+        line = err.splitlines()[-1]
+        return line[:line.rindex(' (')]
+
+    def test_only_missing_and_older_outputs_are_made_again(self):
+        a = self.copy('materials_old_records_v2.orvmat', 'in/a.orvmat')
+        b = self.copy('render_settings.orvopt', 'in/sub/b.orvopt')
+        t = self.copy('text_export.orvmat', 'in/t.orvmat')
+        out, report = self.path('out'), self.path('report.jsonl')
+        code, _, err = run('--update', '-o', out, self.path('in'))
+        self.assertEqual((code, self.summary(err)),
+                         (1, 'orvxml: 2 converted, 1 fell back to text, 0 unreadable, 0 up to date'))
+        fresh = dict((n, self.read(os.path.join(out, n))) for n in self.files_under(out))
+        code, explain, err = run('--update', '--explain', '--report', report, '-o', out, self.path('in'))
+        self.assertEqual((code, self.summary(err)),
+                         (0, 'orvxml: 0 converted, 0 fell back to text, 0 unreadable, 3 up to date'))
+        self.assertEqual(explain.decode('utf-8').splitlines(),
+                         ['%s: up to date' % p for p in (a, b, t)])
+        with open(report) as f:
+            self.assertEqual([(r['path'], r['status']) for r in map(json.loads, f)],
+                             [(a, 'up to date'), (b, 'up to date'), (t, 'up to date')])
+        # An output that is gone, one older than its input, one of the same time.
+        os.remove(os.path.join(out, 'sub', 'b.orvopt.xml'))
+        made = os.stat(os.path.join(out, 'a.orvmat.xml')).st_mtime_ns
+        os.utime(a, ns=(made + 10**9, made + 10**9))
+        os.utime(os.path.join(out, 't.orvmat.xml'), ns=(os.stat(t).st_mtime_ns,) * 2)
+        code, _, err = run('--update', '-o', out, self.path('in'))
+        self.assertEqual((code, self.summary(err)),
+                         (0, 'orvxml: 2 converted, 0 fell back to text, 0 unreadable, 1 up to date'))
+        self.assertEqual(dict((n, self.read(os.path.join(out, n))) for n in self.files_under(out)), fresh)
+        self.assertEqual(run('--update', a)[0], 2)
 
 
 class Explanations(Tree):
@@ -389,6 +480,7 @@ class ExitStatus(Tree):
                                      '-o', out, self.path('in'))
             self.assertEqual(code, 1, err)
             self.assertEqual(self.files_under(out), ['good.orvmat.xml'])
+            self.assertFalse(os.path.exists(os.path.join(out, 'sub')))  # no empty folder either
             self.assertEqual(self.summary(err), 'orvxml: 1 converted, 1 fell back to text, 0 unreadable')
             lines = explain.decode('utf-8').splitlines()
             self.assertEqual(len(lines), 2, lines)
@@ -482,7 +574,26 @@ class Interrupts(Tree):
         for name in written:
             self.assertEqual(self.read(os.path.join(out, name)), expected, name)
         with open(report) as f:
-            self.assertEqual(len(f.readlines()), len(written))
+            rows = [json.loads(line) for line in f]  # every line whole
+        self.assertEqual(sorted(os.path.basename(r['path']) + '.xml' for r in rows), sorted(written))
+        # A run killed outright leaves part files: the next run removes ours
+        # and no one else's.
+        left = os.path.join(out, '0000.orvmat.xml.part4242')
+        self.put(left, b'<orvmat>')
+        self.put(os.path.join(out, 'notes.part12'), b'kept')
+        code, _, err = run('--update', '-o', out, self.path('in'))
+        self.assertEqual(code, 0, err)
+        self.assertIn('orvxml: %d converted, 0 fell back to text, 0 unreadable, %d up to date ('
+                      % (missing, len(written)), err)
+        self.assertFalse(os.path.exists(left))
+        self.assertEqual(self.read(os.path.join(out, 'notes.part12')), b'kept')
+        for name in os.listdir(out):
+            if name != 'notes.part12':
+                self.assertEqual(self.read(os.path.join(out, name)), expected, name)
+        self.assertEqual(len(os.listdir(out)), self.COPIES + 1)
+        code, _, err = run('--update', '-o', out, self.path('in'))
+        self.assertIn('orvxml: 0 converted, 0 fell back to text, 0 unreadable, %d up to date ('
+                      % self.COPIES, err)
 
     def test_ctrl_c_reaches_every_process(self):
         self.interrupt(signal.SIGINT, 2, True)

@@ -293,15 +293,13 @@ class WindowsCases(Scratch):
         second = self.copy('old_settings_v4.luopt', 'y', 'A.ORVOPT')
         code, out, _ = run('linux', ['-q', '-o', self.path('linux'), first, second], self.tmp)
         self.assertEqual(sorted(os.listdir(self.path('linux'))), ['A.ORVOPT.xml', 'a.orvopt.xml'])
-        # One file on Windows: the second is refused, the first stays whole.
-        code, out, _ = run('windows', ['-q', '--explain', '-o', self.path('out'), first, second],
-                           self.tmp)
-        self.assertEqual(code, 3)
-        self.assertEqual(out.decode('utf-8').splitlines()[1],
-                         '%s: unreadable: its output %s is written for an earlier file'
-                         % (second, self.path('out', 'A.ORVOPT.xml')))
-        self.assertEqual(files_under(self.path('out')),
-                         {'a.orvopt.xml': read(self.path('linux', 'a.orvopt.xml'))})
+        # One file on Windows: a usage error that names both, before anything is written.
+        code, out, err = run('windows', ['-q', '--explain', '-o', self.path('out'), first, second],
+                             self.tmp)
+        self.assertEqual((code, out), (2, b''))
+        self.assertTrue(err.startswith('orvxml: %s and %s would both be written to %s\n'
+                                       % (first, second, self.path('out', 'A.ORVOPT.xml'))), err)
+        self.assertFalse(os.path.exists(self.path('out')))
 
     def test_the_nul_device(self):
         code, out, _ = run('windows', ['--explain', 'NUL'], self.tmp)

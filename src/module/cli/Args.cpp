@@ -19,13 +19,17 @@ const char kUsage[] =
     "doesn't load as binary comes back as its own text.\n"
     "\n"
     "Without -o the result goes to standard output as UTF-8. With -o each FILE\n"
-    "gives DIR/FILE.xml (a.orvmat gives a.orvmat.xml), and each folder is walked\n"
-    "and its content mirrored under DIR; files of other extensions in a folder\n"
-    "are skipped. Every file is converted as if it were the first in a fresh\n"
-    "process, so the results don't depend on the order of the files or on -j.\n"
+    "gives DIR/FILE.xml (a.orvmat gives a.orvmat.xml), and a folder is walked\n"
+    "and its content mirrored under DIR; with several folders, each one under\n"
+    "DIR/<its own name>, as cp -r does. Files of other extensions in a folder\n"
+    "are skipped. Two inputs that would write one output are a usage error.\n"
+    "Every file is converted as if it were the first in a fresh process, so\n"
+    "the results don't depend on the order of the files or on -j.\n"
     "\n"
     "  -o, --output=DIR   write one .xml file per input under DIR\n"
     "  -j, --jobs=N       convert N files at a time (default: one per core)\n"
+    "      --update       with -o, convert only files whose output is missing or\n"
+    "                     older than the file; count the rest as up to date\n"
     "      --explain      print one line per file: a document with its size, or\n"
     "                     why the file fell back to text\n"
     "      --report=FILE  write JSON Lines to FILE, one object per file: path,\n"
@@ -38,14 +42,17 @@ const char kUsage[] =
     "  -h, --help         show this help and exit\n"
     "      --version      show the version and exit\n"
     "\n"
-    "Progress goes to standard error while it is a terminal; a summary line\n"
-    "(converted, fell back to text, unreadable, and outputs not written) ends\n"
-    "every run. A file that can't be read gets no output file.\n"
+    "While standard error is a terminal, one line there shows the progress:\n"
+    "the files found while folders are walked, then the files done of those,\n"
+    "the rate and the time left. A summary line (converted, fell back to\n"
+    "text, unreadable, outputs not written, and with --update up to date)\n"
+    "ends every run. A file that can't be read gets no output file.\n"
     "\n"
     "Ctrl-C, SIGINT, SIGTERM and SIGHUP stop the run between two files: the\n"
-    "outputs written so far stay, and no partial file is left. An output that\n"
-    "finds no space left on its disk stops the run too: no further file is\n"
-    "converted.\n"
+    "outputs written so far stay, and no partial file is left (a run that is\n"
+    "killed may leave some: the next run into DIR removes them). --update\n"
+    "then finishes the job. An output that finds no space left on its disk\n"
+    "stops the run too: no further file is converted.\n"
     "\n"
     "Exit status:\n"
     "  0        every file became a document\n"
@@ -117,6 +124,8 @@ Parsed parseArgs(const std::vector<std::string>& args, Settings& s, std::string&
             s.quiet = true;
         } else if (name == "--explain") {
             s.explain = true;
+        } else if (name == "--update") {
+            s.update = true;
         } else if (name == "-o" || name == "--output") {
             if (value.empty()) {
                 error = "the output folder is empty";
@@ -147,6 +156,10 @@ Parsed parseArgs(const std::vector<std::string>& args, Settings& s, std::string&
     }
     if (s.paths.empty()) {
         error = "no file given";
+        return Parsed::UsageError;
+    }
+    if (s.update && s.outDir.empty()) {
+        error = "--update needs -o DIR";
         return Parsed::UsageError;
     }
     if (s.outDir.empty() && !s.explain && s.paths.size() > 1) {

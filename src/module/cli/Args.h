@@ -12,6 +12,7 @@ struct Settings {
     unsigned jobs = 0;       // 0: one per core
     bool explain = false;
     bool quiet = false;
+    bool update = false;         // --update: files whose output is newer are left as they are
     bool writeFallbacks = true;  // --fallbacks skip: a file that falls back to text gets no output
 };
 

@@ -3,6 +3,7 @@
 #include <cerrno>
 #include <chrono>
 #include <cstring>
+#include <set>
 
 #include "module/cli/Workers.h"
 #include "platform/Interrupt.h"
@@ -16,6 +17,53 @@ using OrvaneLumoCore::FileStatus;
 std::string toUtf8(const std::u16string& text) { return platform::encodeUtf8(text.data(), text.size()); }
 
 std::string partPath(const std::string& path, unsigned long pid) { return path + ".part" + std::to_string(pid); }
+
+std::string folderOf(const std::string& path) {
+    const std::size_t slash = path.find_last_of(platform::kPathSeparators);
+    return slash == std::string::npos ? std::string(".") : path.substr(0, slash);
+}
+
+int makeFolders(const std::string& dir) {
+    int error = 0;
+    if (platform::pathKind(dir, error) == platform::PathKind::Folder) return 0;
+    error = platform::makeFolder(dir);
+    if (error == ENOENT) {
+        const std::size_t end = dir.find_last_not_of(platform::kPathSeparators);
+        const std::size_t at = end == std::string::npos ? end : dir.find_last_of(platform::kPathSeparators, end);
+        if (at != std::string::npos && at > 0 && makeFolders(dir.substr(0, at)) == 0)
+            error = platform::makeFolder(dir);
+    }
+    // Another worker made it first, something else has that name, or a
+    // link leads nowhere.
+    if (error == EEXIST) {
+        int why = 0;
+        const platform::PathKind kind = platform::pathKind(dir, why);
+        if (kind == platform::PathKind::Folder) return 0;
+        if (kind == platform::PathKind::Missing) return why;
+    }
+    return error;
+}
+
+bool isPartName(const std::string& name) {
+    static const std::string kPart = ".xml.part";
+    const std::size_t digits = name.find_last_not_of("0123456789") + 1;
+    return digits < name.size() && digits > kPart.size() &&
+           name.compare(digits - kPart.size(), kPart.size(), kPart) == 0;
+}
+
+void removeLeftParts(const std::vector<Job>& jobs) {
+    std::set<std::string> folders;
+    for (const Job& job : jobs) {
+        // The output's folder with its separator: the part files' names go behind it.
+        const std::string folder = job.output.substr(0, job.output.find_last_of(platform::kPathSeparators) + 1);
+        if (job.output.empty() || !folders.insert(folder).second) continue;
+        std::vector<platform::FolderEntry> entries;
+        if (platform::listFolder(folder.empty() ? std::string(".") : folder, entries) != 0) continue;
+        for (const platform::FolderEntry& entry : entries)
+            if (entry.kind == platform::FolderEntry::Other && isPartName(entry.name))
+                platform::removeFile(folder + entry.name);
+    }
+}
 
 namespace {
 
@@ -37,6 +85,9 @@ std::uint64_t codePoints(const std::u16string& text) {
 int writeFile(const std::string& path, const std::string& bytes) {
     const std::string part = partPath(path, platform::processId());
     int error = platform::writeNewFile(part, bytes);
+    // Folders are made as their first output is written, so that files
+    // that give none leave no empty folder behind.
+    if (error == ENOENT && makeFolders(folderOf(path)) == 0) error = platform::writeNewFile(part, bytes);
     if (error == 0 && (error = platform::replaceFile(part, path)) != 0) platform::removeFile(part);
     return error;
 }
@@ -50,6 +101,13 @@ int writeStream(std::FILE* out, const std::string& bytes) {
 }
 
 }  // namespace
+
+FileResult upToDate() {
+    FileResult r;
+    r.upToDate = true;
+    r.line = "up to date";
+    return r;
+}
 
 bool stopsTheRun(const FileResult& result) { return platform::isNoSpace(result.writeErrno); }
 

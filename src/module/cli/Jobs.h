@@ -22,7 +22,11 @@ struct FileResult {
     std::string reason;      // why the file isn't a document; empty for one
     std::string writeError;  // why the output couldn't be written; empty if it was
     int writeErrno = 0;      // the errno of that failure
+    bool upToDate = false;   // not converted: its output was newer (--update)
 };
+
+// The result of a job that --update finds up to date.
+FileResult upToDate();
 
 // Converts one job in this process: the output file gets the text as UTF-8,
 // or, if the job has none and `textOut` is given, the text goes there.
@@ -47,6 +51,21 @@ void runJobs(const std::vector<Job>& jobs, unsigned workers, const ResultSink& s
 // hidden worker argument first serves its parent's jobs: then this returns
 // true with the exit status. Elsewhere it returns false.
 bool runAsWorker(const std::vector<std::string>& args, int& status);
+
+// The folder part of `path`; "." for a bare name.
+std::string folderOf(const std::string& path);
+
+// Creates `dir` and the folders above it that are missing. Returns 0, or
+// the errno of the failure.
+int makeFolders(const std::string& dir);
+
+// Whether `name` is that of a part file that the outputs are written
+// through ("a.orvmat.xml.part1234").
+bool isPartName(const std::string& name);
+
+// Removes the part files that an earlier run, stopped for good (killed, or
+// the machine went down), left in the folders that these jobs write to.
+void removeLeftParts(const std::vector<Job>& jobs);
 
 // The text as UTF-8; a lone surrogate becomes U+FFFD.
 std::string toUtf8(const std::u16string& text);

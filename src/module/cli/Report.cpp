@@ -55,29 +55,31 @@ std::string jsonLine(const Job& job, const FileResult& r) {
     std::snprintf(ms, sizeof ms, "%.3f", r.milliseconds);
     return "{\"path\": " + jsonString(job.source) + ", \"kind\": " +
            (job.hasKind ? (job.kind == FileKind::Materials ? "\"materials\"" : "\"options\"") : "null") +
-           ", \"status\": \"" + statusWord(r.status) + "\", \"reason\": " +
+           ", \"status\": \"" + (r.upToDate ? "up to date" : statusWord(r.status)) + "\", \"reason\": " +
            (reason.empty() ? std::string("null") : jsonString(reason)) +
            ", \"characters\": " + std::to_string(r.characters) + ", \"milliseconds\": " + ms + "}";
 }
 
-Collector::Collector(const std::vector<Job>& jobs, bool explain, bool quiet, platform::Terminal progress,
-                     std::FILE* report)
+Collector::Collector(const std::vector<Job>& jobs, bool explain, bool quiet, Progress& progress,
+                     std::FILE* report, bool update)
     : jobs_(jobs),
       explain_(explain),
       quiet_(quiet),
-      progress_(quiet ? platform::Terminal::None : progress),
+      update_(update),
+      progress_(progress),
       report_(report),
       results_(jobs.size()),
       arrived_(jobs.size(), false),
-      start_(std::chrono::steady_clock::now()),
-      lastProgress_(start_) {}
+      start_(std::chrono::steady_clock::now()) {}
 
 bool Collector::add(std::size_t index, const FileResult& result) {
     if (index >= results_.size() || arrived_[index]) return noSpace_ == 0;
     results_[index] = result;
     arrived_[index] = true;
     ++done_;
-    if (!result.writeError.empty()) {
+    if (result.upToDate) {
+        ++upToDate_;
+    } else if (!result.writeError.empty()) {
         ++notWritten_;
         if (!noSpace_ && stopsTheRun(result)) noSpace_ = result.writeErrno;
     } else {
@@ -92,55 +94,24 @@ bool Collector::add(std::size_t index, const FileResult& result) {
         results_[next_] = FileResult();  // its text is no longer needed
         ++next_;
     }
-    showProgress(false);
+    progress_.converting(done_, jobs_.size(), done_ - upToDate_,
+                         std::chrono::duration<double>(std::chrono::steady_clock::now() - start_).count());
     return noSpace_ == 0;
 }
 
 void Collector::emit(std::size_t index) {
     const Job& job = jobs_[index];
     const FileResult& r = results_[index];
-    const bool error = r.status == FileStatus::Unreadable || !r.writeError.empty();
-    if (error || explain_) clearProgress();
+    const bool unreadable = r.status == FileStatus::Unreadable && !r.upToDate;
+    if (unreadable || !r.writeError.empty() || explain_) progress_.clear();
     if (explain_ && std::printf("%s: %s\n", job.source.c_str(), r.line.c_str()) < 0 && !stdoutError_) {
         stdoutError_ = errno ? errno : EIO;
         if (platform::isNoSpace(stdoutError_) && !noSpace_) noSpace_ = stdoutError_;
     }
-    if (r.status == FileStatus::Unreadable)
+    if (unreadable)
         std::fprintf(stderr, "orvxml: %s: %s\n", job.source.c_str(), r.reason.c_str());
     if (!r.writeError.empty()) std::fprintf(stderr, "orvxml: can't write %s\n", r.writeError.c_str());
     if (report_) std::fprintf(report_, "%s\n", jsonLine(job, r).c_str());
-}
-
-void Collector::showProgress(bool force) {
-    if (progress_ == platform::Terminal::None) return;
-    const auto now = std::chrono::steady_clock::now();
-    // The first file shows the line at once, then it changes ten times a second.
-    if (!force && done_ > 1 && now - lastProgress_ < std::chrono::milliseconds(100)) return;
-    lastProgress_ = now;
-    const double seconds = std::chrono::duration<double>(now - start_).count();
-    char line[128];
-    std::snprintf(line, sizeof line, "orvxml: %zu of %zu files, %.0f files/s", done_, jobs_.size(),
-                  seconds > 0 ? done_ / seconds : 0.0);
-    showLine(line);
-    std::fflush(stderr);
-}
-
-void Collector::clearProgress() {
-    if (!progressShown_) return;
-    showLine(std::string());
-}
-
-// Replaces the progress line: erased to its end, or where the terminal
-// can't do that, written over with spaces.
-void Collector::showLine(const std::string& line) {
-    if (progress_ == platform::Terminal::Escapes) {
-        std::fprintf(stderr, "\r\033[K%s", line.c_str());
-    } else {
-        const std::size_t pad = progressShown_ > line.size() ? progressShown_ - line.size() : 0;
-        std::fprintf(stderr, "\r%s%s", line.c_str(), std::string(pad, ' ').c_str());
-        if (line.empty()) std::fputc('\r', stderr);
-    }
-    progressShown_ = line.size();
 }
 
 int Collector::finish(int interruption) {
@@ -149,7 +120,7 @@ int Collector::finish(int interruption) {
         if (arrived_[i]) emit(i);
     errno = 0;
     if (std::fflush(stdout) != 0 && !stdoutError_) stdoutError_ = errno ? errno : EIO;
-    clearProgress();
+    progress_.clear();
     if (stdoutError_)
         std::fprintf(stderr, "orvxml: can't write standard output: %s\n", std::strerror(stdoutError_));
     if (!quiet_) {
@@ -158,6 +129,7 @@ int Collector::finish(int interruption) {
         std::fprintf(stderr, "orvxml: %zu converted, %zu fell back to text, %zu unreadable", documents_,
                      texts_, unreadable_);
         if (notWritten_) std::fprintf(stderr, ", %zu not written", notWritten_);
+        if (update_) std::fprintf(stderr, ", %zu up to date", upToDate_);
         std::fprintf(stderr, " (%.2f s)\n", seconds);
     }
     if (interruption) {

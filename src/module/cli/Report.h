@@ -8,11 +8,12 @@
 #include <vector>
 
 #include "module/cli/Jobs.h"
-#include "platform/System.h"
+#include "module/cli/Progress.h"
 
 namespace orvxml {
 
-// One JSON object on one line: path, kind, status, reason, characters,
+// One JSON object on one line: path, kind, status ("document", "text",
+// "unreadable", or with --update "up to date"), reason, characters,
 // milliseconds.
 std::string jsonLine(const Job& job, const FileResult& result);
 
@@ -21,10 +22,10 @@ std::string jsonLine(const Job& job, const FileResult& result);
 // the number of workers.
 class Collector {
 public:
-    // `progress`: the terminal that standard error shows on, if any, which
-    // gets the progress line.
-    Collector(const std::vector<Job>& jobs, bool explain, bool quiet, platform::Terminal progress,
-              std::FILE* report);
+    // `progress`: the line on standard error's terminal, if there is one.
+    // `update`: the summary counts the files that were up to date.
+    Collector(const std::vector<Job>& jobs, bool explain, bool quiet, Progress& progress, std::FILE* report,
+              bool update);
     // Returns false once the run is to stop: an output found no space.
     bool add(std::size_t index, const FileResult& result);
     // Ends the progress line, prints the summary; returns the exit status:
@@ -36,23 +37,19 @@ public:
 
 private:
     void emit(std::size_t index);
-    void showProgress(bool force);
-    void clearProgress();
-    void showLine(const std::string& line);
 
     const std::vector<Job>& jobs_;
-    const bool explain_, quiet_;
-    const platform::Terminal progress_;
+    const bool explain_, quiet_, update_;
+    Progress& progress_;
     std::FILE* report_;
     std::vector<FileResult> results_;
     std::vector<bool> arrived_;
     std::size_t next_ = 0, done_ = 0;
     // Each result counts once: not written if its output failed, else by its status.
-    std::size_t documents_ = 0, texts_ = 0, unreadable_ = 0, notWritten_ = 0;
+    std::size_t documents_ = 0, texts_ = 0, unreadable_ = 0, notWritten_ = 0, upToDate_ = 0;
     int noSpace_ = 0;      // the errno of the write that stopped the run, or 0
     int stdoutError_ = 0;  // the errno of the first failed --explain line, or 0
-    std::size_t progressShown_ = 0;  // the length of the line on the terminal
-    std::chrono::steady_clock::time_point start_, lastProgress_;
+    std::chrono::steady_clock::time_point start_;
 };
 
 }  // namespace orvxml

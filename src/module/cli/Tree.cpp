@@ -2,7 +2,7 @@
 
 #include <algorithm>
 #include <cstring>
-#include <set>
+#include <map>
 
 #include "platform/System.h"
 #include "platform/Text.h"
@@ -69,7 +69,7 @@ std::string sameFileKey(const std::string& path) {
 // extensions become jobs, other files are skipped, subfolders are walked;
 // links to folders are not followed, so a loop of links can't trap the walk.
 void walk(const std::string& dir, const std::string& rel, const std::string& outDir,
-          std::vector<Job>& jobs) {
+          std::vector<Job>& jobs, const std::function<void(std::size_t)>& found) {
     std::vector<platform::FolderEntry> entries;
     if (const int error = platform::listFolder(dir, entries)) {
         Job job = makeJob(dir, std::string());
@@ -83,49 +83,94 @@ void walk(const std::string& dir, const std::string& rel, const std::string& out
         const std::string path = joinPath(dir, entry.name);
         const std::string relPath = rel.empty() ? entry.name : rel + separatorOf(outDir) + entry.name;
         if (entry.kind == platform::FolderEntry::Folder) {
-            walk(path, relPath, outDir, jobs);
+            walk(path, relPath, outDir, jobs, found);
             continue;
         }
         if (entry.kind == platform::FolderEntry::LinkToFolder) continue;
         Job job = makeJob(path, outDir.empty() ? std::string() : joinPath(outDir, relPath + ".xml"));
-        if (job.hasKind) jobs.push_back(job);
+        if (!job.hasKind) continue;
+        jobs.push_back(job);
+        if (found) found(jobs.size());
     }
+}
+
+// The name a folder argument is mirrored under when there are several: its
+// last step, or for "." and ".." (and "lib/.") the name the folder really
+// has. A root has none: its content goes right under the output folder.
+std::string ownName(const std::string& dir) {
+    std::string name = baseName(dir);
+    if (name == "." || name == ".." || name.empty() || isSeparator(name[0]) || name.back() == ':')
+        name = baseName(platform::fullPath(dir));
+    if (name == "." || name == ".." || name.empty() || isSeparator(name[0]) || name.back() == ':')
+        return std::string();
+    return name;
 }
 
 }  // namespace
 
 bool collectJobs(const std::vector<std::string>& paths, const std::string& outDir, bool walkFolders,
-                 std::vector<Job>& jobs, std::string& error) {
+                 std::vector<Job>& jobs, std::string& error, const std::function<void(std::size_t)>& found) {
+    std::vector<platform::PathKind> kinds;
+    std::vector<int> openErrors;
+    std::size_t folders = 0;
     for (const std::string& path : paths) {
         int openError = 0;
-        const platform::PathKind pathKind = platform::pathKind(path, openError);
-        const bool exists = pathKind != platform::PathKind::Missing;
-        if (pathKind == platform::PathKind::Folder) {
+        kinds.push_back(platform::pathKind(path, openError));
+        openErrors.push_back(openError);
+        if (kinds.back() == platform::PathKind::Folder) ++folders;
+    }
+    for (std::size_t i = 0; i < paths.size(); ++i) {
+        const std::string& path = paths[i];
+        if (kinds[i] == platform::PathKind::Folder) {
             if (!walkFolders) {
                 error = path + " is a folder: give -o DIR to convert a tree";
                 return false;
             }
-            walk(path, std::string(), outDir, jobs);
+            walk(path, folders > 1 ? ownName(path) : std::string(), outDir, jobs, found);
             continue;
         }
         Job job = makeJob(path, outDir.empty() ? std::string() : joinPath(outDir, baseName(path) + ".xml"));
         if (!job.hasKind) {
-            job.refusal = exists ? "not a .orvmat, .lumat, .orvopt or .luopt file"
-                                 : std::string("can't be opened: ") + std::strerror(openError);
+            job.refusal = kinds[i] != platform::PathKind::Missing
+                              ? "not a .orvmat, .lumat, .orvopt or .luopt file"
+                              : std::string("can't be opened: ") + std::strerror(openErrors[i]);
             job.output.clear();
         }
         jobs.push_back(job);
+        if (found) found(jobs.size());
     }
-    // Two inputs must not write one output.
-    std::set<std::string> outputs;
+    // Two inputs must not write one output; the same path given twice is
+    // converted once.
+    std::map<std::string, std::size_t> writers;
+    std::vector<Job> unique;
     for (Job& job : jobs) {
-        if (job.output.empty() || !job.refusal.empty()) continue;
-        if (!outputs.insert(sameFileKey(job.output)).second) {
-            job.refusal = "its output " + job.output + " is written for an earlier file";
-            job.output.clear();
+        if (job.output.empty() || !job.refusal.empty()) {
+            unique.push_back(job);
+            continue;
+        }
+        const auto at = writers.emplace(sameFileKey(job.output), unique.size());
+        if (at.second) {
+            unique.push_back(job);
+        } else if (unique[at.first->second].source != job.source) {
+            error = unique[at.first->second].source + " and " + job.source + " would both be written to " +
+                    job.output;
+            return false;
         }
     }
+    jobs.swap(unique);
     return true;
+}
+
+std::size_t markUpToDate(std::vector<Job>& jobs) {
+    std::size_t n = 0;
+    for (Job& job : jobs) {
+        long long input = 0, output = 0;
+        if (job.output.empty() || !job.refusal.empty()) continue;
+        job.upToDate = platform::modificationTime(job.output, output) &&
+                       platform::modificationTime(job.source, input) && output >= input;
+        n += job.upToDate;
+    }
+    return n;
 }
 
 }  // namespace orvxml

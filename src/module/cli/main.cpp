@@ -11,6 +11,7 @@
 
 #include "module/cli/Args.h"
 #include "module/cli/Jobs.h"
+#include "module/cli/Progress.h"
 #include "module/cli/Report.h"
 #include "module/cli/Tree.h"
 #include "platform/Interrupt.h"
@@ -32,35 +33,6 @@ int runError(const std::string& message, int error) {
     return 3;
 }
 
-bool isFolder(const std::string& path, int& error) { return platform::pathKind(path, error) == PathKind::Folder; }
-
-// Creates `dir` and the folders above it that are missing. Returns 0, or
-// the errno of the failure.
-int makeFolders(const std::string& dir) {
-    int error = 0;
-    if (isFolder(dir, error)) return 0;
-    error = platform::makeFolder(dir);
-    if (error == ENOENT) {
-        const std::size_t end = dir.find_last_not_of(platform::kPathSeparators);
-        const std::size_t at = end == std::string::npos ? end : dir.find_last_of(platform::kPathSeparators, end);
-        if (at != std::string::npos && at > 0 && makeFolders(dir.substr(0, at)) == 0)
-            error = platform::makeFolder(dir);
-    }
-    // Something else of that name, or a link that leads nowhere.
-    if (error == EEXIST) {
-        int why = 0;
-        const PathKind kind = platform::pathKind(dir, why);
-        if (kind == PathKind::Folder) return 0;
-        if (kind == PathKind::Missing) return why;
-    }
-    return error;
-}
-
-std::string folderOf(const std::string& path) {
-    const std::size_t slash = path.find_last_of(platform::kPathSeparators);
-    return slash == std::string::npos ? std::string(".") : path.substr(0, slash);
-}
-
 }  // namespace
 
 int runProgram(const std::vector<std::string>& args) {
@@ -79,36 +51,53 @@ int runProgram(const std::vector<std::string>& args) {
     }
 
     const bool toStdout = settings.outDir.empty() && !settings.explain;
+    // A lone file on standard output needs no progress line.
+    Progress progress(toStdout || settings.quiet ? platform::Terminal::None : platform::errorTerminal());
     std::vector<Job> jobs;
-    if (!collectJobs(settings.paths, settings.outDir, !toStdout, jobs, error)) return usageError(error);
+    if (!collectJobs(settings.paths, settings.outDir, !toStdout, jobs, error,
+                     [&](std::size_t found) { progress.walking(found); })) {
+        progress.clear();
+        return usageError(error);
+    }
     for (Job& job : jobs) job.writeText = settings.writeFallbacks;
+    if (settings.update) markUpToDate(jobs);
 
     if (!settings.outDir.empty()) {
-        if (const int e = makeFolders(settings.outDir))
+        if (const int e = makeFolders(settings.outDir)) {
+            progress.clear();
             return runError("can't create the folder " + settings.outDir, e);
-        std::set<std::string> made;
-        for (const Job& job : jobs) {
-            if (job.output.empty()) continue;
-            const std::string folder = folderOf(job.output);
-            if (made.insert(folder).second) makeFolders(folder);  // a failure shows at the write
         }
+        removeLeftParts(jobs);
     }
     std::FILE* report = nullptr;
     if (!settings.reportPath.empty()) {
         report = platform::openOutputFile(settings.reportPath);
-        if (!report) return runError("can't write the report " + settings.reportPath, errno);
+        if (!report) {
+            progress.clear();
+            return runError("can't write the report " + settings.reportPath, errno);
+        }
     }
 
-    // A lone file on standard output needs no progress line.
-    const platform::Terminal progress = toStdout ? platform::Terminal::None : platform::errorTerminal();
-    Collector collector(jobs, settings.explain, settings.quiet, progress, report);
+    Collector collector(jobs, settings.explain, settings.quiet, progress, report, settings.update);
     if (toStdout) {
         for (std::size_t i = 0; i < jobs.size() && !platform::interruption(); ++i)
             if (!collector.add(i, runJob(jobs[i], stdout))) break;
     } else {
+        // Jobs that are up to date have their result at once; the others
+        // are converted, and their results go back under their own index.
+        std::vector<Job> todo;
+        std::vector<std::size_t> where;
+        for (std::size_t i = 0; i < jobs.size(); ++i) {
+            if (jobs[i].upToDate) {
+                collector.add(i, upToDate());
+            } else {
+                todo.push_back(jobs[i]);
+                where.push_back(i);
+            }
+        }
         unsigned workers = settings.jobs;
         if (workers == 0) workers = std::max(1u, std::thread::hardware_concurrency());
-        runJobs(jobs, workers, [&](std::size_t i, const FileResult& r) { return collector.add(i, r); });
+        runJobs(todo, workers, [&](std::size_t k, const FileResult& r) { return collector.add(where[k], r); });
     }
     status = collector.finish(platform::interruption());
     if (report && std::fclose(report) != 0) {
