@@ -41,6 +41,18 @@ public:
     // Name of a render channel number (100 to 133), or null for another number.
     static const char16_t* channelName(std::int32_t channel);
 
+    // A parameter of the document that holds a file path or a texture: its
+    // block's name, its own name and the field (one of the two pointers is
+    // set). The pointers are into this object.
+    struct DocumentField {
+        const char16_t* block;
+        const char* parameter;
+        const std::u16string* path;
+        const TexturePtr* texture;
+    };
+    // Every such parameter, in document order.
+    std::vector<DocumentField> pathAndTextureFields() const;
+
     OrvaneParams params;
     OrvaneFrameData frameData;
     OrvaneLFBStampInfo stampInfo;

@@ -6,6 +6,7 @@
 #include <cstddef>
 #include <cstdint>
 #include <string>
+#include <vector>
 
 #include <boost/any.hpp>
 
@@ -506,6 +507,20 @@ void writeBlock(AssetXmlWriter& w, const AllOptions& o, const Block& b, const st
 }  // namespace
 
 std::size_t AllOptions::documentBlockCount() { return sizeof kBlocks / sizeof kBlocks[0]; }
+
+std::vector<AllOptions::DocumentField> AllOptions::pathAndTextureFields() const {
+    std::vector<DocumentField> fields;
+    for (const Block& b : kBlocks) {
+        for (const ParamRow<D>& row : b) {
+            if (row.field.part) continue;  // a field of params, frame data or camera: no paths there
+            if (row.field.kind() == FieldRef<D>::Kind::Path)
+                fields.push_back({b.name, row.name, &row.field.get<std::u16string>(*this), nullptr});
+            else if (isTexture(row))
+                fields.push_back({b.name, row.name, nullptr, &row.field.get<TexturePtr>(*this)});
+        }
+    }
+    return fields;
+}
 
 void AllOptions::writeXml(AssetXmlWriter& writer, std::u16string url) {
     const std::u16string assetType = getAssetType();
