@@ -4,6 +4,7 @@
 #include <cstring>
 #include <map>
 
+#include "platform/Interrupt.h"
 #include "platform/System.h"
 #include "platform/Text.h"
 
@@ -80,6 +81,7 @@ void walk(const std::string& dir, const std::string& rel, const std::string& out
     std::sort(entries.begin(), entries.end(),
               [](const platform::FolderEntry& a, const platform::FolderEntry& b) { return a.name < b.name; });
     for (const platform::FolderEntry& entry : entries) {
+        if (platform::interruption()) return;  // the run ends with what was found
         const std::string path = joinPath(dir, entry.name);
         const std::string relPath = rel.empty() ? entry.name : rel + separatorOf(outDir) + entry.name;
         if (entry.kind == platform::FolderEntry::Folder) {
