@@ -355,11 +355,11 @@ std::string fileNameOf(const std::string& p) {
     return p.substr(start);
 }
 
+// `relative` in `folder`, its "\" made "/" (which Windows takes as well).
 std::string joined(const std::string& folder, const std::string& relative) {
     std::string tail = relative;
-    if (!kBackslashSeparates)
-        for (char& c : tail)
-            if (c == '\\') c = '/';
+    for (char& c : tail)
+        if (c == '\\') c = '/';
     if (folder.empty()) return tail;
     return isSlash(folder.back()) ? folder + tail : folder + "/" + tail;
 }
@@ -387,40 +387,45 @@ bool findIn(const std::string& name, PathUse use, const std::string& libraryFold
 
 // ---- text ----------------------------------------------------------------------------
 
-const char kHex[] = "0123456789abcdef";
+// A byte as `prefix` and two hex digits.
+std::string hexEscape(const char* prefix, unsigned char byte) {
+    static const char kHex[] = "0123456789abcdef";
+    return std::string(prefix) + kHex[byte >> 4] + kHex[byte & 15];
+}
+
+bool isControl(unsigned char byte) { return byte < 0x20 || byte == 0x7F; }
 
 // UTF-8 for a text line: control characters as \xNN, so one entry stays on
 // one line.
 std::string lineText(const std::string& text) {
     std::string out;
     for (const char c : text) {
-        const unsigned char u = static_cast<unsigned char>(c);
-        if (u < 0x20 || u == 0x7F) {
-            out += "\\x";
-            out += kHex[u >> 4];
-            out += kHex[u & 15];
-        } else {
+        const unsigned char byte = static_cast<unsigned char>(c);
+        if (isControl(byte))
+            out += hexEscape("\\x", byte);
+        else
             out += c;
-        }
     }
     return out;
 }
 std::string lineText(const std::u16string& text) { return lineText(utf8(text)); }
 
-// A JSON string of UTF-8 text.
+// A JSON string of UTF-8 text: the short escapes where JSON has them, \u00NN
+// for the other control characters.
 std::string jsonText(const std::string& text) {
     std::string out = "\"";
     for (const char c : text) {
-        const unsigned char u = static_cast<unsigned char>(c);
-        if (c == '"' || c == '\\') {
-            out += '\\';
-            out += c;
-        } else if (u < 0x20) {
-            out += "\\u00";
-            out += kHex[u >> 4];
-            out += kHex[u & 15];
-        } else {
-            out += c;
+        switch (c) {
+        case '"': out += "\\\""; break;
+        case '\\': out += "\\\\"; break;
+        case '\n': out += "\\n"; break;
+        case '\r': out += "\\r"; break;
+        case '\t': out += "\\t"; break;
+        default:
+            if (static_cast<unsigned char>(c) < 0x20)
+                out += hexEscape("\\u00", static_cast<unsigned char>(c));
+            else
+                out += c;
         }
     }
     return out + "\"";

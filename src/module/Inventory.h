@@ -108,7 +108,8 @@ void collectOptionsReferences(const AllOptions& options, std::vector<FileReferen
 // an absolute path that isn't there (a Windows path always) by its file name
 // in those folders. "\" separates folders in a stored path on every system.
 // A Folder reference must name a folder, any other a file that isn't one.
-// Returns the first path that exists, as tried, in `found`.
+// Returns the first path that exists in `found`, as tried (the stored path's
+// "\" written as "/").
 bool resolveReference(const std::u16string& stored, PathUse use, const std::string& libraryFolder,
                       const std::vector<std::string>& searchFolders, std::string& found);
 
@@ -143,7 +144,8 @@ std::string referenceLine(const FileReference& reference, FileKind kind);
 std::string referenceJson(const FileReference& reference);
 
 // A JSON string of wide text: quotes, backslashes and control characters
-// escaped, the rest as UTF-8 (a lone surrogate as U+FFFD).
+// escaped (\n, \r, \t, else \u00NN), the rest as UTF-8 (a lone surrogate as
+// U+FFFD).
 std::string jsonText(const std::u16string& text);
 
 }  // namespace OrvaneLumoCore

@@ -3,7 +3,9 @@
 #include <gtest/gtest.h>
 
 #include <boost/make_shared.hpp>
+#include <algorithm>
 #include <filesystem>
+#include <functional>
 #include <string>
 #include <vector>
 
@@ -14,6 +16,7 @@
 #include "persistence/OrvMatFile.h"
 #include "persistence/OrvOptFile.h"
 #include "support/TempFiles.h"
+#include "textures/ProceduralTextures.h"
 #include "textures/SkyTexture.h"
 
 using namespace OrvaneLumoCore;
@@ -111,10 +114,15 @@ std::string wholeReferences(const FileReferences& refs) {
     return out;
 }
 
-TEST(InventoryListing, LibraryOfOurOwnGivesEveryMaterialWithItsShape) {
+// The rich library, written by our own code.
+class InventoryRichLibrary : public ::testing::Test {
+protected:
     TempDir dir;
-    const std::string path = saveLibrary(dir, "rich.orvmat", richLibrary());
-    const FileListing listing = listFile(wide(path), FileKind::Materials);
+    const std::u16string path = wide(saveLibrary(dir, "rich.orvmat", richLibrary()));
+};
+
+TEST_F(InventoryRichLibrary, ListingGivesEveryMaterialWithItsShape) {
+    const FileListing listing = listFile(path, FileKind::Materials);
     ASSERT_EQ(listing.status, FileStatus::Document) << listing.reason;
     EXPECT_TRUE(listing.reason.empty());
     ASSERT_EQ(listing.materials.size(), 4u);
@@ -186,8 +194,8 @@ TEST(InventoryListing, TextLinesStayOneLineAndJsonIsEscaped) {
     EXPECT_EQ(listingLine(s), "Tab\\x09here \"quoted\" \\ caf\xc3\xa9 \xef\xbf\xbd\tMaterialLayeredBRDF\tu\\x0a1\t"
                               "0 textures\tMaterialLayeredBRDF");
     EXPECT_EQ(listingJson(s),
-              "{\"name\": \"Tab\\u0009here \\\"quoted\\\" \\\\ caf\xc3\xa9 \xef\xbf\xbd\", \"class\": "
-              "\"MaterialLayeredBRDF\", \"uuid\": \"u\\u000a1\", \"textures\": 0, \"shape\": \"MaterialLayeredBRDF\"}");
+              "{\"name\": \"Tab\\there \\\"quoted\\\" \\\\ caf\xc3\xa9 \xef\xbf\xbd\", \"class\": "
+              "\"MaterialLayeredBRDF\", \"uuid\": \"u\\n1\", \"textures\": 0, \"shape\": \"MaterialLayeredBRDF\"}");
 }
 
 // ---- references -----------------------------------------------------------------------
@@ -198,10 +206,8 @@ std::vector<std::u16string> pathsOf(const std::vector<FileReference>& refs) {
     return paths;
 }
 
-TEST(InventoryReferences, EveryBitmapOfALibraryWithItsMaterial) {
-    TempDir dir;
-    const std::string path = saveLibrary(dir, "rich.orvmat", richLibrary());
-    const FileReferences refs = listFileReferences(wide(path), FileKind::Materials);
+TEST_F(InventoryRichLibrary, ReferencesAreEveryBitmapWithItsMaterial) {
+    const FileReferences refs = listFileReferences(path, FileKind::Materials);
     ASSERT_EQ(refs.status, FileStatus::Document) << refs.reason;
     // A material's own slots come before those of the materials inside it.
     const std::vector<std::u16string> expected = {
@@ -215,6 +221,106 @@ TEST(InventoryReferences, EveryBitmapOfALibraryWithItsMaterial) {
         EXPECT_EQ(refs.references[i].use, PathUse::Read) << i;
     }
     testsupport::expectGolden("module/golden/references.txt", wholeReferences(refs));
+}
+
+// A tree with one texture in one slot.
+struct Slot {
+    std::string holder;  // the class whose slot it is
+    std::function<MaterialPtr(const TexturePtr&)> make;
+};
+
+// Each slot of a layer class in a layered material; the other slots are
+// emptied (glossy and mirror layers come with a Fresnel texture).
+template <class L>
+void layerSlots(std::vector<Slot>& out, const char* holder, BrdfPtr (*make)(),
+                std::initializer_list<TexturePtr L::*> all) {
+    const std::vector<TexturePtr L::*> slots(all);
+    for (TexturePtr L::*slot : slots)
+        out.push_back({holder, [=](const TexturePtr& t) {
+                           BrdfPtr l = make();
+                           L& layer = dynamic_cast<L&>(*l);
+                           for (TexturePtr L::*other : slots) (layer.*other).reset();
+                           layer.*slot = t;
+                           return MaterialPtr(layers(u"M", {l}));
+                       }});
+}
+
+// Each slot of a material class.
+template <class M>
+void materialSlots(std::vector<Slot>& out, const char* holder, std::initializer_list<TexturePtr M::*> all) {
+    for (TexturePtr M::*slot : all)
+        out.push_back({holder, [=](const TexturePtr& t) {
+                           boost::shared_ptr<M> m = named<M>(u"M", u"");
+                           (*m).*slot = t;
+                           return MaterialPtr(m);
+                       }});
+}
+
+// Each slot of a texture class, in a single material's diffuse layer.
+template <class T>
+void textureSlots(std::vector<Slot>& out, const char* holder, std::initializer_list<TexturePtr T::*> all) {
+    for (TexturePtr T::*slot : all)
+        out.push_back({holder, [=](const TexturePtr& t) {
+                           boost::shared_ptr<T> texture(new T);
+                           (*texture).*slot = t;
+                           boost::shared_ptr<MaterialSingleBRDF> m = named<MaterialSingleBRDF>(u"M", u"");
+                           m->brdf = diffuseWith(texture);
+                           return MaterialPtr(m);
+                       }});
+}
+
+template <class L>
+BrdfPtr newLayer() {
+    return BrdfPtr(new L);
+}
+
+// Every texture slot of every class that holds one, with a bitmap in it and
+// nothing else: the walk must find exactly that bitmap, below that class.
+TEST(InventoryReferences, EveryTextureSlotIsWalked) {
+    typedef Glass_BRDF G;
+    typedef BaseGlossy_BRDF P;
+    typedef MaterialOverrideEnvironment E;
+    typedef MaterialToon T;
+    std::vector<Slot> slots;
+    layerSlots<G>(slots, "Glass_BRDF", newLayer<G>,
+                  {&G::color_tex, &G::transparency_tex, &G::glossiness_tex, &G::ior_tex, &G::translucency_tex});
+    layerSlots<P>(slots, "Blinn_BRDF", newLayer<Blinn_BRDF>,
+                  {&P::color_tex, &P::transparency_tex, &P::hilightGlossiness_tex, &P::reflectionGlossiness_tex});
+    layerSlots<Mirror_BRDF>(slots, "Mirror_BRDF", newLayer<Mirror_BRDF>,
+                            {&Mirror_BRDF::color_tex, &Mirror_BRDF::transparency_tex});
+    layerSlots<Light_BRDF>(slots, "Light_BRDF", newLayer<Light_BRDF>,
+                           {&Light_BRDF::color_tex, &Light_BRDF::transparency_tex});
+    layerSlots<Diffuse_BRDF>(slots, "Diffuse_BRDF", newLayer<Diffuse_BRDF>,
+                             {&Diffuse_BRDF::color_tex, &Diffuse_BRDF::transparency_tex});
+    materialSlots<Material2Sided>(slots, "Material2Sided",
+                                  {&Material2Sided::translucency_tex, &Material2Sided::transparency_tex});
+    materialSlots<MaterialBump>(slots, "MaterialBump", {&MaterialBump::bump_tex});
+    materialSlots<MaterialDisplaced>(slots, "MaterialDisplaced", {&MaterialDisplaced::displace_tex});
+    materialSlots<MaterialAlphaContribution>(slots, "MaterialAlphaContribution",
+                                             {&MaterialAlphaContribution::alpha_tex});
+    materialSlots<E>(slots, "MaterialOverrideEnvironment", {&E::bg_tex, &E::gi_tex, &E::reflect_tex, &E::refract_tex});
+    materialSlots<T>(slots, "MaterialToon", {&T::lineColorTex, &T::lineWidthTex, &T::opacityTex, &T::distortTex});
+    textureSlots<FresnelTexture>(slots, "FresnelTexture",
+                                 {&FresnelTexture::reflection_tex, &FresnelTexture::refraction_tex,
+                                  &FresnelTexture::fresnel_ior_tex, &FresnelTexture::refract_ior_tex});
+    textureSlots<BlendTexture>(slots, "BlendTexture", {&BlendTexture::color_a, &BlendTexture::color_b});
+    textureSlots<InvertTexture>(slots, "InvertTexture", {&InvertTexture::texture});
+    textureSlots<RampTexture>(slots, "RampTexture", {&RampTexture::colors});
+    textureSlots<GridTexture>(slots, "GridTexture", {&GridTexture::line_color, &GridTexture::fill_color});
+    textureSlots<NoiseTexture>(slots, "NoiseTexture", {&NoiseTexture::color1_tex, &NoiseTexture::color2_tex});
+    textureSlots<CheckerTexture>(slots, "CheckerTexture",
+                                 {&CheckerTexture::white_color, &CheckerTexture::black_color});
+
+    for (const Slot& slot : slots) {
+        SCOPED_TRACE(slot.holder + " slot " + std::to_string(&slot - &slots[0]));
+        std::vector<FileReference> refs;
+        collectMaterialReferences(slot.make(bitmap(u"x.png")), refs);
+        ASSERT_EQ(refs.size(), 1u);
+        EXPECT_TRUE(refs[0].path == u"x.png");
+        const std::string tail = slot.holder + " > BitmapTexture > BitmapBuffer";
+        EXPECT_EQ(refs[0].where.substr(refs[0].where.size() - std::min(tail.size(), refs[0].where.size())), tail);
+    }
+    EXPECT_EQ(slots.size(), 42u);
 }
 
 TEST(InventoryReferences, OldRecordThatStoredABarePathBecomesABitmapReference) {
