@@ -38,7 +38,16 @@ namespace {
 class KeepDocumentSun {
 public:
     KeepDocumentSun() : saved_(*documentSun()) {}
-    ~KeepDocumentSun() { *documentSun() = saved_; }
+    // Also runs while an allocation failure unwinds, so it must not throw:
+    // if memory is too short even to put the sun back, it stays as the
+    // load left it.
+    ~KeepDocumentSun() {
+        try {
+            *documentSun() = saved_;
+        } catch (const std::bad_alloc&) {
+        } catch (const std::length_error&) {
+        }
+    }
     KeepDocumentSun(const KeepDocumentSun&) = delete;
     KeepDocumentSun& operator=(const KeepDocumentSun&) = delete;
 
@@ -52,7 +61,6 @@ private:
 // leaves the note of a failure in `note`.
 template <class Load>
 FileStatus loadFile(const std::u16string& path, std::string& reason, Load load) {
-    KeepDocumentSun keepSun;
     LoadNote note;
     platform::RegularFile file;
     FileStatus status = FileStatus::Unreadable;
@@ -64,6 +72,7 @@ FileStatus loadFile(const std::u16string& path, std::string& reason, Load load) 
     } else {
         bool outOfMemory = false;
         try {
+            KeepDocumentSun keepSun;
             status = load(file, note) ? FileStatus::Document : FileStatus::Text;
         } catch (const std::bad_alloc&) {
             outOfMemory = true;
@@ -124,7 +133,7 @@ std::string classOf(const boost::shared_ptr<T>& object) {
 // A loaded tree is at most kMaxNestingDepth records deep; one built in memory
 // may refer back to itself through a reference's copy, so a walk stops at
 // this depth.
-const int kMaxWalkDepth = 4 * kMaxNestingDepth;
+const int kWalkDepthLimit = 4 * kMaxNestingDepth;
 
 // Visits every object of a tree: materials, layers, textures, bitmaps and
 // lights. It counts the textures and gathers every non-empty path field.
@@ -167,7 +176,7 @@ private:
         ~Step() { walk_.trail_.pop_back(); }
         Step(const Step&) = delete;
         Step& operator=(const Step&) = delete;
-        bool tooDeep() const { return walk_.trail_.size() > static_cast<std::size_t>(kMaxWalkDepth); }
+        bool tooDeep() const { return walk_.trail_.size() > static_cast<std::size_t>(kWalkDepthLimit); }
 
     private:
         TreeWalk& walk_;
@@ -284,7 +293,7 @@ private:
 
 void appendShape(std::string& out, const MaterialPtr& m, int depth) {
     out += classOf(m);
-    if (!m || depth > kMaxWalkDepth) return;
+    if (!m || depth > kWalkDepthLimit) return;
     std::vector<std::string> inner;
     if (const MaterialLayeredBRDF* layered = dynamic_cast<const MaterialLayeredBRDF*>(m.get())) {
         for (const BrdfPtr& l : layered->brdfs) inner.push_back(classOf(l));
@@ -364,7 +373,7 @@ std::string joined(const std::string& folder, const std::string& relative) {
     return isSlash(folder.back()) ? folder + tail : folder + "/" + tail;
 }
 
-bool exists(const std::string& path, PathUse use) {
+bool existsAs(const std::string& path, PathUse use) {
     int error = 0;
     const platform::PathKind kind = platform::pathKind(path, error);
     if (kind == platform::PathKind::Missing) return false;
@@ -377,10 +386,10 @@ bool findIn(const std::string& name, PathUse use, const std::string& libraryFold
             const std::vector<std::string>& searchFolders, std::string& found) {
     if (name.empty()) return false;
     std::string candidate = joined(libraryFolder, name);
-    if (exists(candidate, use)) return found = candidate, true;
+    if (existsAs(candidate, use)) return found = candidate, true;
     for (const std::string& folder : searchFolders) {
         candidate = joined(folder, name);
-        if (exists(candidate, use)) return found = candidate, true;
+        if (existsAs(candidate, use)) return found = candidate, true;
     }
     return false;
 }
@@ -525,7 +534,7 @@ bool resolveReference(const std::u16string& stored, PathUse use, const std::stri
     const std::string path = utf8(stored);
     if (path.empty()) return false;
     const bool absolute = isNativeAbsolute(path) || isWindowsAbsolute(path) || path[0] == '/';
-    if (isNativeAbsolute(path) && exists(path, use)) return found = path, true;
+    if (isNativeAbsolute(path) && existsAs(path, use)) return found = path, true;
     if (!absolute) return findIn(path, use, libraryFolder, searchFolders, found);
     return findIn(fileNameOf(path), use, libraryFolder, searchFolders, found);
 }
