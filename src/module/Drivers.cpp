@@ -19,8 +19,9 @@ void writeFileText(const std::u16string& path, XmlSink& sink) {
 
 }  // namespace
 
-void writeMaterialsDocument(const OrvMatFile& file, XmlSink& sink) {
-    AssetXmlWriter writer(sink);
+std::vector<RemappedPath> writeMaterialsDocument(const OrvMatFile& file, XmlSink& sink,
+                                                 const XmlOptions& xml) {
+    AssetXmlWriter writer(sink, xml);
     writer.openRoot(u"orvmat");
     for (std::size_t i = 0; i < file.getMaterialCount(); ++i) {
         MaterialPtr material;
@@ -28,13 +29,16 @@ void writeMaterialsDocument(const OrvMatFile& file, XmlSink& sink) {
         writeMaterialAssets(writer, material);
     }
     writer.closeRoot();
+    return writer.remappedPaths();
 }
 
-void writeOptionsDocument(AllOptions& options, XmlSink& sink) {
-    AssetXmlWriter writer(sink);
+std::vector<RemappedPath> writeOptionsDocument(AllOptions& options, XmlSink& sink,
+                                               const XmlOptions& xml) {
+    AssetXmlWriter writer(sink, xml);
     writer.openRoot(u"orvopt");
     options.writeXml(writer, std::u16string());
     writer.closeRoot();
+    return writer.remappedPaths();
 }
 
 void writeMaterialDocument(const std::u16string& path, XmlSink& sink) {

@@ -1,5 +1,8 @@
 #pragma once
 #include <string>
+#include <vector>
+
+#include "xml/XmlOptions.h"
 
 class XmlSink;
 
@@ -29,8 +32,12 @@ bool convertOptionsPath(const std::u16string& path, XmlSink& sink);
 void writeMaterialDocument(const std::u16string& path, XmlSink& sink);
 void writeOptionsDocument(const std::u16string& path, XmlSink& sink);
 
-// The document of what is loaded already.
-void writeMaterialsDocument(const OrvMatFile& file, XmlSink& sink);
-void writeOptionsDocument(AllOptions& options, XmlSink& sink);
+// The document of what is loaded already, written with `xml`'s options.
+// Returns the file paths that the options' rules rewrote (see
+// AssetXmlWriter::remappedPaths).
+std::vector<RemappedPath> writeMaterialsDocument(const OrvMatFile& file, XmlSink& sink,
+                                                 const XmlOptions& xml = XmlOptions());
+std::vector<RemappedPath> writeOptionsDocument(AllOptions& options, XmlSink& sink,
+                                               const XmlOptions& xml = XmlOptions());
 
 }  // namespace OrvaneLumoCore

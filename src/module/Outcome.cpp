@@ -10,6 +10,7 @@
 #include "persistence/OrvMatFile.h"
 #include "persistence/OrvOptFile.h"
 #include "platform/File.h"
+#include "xml/XmlSink.h"
 
 namespace OrvaneLumoCore {
 
@@ -29,14 +30,15 @@ bool kindOfPath(const std::u16string& path, FileKind& kind) {
 namespace {
 
 // The load and the text of an open file into `out`; may throw std::bad_alloc.
-void convertOpenFile(const std::u16string& path, FileKind kind, platform::RegularFile& file,
-                     ConversionOutcome& out) {
+void convertOpenFile(const std::u16string& path, FileKind kind, const XmlOptions& xml,
+                     platform::RegularFile& file, ConversionOutcome& out) {
     bool loaded = false;
+    StringSink text(out.text);
     if (kind == FileKind::Materials) {
         OrvMatFile materials;
         loaded = materials.load(file);
         if (loaded) {
-            out.text = materials.documentXml();
+            out.remapped = writeMaterialsDocument(materials, text, xml);
             out.items = materials.getMaterialCount();
         } else {
             out.note = materials.loadNote;
@@ -46,7 +48,7 @@ void convertOpenFile(const std::u16string& path, FileKind kind, platform::Regula
         AllOptions options;
         loaded = container.load(options, file);
         if (loaded) {
-            out.text = OrvOptFile::documentXml(options);
+            out.remapped = writeOptionsDocument(options, text, xml);
             out.items = AllOptions::documentBlockCount();
         } else {
             out.note = container.loadNote;
@@ -63,8 +65,15 @@ void convertOpenFile(const std::u16string& path, FileKind kind, platform::Regula
 }  // namespace
 
 ConversionOutcome convertFile(const std::u16string& path, FileKind kind, SunStart sun) {
+    ConversionOptions options;
+    options.sun = sun;
+    return convertFile(path, kind, options);
+}
+
+ConversionOutcome convertFile(const std::u16string& path, FileKind kind,
+                              const ConversionOptions& options) {
     ConversionOutcome out;
-    if (sun == SunStart::Fresh) resetDocumentSun();
+    if (options.sun == SunStart::Fresh) resetDocumentSun();
     // The file is opened once, as the containers open it; a path that isn't
     // a regular file is never read.
     platform::RegularFile file;
@@ -80,7 +89,7 @@ ConversionOutcome convertFile(const std::u16string& path, FileKind kind, SunStar
     // so the outcome itself can still be made.
     bool outOfMemory = false;
     try {
-        convertOpenFile(path, kind, file, out);
+        convertOpenFile(path, kind, options, file, out);
     } catch (const std::bad_alloc&) {
         outOfMemory = true;
     } catch (const std::length_error&) {

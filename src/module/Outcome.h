@@ -5,8 +5,10 @@
 #include <cstddef>
 #include <cstdint>
 #include <string>
+#include <vector>
 
 #include "persistence/LoadNote.h"
+#include "xml/XmlOptions.h"
 
 namespace OrvaneLumoCore {
 
@@ -28,6 +30,10 @@ struct ConversionOutcome {
     std::size_t items = 0;      // materials, or settings blocks, of a document
     std::uint64_t fileSize = 0;
     LoadNote note;              // why a file took the text road or is unreadable
+    // The file paths of a document that ConversionOptions::pathRules
+    // rewrote: each stored text once with the text written in its place, in
+    // the order of the document. Empty for the text road.
+    std::vector<RemappedPath> remapped;
 };
 
 // Where the document sun starts for a conversion: put back to its start state
@@ -44,6 +50,18 @@ enum class SunStart { Fresh, Carried };
 // empty text and a note of rule OutOfMemory.
 ConversionOutcome convertFile(const std::u16string& path, FileKind kind,
                               SunStart sun = SunStart::Fresh);
+
+// What a conversion may do besides the module's text: the XmlOptions
+// (wellFormed, pathRules) change only the text of a document; the text road
+// stays the file's text.
+struct ConversionOptions : XmlOptions {
+    SunStart sun = SunStart::Fresh;
+};
+
+// The same with options; convertFile(path, kind, sun) is this with the
+// default XmlOptions.
+ConversionOutcome convertFile(const std::u16string& path, FileKind kind,
+                              const ConversionOptions& options);
 
 // One line on an outcome: "document, 3 materials, 12300 bytes" or
 // "text: <why>" or "unreadable: <why>".

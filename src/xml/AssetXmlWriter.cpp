@@ -122,15 +122,80 @@ std::u16string escapeXml(const std::u16string& text, bool normalize) {
     return out;
 }
 
+// ---- well-formed text ----------------------------------------------------------
+
+namespace {
+
+bool isHighSurrogate(char16_t c) { return c >= 0xD800 && c <= 0xDBFF; }
+bool isLowSurrogate(char16_t c) { return c >= 0xDC00 && c <= 0xDFFF; }
+
+// Calls put(text, size) for the text as well-formed XML has it in its place,
+// each run of plain units at once: the marks as entities, every "&" included;
+// a CR (and in an attribute a tab or LF, which a parser would turn into
+// blanks) as a character reference; a unit that XML 1.0 doesn't allow (a C0
+// control, U+FFFE, U+FFFF, a surrogate without its other half) as U+FFFD.
+template <class Put>
+void escapeWellFormedRuns(const char16_t* text, std::size_t size, bool attribute, Put put) {
+    const char16_t* const end = text + size;
+    const char16_t* run = text;
+    for (const char16_t* p = text; p != end; ++p) {
+        const char16_t c = *p;
+        // The bulk of any text: blank to U+D7FF, other than the four marks.
+        if (c >= u' ' && c < 0xD800 && c != u'&' && c != u'<' && c != u'>' && c != u'"') continue;
+        // The unit at p goes out as `escape`, behind the run before it.
+        const auto replace = [&](const char16_t* escape, std::size_t n) {
+            put(run, static_cast<std::size_t>(p - run));
+            put(escape, n);
+            run = p + 1;
+        };
+        switch (c) {
+        case u'&': replace(u"&amp;", 5); break;
+        case u'<': replace(u"&lt;", 4); break;
+        case u'>': replace(u"&gt;", 4); break;
+        case u'"':
+            if (attribute) replace(u"&quot;", 6);
+            break;
+        case u'\t':
+            if (attribute) replace(u"&#9;", 4);
+            break;
+        case u'\n':
+            if (attribute) replace(u"&#10;", 5);
+            break;
+        case u'\r': replace(u"&#13;", 5); break;
+        default:
+            if (c >= 0xE000 && c < 0xFFFE) break;
+            if (isHighSurrogate(c) && p + 1 != end && isLowSurrogate(p[1])) {
+                ++p;  // a pair, part of the run
+                break;
+            }
+            replace(u"\uFFFD", 1);
+            break;
+        }
+    }
+    put(run, static_cast<std::size_t>(end - run));
+}
+
+}  // namespace
+
 // ---- the buffer ----------------------------------------------------------------
 
-AssetXmlWriter::AssetXmlWriter(std::u16string& out)
-    : sink_(ownSink_), writeThrough_(true), pos_(buffer_), end_(buffer_ + kBufferUnits) {
+AssetXmlWriter::AssetXmlWriter(std::u16string& out, const XmlOptions& options)
+    : sink_(ownSink_),
+      writeThrough_(true),
+      wellFormed_(options.wellFormed),
+      pathRules_(options.pathRules),
+      pos_(buffer_),
+      end_(buffer_ + kBufferUnits) {
     ownSink_.out = &out;
 }
 
-AssetXmlWriter::AssetXmlWriter(XmlSink& sink)
-    : sink_(sink), writeThrough_(false), pos_(buffer_), end_(buffer_ + kBufferUnits) {
+AssetXmlWriter::AssetXmlWriter(XmlSink& sink, const XmlOptions& options)
+    : sink_(sink),
+      writeThrough_(false),
+      wellFormed_(options.wellFormed),
+      pathRules_(options.pathRules),
+      pos_(buffer_),
+      end_(buffer_ + kBufferUnits) {
     ownSink_.out = nullptr;
 }
 
@@ -164,15 +229,19 @@ void AssetXmlWriter::putText(const WriterText& text) {
     put(wide.data(), wide.size());
 }
 
-void AssetXmlWriter::putEscaped(const char16_t* text, std::size_t size) {
-    escapeRuns(text, size, true, [this](const char16_t* s, std::size_t n) { put(s, n); });
+void AssetXmlWriter::putEscaped(const char16_t* text, std::size_t size, Place place) {
+    const auto out = [this](const char16_t* s, std::size_t n) { put(s, n); };
+    if (wellFormed_)
+        escapeWellFormedRuns(text, size, place == Place::Attribute, out);
+    else
+        escapeRuns(text, size, true, out);
 }
 
-void AssetXmlWriter::putEscaped(const WriterText& text) {
-    if (text.wide_) return putEscaped(text.wide_, text.size_);
+void AssetXmlWriter::putEscaped(const WriterText& text, Place place) {
+    if (text.wide_) return putEscaped(text.wide_, text.size_, place);
     std::u16string wide;
     text.appendTo(wide);
-    putEscaped(wide.data(), wide.size());
+    putEscaped(wide.data(), wide.size(), place);
 }
 
 namespace {
@@ -237,11 +306,11 @@ void AssetXmlWriter::closeAssets() {
 void AssetXmlWriter::openAsset(const WriterText& url, const WriterText& type, const WriterText& layout) {
     ++indent_;
     line(u"<Asset layout=\"");
-    putText(layout);
+    putPlain(layout, Place::Attribute);
     put(u"\" renderer=\"lumo\" type=\"");
-    putText(type);
+    putPlain(type, Place::Attribute);
     put(u"\" url=\"");
-    putEscaped(url);
+    putEscaped(url, Place::Attribute);
     put(u"\" >\n");
     done();
 }
@@ -257,9 +326,9 @@ void AssetXmlWriter::openPlugin(const WriterText& name, const WriterText& type) 
     line(u"<plugin>\n");
     ++indent_;
     line(u"<lumoplugin name=\"");
-    putText(name);
+    putPlain(name, Place::Attribute);
     put(u"\" type=\"");
-    putText(type);
+    putPlain(type, Place::Attribute);
     put(u"\">\n");
     done();
 }
@@ -293,11 +362,11 @@ void AssetXmlWriter::closeParameters() {
 void AssetXmlWriter::head(Word open, const WriterText& name, Word middle, bool isUserData,
                           const WriterText& label) {
     line(open);
-    putText(name);
+    putPlain(name, Place::Attribute);
     put(middle);
     if (isUserData) put(u" isUserData=\"1\"");
     put(u" label=\"");
-    putText(label.empty() ? name : label);
+    putPlain(label.empty() ? name : label, Place::Attribute);
     put(u"\">\n");
     ++indent_;
 }
@@ -306,17 +375,17 @@ void AssetXmlWriter::openParameter(const WriterText& name, const WriterText& typ
                                    const WriterText& label, const WriterText& listType,
                                    bool isUserData, const WriterText& handler) {
     line(u"<parameter type=\"");
-    putText(type);
+    putPlain(type, Place::Attribute);
     put(u"\" name=\"");
-    putText(name);
+    putPlain(name, Place::Attribute);
     put(u"\" handler=\"");
-    putText(handler);
+    putPlain(handler, Place::Attribute);
     put(u"\" listType=\"");
-    putText(listType);
+    putPlain(listType, Place::Attribute);
     put(u'"');
     if (isUserData) put(u" isUserData=\"1\"");
     put(u" label=\"");
-    putText(label.empty() ? name : label);
+    putPlain(label.empty() ? name : label, Place::Attribute);
     put(u"\">\n");
     ++indent_;
     done();
@@ -409,7 +478,7 @@ void AssetXmlWriter::writeString(const WriterText& name, const WriterText& value
                                  const WriterText& label, bool isUserData) {
     head(u"<parameter type=\"string\" name=\"", name, kPlainMiddle, isUserData, label);
     line(u"<value>");
-    putText(value);
+    putPlain(value, Place::Content);
     inlineEnd();
 }
 
@@ -418,7 +487,13 @@ void AssetXmlWriter::writeFileName(const WriterText& name, const std::u16string&
     head(u"<parameter type=\"string\" name=\"", name,
          u"\" handler=\"FileBrowserHandler\" listType=\"none\"", isUserData, label);
     line(u"<value>");
-    putEscaped(value.data(), value.size());
+    std::u16string remapped;
+    if (!pathRules_.empty() && remapPath(pathRules_, value, remapped)) {
+        if (remappedFrom_.insert(value).second) remapped_.push_back({value, remapped});
+        putEscaped(remapped.data(), remapped.size(), Place::Content);
+    } else {
+        putEscaped(value.data(), value.size(), Place::Content);
+    }
     inlineEnd();
 }
 
@@ -518,7 +593,7 @@ void AssetXmlWriter::writeComponentTransform(const WriterText& name,
 void AssetXmlWriter::writePlugin(const WriterText& name, const WriterText& text, const WriterText& label) {
     head(u"<parameter type=\"plugin\" name=\"", name, kPlainMiddle, false, label);
     line(u"<value>");
-    putText(text);
+    putPlain(text, Place::Content);
     inlineEnd();
 }
 
@@ -569,13 +644,13 @@ void AssetXmlWriter::pluginRef(const WriterText& name, const WriterText& label,
     head(u"<parameter type=\"plugin\" name=\"", name, kPlainMiddle, false, label);
     if (child) {
         line(u"<value>");
-        putEscaped(url.data(), url.size());
+        putEscaped(url.data(), url.size(), Place::Content);
         // The tail is a slot word, plain letters, so escaping the two parts
         // one after the other gives what escaping the whole url gives.
-        if (!urlTail.empty()) putEscaped(urlTail);
+        if (!urlTail.empty()) putEscaped(urlTail, Place::Content);
         if (child != &kUrlItself) {
             put(u'/');
-            put(child->data(), child->size());
+            putPlain(*child, Place::Content);
         }
         put(u"</value>\n");
     }
@@ -607,14 +682,14 @@ void AssetXmlWriter::openList(const WriterText& name, const WriterText& listType
 
 void AssetXmlWriter::writeListEntry(const std::u16string& text) {
     line(u"<entry>");
-    putEscaped(text.data(), text.size());
+    putEscaped(text.data(), text.size(), Place::Content);
     put(u"</entry>\n");
     done();
 }
 
 void AssetXmlWriter::writeStringEntry(const WriterText& text) {
     line(u"<string>\"");
-    putText(text);
+    putPlain(text, Place::Content);
     put(u"\"</string>\n");
     done();
 }

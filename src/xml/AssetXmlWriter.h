@@ -7,11 +7,14 @@
 #include <cstdint>
 #include <cstring>
 #include <map>
+#include <set>
 #include <string>
+#include <vector>
 
 #include <boost/any.hpp>
 
 #include "persistence/Types.h"
+#include "xml/XmlOptions.h"
 #include "xml/XmlSink.h"
 
 namespace OrvaneLumoCore {
@@ -49,10 +52,12 @@ class AssetXmlWriter {
 public:
     // `out` is the result text; it must outlive the writer. The text is
     // appended as each call returns, so `out` is complete between calls.
-    explicit AssetXmlWriter(std::u16string& out);
+    explicit AssetXmlWriter(std::u16string& out,
+                            const OrvaneLumoCore::XmlOptions& options = OrvaneLumoCore::XmlOptions());
     // The text goes to `sink` whenever the buffer is full, at closeRoot and at
     // flush; `sink` must outlive the writer.
-    explicit AssetXmlWriter(XmlSink& sink);
+    explicit AssetXmlWriter(XmlSink& sink,
+                            const OrvaneLumoCore::XmlOptions& options = OrvaneLumoCore::XmlOptions());
     AssetXmlWriter(const AssetXmlWriter&) = delete;
     AssetXmlWriter& operator=(const AssetXmlWriter&) = delete;
 
@@ -61,6 +66,10 @@ public:
 
     // Map from a sun's id to the url of the Asset it was written under.
     std::map<std::u16string, std::u16string> sunRegistry;
+
+    // The file paths that the options' rules rewrote, each stored text once,
+    // in the order of their first appearance.
+    const std::vector<OrvaneLumoCore::RemappedPath>& remappedPaths() const { return remapped_; }
 
     // ---- structure ----
     void openRoot(const WriterText& name);
@@ -171,8 +180,24 @@ private:
         *pos_++ = c;
     }
     void putLong(const char16_t* text, std::size_t size);
-    void putEscaped(const char16_t* text, std::size_t size);
-    void putEscaped(const WriterText& text);
+
+    // Where a text stands: between tags, or in an attribute value in '"'.
+    enum class Place { Content, Attribute };
+    // A text that the long-standing document writes as it stands (names,
+    // labels, string values); in well-formed mode escaped for its place.
+    void putPlain(const WriterText& text, Place place) {
+        if (wellFormed_) return putEscaped(text, place);
+        putText(text);
+    }
+    void putPlain(const std::u16string& text, Place place) {
+        if (wellFormed_) return putEscaped(text.data(), text.size(), place);
+        put(text.data(), text.size());
+    }
+    // A text that the long-standing document escapes, leaving what looks
+    // escaped already alone (urls, file names, list entries); in well-formed
+    // mode escaped for its place, every "&" included.
+    void putEscaped(const char16_t* text, std::size_t size, Place place);
+    void putEscaped(const WriterText& text, Place place);
     // Room for `size` (at most kBufferUnits) units at pos_.
     char16_t* room(std::size_t size) {
         if (static_cast<std::size_t>(end_ - pos_) < size) flushBuffer();
@@ -213,6 +238,10 @@ private:
     OwnString ownSink_;
     XmlSink& sink_;
     const bool writeThrough_;
+    const bool wellFormed_;
+    const OrvaneLumoCore::PathRules pathRules_;
+    std::vector<OrvaneLumoCore::RemappedPath> remapped_;
+    std::set<std::u16string> remappedFrom_;
     int indent_ = 0;
     std::u16string rootName_;
     char16_t* pos_;
