@@ -150,7 +150,7 @@ class Arguments(ScratchTest):
         self.assertEqual(get(path=path, freshSun=True).text, u'<a/>')
         for args, kwargs in (((), {}), ((path.encode('utf-8'),), {}), ((3,), {}), ((None,), {}),
                              ((path, True), {}), ((path, path), {}),
-                             ((path,), {'wellFormed': True}), ((path,), {'fresh': True}),
+                             ((path,), {'wellformed': True}), ((path,), {'fresh': True}),
                              ((path,), {'path': path})):
             self.assertRaises(TypeError, get, *args, **kwargs)
         self.assertRaises(ZeroDivisionError, get, path, freshSun=Truthy(None))

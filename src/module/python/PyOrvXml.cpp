@@ -82,11 +82,13 @@ bool pathArgument(PyObject* args, const Function& f, std::u16string& path) {
 }
 
 // The path and the options of getXmlWithOutcome.
-bool outcomeArguments(PyObject* args, PyObject* keywords, std::u16string& path, PyObject*& freshSun) {
-    static char* names[] = {const_cast<char*>("path"), const_cast<char*>("freshSun"), NULL};
+bool outcomeArguments(PyObject* args, PyObject* keywords, std::u16string& path, PyObject*& freshSun,
+                      PyObject*& wellFormed) {
+    static char* names[] = {const_cast<char*>("path"), const_cast<char*>("freshSun"),
+                            const_cast<char*>("wellFormed"), NULL};
     PyObject* arg = NULL;
-    return PyArg_ParseTupleAndKeywords(args, keywords, "O|$O:getXmlWithOutcome", names, &arg,
-                                       &freshSun) &&
+    return PyArg_ParseTupleAndKeywords(args, keywords, "O|$OO:getXmlWithOutcome", names, &arg,
+                                       &freshSun, &wellFormed) &&
            pathOf(arg, "getXmlWithOutcome", path);
 }
 
@@ -131,15 +133,18 @@ bool pathArgument(PyObject* args, const Function&, std::u16string& path) {
 
 // The path and the options of getXmlWithOutcome. Python 2 has no
 // keyword-only format; the count of positional arguments is checked first.
-bool outcomeArguments(PyObject* args, PyObject* keywords, std::u16string& path, PyObject*& freshSun) {
-    static char* names[] = {const_cast<char*>("path"), const_cast<char*>("freshSun"), NULL};
+bool outcomeArguments(PyObject* args, PyObject* keywords, std::u16string& path, PyObject*& freshSun,
+                      PyObject*& wellFormed) {
+    static char* names[] = {const_cast<char*>("path"), const_cast<char*>("freshSun"),
+                            const_cast<char*>("wellFormed"), NULL};
     if (PyTuple_GET_SIZE(args) > 1) {
         PyErr_Format(PyExc_TypeError, "getXmlWithOutcome() takes 1 positional argument (%d given)",
                      static_cast<int>(PyTuple_GET_SIZE(args)));
         return false;
     }
     Py_UNICODE* text = NULL;
-    if (!PyArg_ParseTupleAndKeywords(args, keywords, "u|O:getXmlWithOutcome", names, &text, &freshSun))
+    if (!PyArg_ParseTupleAndKeywords(args, keywords, "u|OO:getXmlWithOutcome", names, &text, &freshSun,
+                                     &wellFormed))
         return false;
     path = fromPython(text);
     return true;
@@ -197,7 +202,8 @@ PyObject* getOrvoptXml(PyObject*, PyObject* args) { return convert(args, kOption
 // struct sequence is tuple-like without being a tuple subclass).
 PyStructSequence_Field kOutcomeFields[] = {
     {const_cast<char*>("text"),
-     const_cast<char*>("what getOrvmatXml or getOrvoptXml returns for the path")},
+     const_cast<char*>("what getOrvmatXml or getOrvoptXml returns for the path (with wellFormed=True, "
+                       "its document as well-formed XML)")},
     {const_cast<char*>("status"), const_cast<char*>("'document', 'text' or 'unreadable'")},
     {const_cast<char*>("reason"),
      const_cast<char*>("why the file isn't a document, as orvxml --explain says; None for a document")},
@@ -241,13 +247,19 @@ PyObject* getXmlWithOutcome(PyObject*, PyObject* args, PyObject* keywords) {
     try {
         std::u16string path;
         PyObject* freshSun = NULL;
-        if (!outcomeArguments(args, keywords, path, freshSun)) return NULL;
+        PyObject* wellFormed = NULL;
+        if (!outcomeArguments(args, keywords, path, freshSun, wellFormed)) return NULL;
         const int fresh = freshSun == NULL ? 0 : PyObject_IsTrue(freshSun);
         if (fresh < 0) return NULL;
+        const int strict = wellFormed == NULL ? 0 : PyObject_IsTrue(wellFormed);
+        if (strict < 0) return NULL;
         FileKind kind;
         if (!kindOfPath(path, kind))
             return refusedExtension("getXmlWithOutcome", ".orvmat, .lumat, .orvopt or .luopt");
-        ConversionOutcome outcome = convertFile(path, kind, fresh ? SunStart::Fresh : SunStart::Carried);
+        ConversionOptions options;
+        options.sun = fresh ? SunStart::Fresh : SunStart::Carried;
+        options.wellFormed = strict != 0;
+        ConversionOutcome outcome = convertFile(path, kind, options);
         if (outcome.note.rule == LoadRule::OutOfMemory) return PyErr_NoMemory();
         // The text goes through the sink that the other two use, so that it is
         // the same string.
@@ -306,7 +318,8 @@ const char kOutcomeDoc[] =
     "or .orvopt or .luopt (options), any case.\n"
     "Returns a PyOrvXml.Outcome, a tuple (on 2.7 tuple-like, as os.stat_result)\n"
     "(text, status, reason, kind, count):\n"
-    "  text    " ORVXML_TEXT_TYPE ", what getOrvmatXml or getOrvoptXml returns for the path;\n"
+    "  text    " ORVXML_TEXT_TYPE ", what getOrvmatXml or getOrvoptXml returns for the path\n"
+    "          (see wellFormed below);\n"
     "  status  'document' (the file loads), 'text' (it doesn't; text is its text)\n"
     "          or 'unreadable' (not a regular file, or it can't be opened; text is '');\n"
     "  reason  why the file isn't a document, the words of orvxml --explain\n"
@@ -318,6 +331,12 @@ const char kOutcomeDoc[] =
     "does for every file, so the result doesn't depend on what was converted\n"
     "before (the file's own sky record still replaces it for later calls). Without\n"
     "it the sun carries over as in getOrvmatXml and getOrvoptXml.\n"
+    "wellFormed=True (keyword only) writes a document as well-formed XML: every\n"
+    "text escaped for its place (& always, < and >, and \" in attributes; a CR,\n"
+    "and a tab or LF in attributes, as a character reference), characters that\n"
+    "XML 1.0 does not allow as U+FFFD; a parser then gives back exactly the\n"
+    "library's texts. A document without such characters is the same either\n"
+    "way; the text of a file that doesn't load is never changed.\n"
     "A path of another extension " ORVXML_REFUSED ";\n"
     "bytes raise TypeError; MemoryError when memory runs out, PyOrvXml.error for any\n"
     "other failure inside the library.";
@@ -337,8 +356,8 @@ const char kModuleDoc[] =
     "getOrvmatXml(path) reads a material library (.orvmat, .lumat);\n"
     "getOrvoptXml(path) reads a render options file (.orvopt, .luopt).\n"
     "Both return the document as " ORVXML_TEXT_TYPE ".\n"
-    "getXmlWithOutcome(path, *, freshSun=False) reads either, by the extension, and\n"
-    "returns the text with its outcome (a PyOrvXml.Outcome).\n"
+    "getXmlWithOutcome(path, *, freshSun=False, wellFormed=False) reads either, by\n"
+    "the extension, and returns the text with its outcome (a PyOrvXml.Outcome).\n"
     ORVXML_SUN_DOC;
 
 const char kErrorDoc[] =

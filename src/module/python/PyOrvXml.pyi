@@ -2,8 +2,8 @@
 
 getOrvmatXml(path) reads a material library (.orvmat, .lumat);
 getOrvoptXml(path) reads a render options file (.orvopt, .luopt);
-getXmlWithOutcome(path, *, freshSun=False) reads either, by the extension,
-and returns the text together with what happened (an Outcome).
+getXmlWithOutcome(path, *, freshSun=False, wellFormed=False) reads either, by
+the extension, and returns the text together with what happened (an Outcome).
 
 They take the path as str or an os.PathLike giving str (unicode on 2.7) and
 give the text as str (unicode on 2.7): the XML document of a file that loads;
@@ -33,7 +33,8 @@ class Outcome(Tuple[str, str, Optional[str], str, int]):
     tuple-like struct sequence, as os.stat_result)."""
     @property
     def text(self) -> str:
-        """What getOrvmatXml or getOrvoptXml returns for the path."""
+        """What getOrvmatXml or getOrvoptXml returns for the path; with
+        wellFormed=True a document is written as well-formed XML."""
     @property
     def status(self) -> str:
         """'document', 'text' (the file didn't load) or 'unreadable' (not a
@@ -59,8 +60,15 @@ def getOrvoptXml(path: _Path, /) -> str:
     options at path (.orvopt or .luopt, any case), else its text or ''. The
     document sun carries over from the calls before."""
 
-def getXmlWithOutcome(path: _Path, *, freshSun: bool = False) -> Outcome:
+def getXmlWithOutcome(path: _Path, *, freshSun: bool = False,
+                      wellFormed: bool = False) -> Outcome:
     """Gets the xml from a material library (.orvmat, .lumat) or render
     options file (.orvopt, .luopt) with its outcome. freshSun=True puts the
     document sun back to its start state first, as orvxml does for every
-    file; without it the sun carries over as in the other two."""
+    file; without it the sun carries over as in the other two.
+    wellFormed=True writes a document as well-formed XML: every text escaped
+    for its place ("&" always, "<" and ">", and '"' in attributes; a CR, and a
+    tab or LF in attributes, as a character reference) and characters that
+    XML 1.0 does not allow as U+FFFD, so that a parser gives back exactly the
+    library's texts. A document without such characters is the same either
+    way; the text of a file that doesn't load is never changed."""
