@@ -239,6 +239,11 @@ void AssetXmlWriter::putEscaped(const char16_t* text, std::size_t size, Place pl
 
 void AssetXmlWriter::putEscaped(const WriterText& text, Place place) {
     if (text.wide_) return putEscaped(text.wide_, text.size_, place);
+    // Most narrow texts are short ASCII words of the vocabulary: widened on
+    // the stack rather than into a string of their own.
+    char16_t local[128];
+    if (text.size_ <= sizeof local / sizeof local[0] && widenAscii(text.narrow_, text.size_, local))
+        return putEscaped(local, text.size_, place);
     std::u16string wide;
     text.appendTo(wide);
     putEscaped(wide.data(), wide.size(), place);

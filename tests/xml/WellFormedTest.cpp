@@ -166,6 +166,15 @@ TEST(WellFormedWriter, NarrowTextIsEscapedToo) {
     EXPECT_EQ(shown(writtenIn(true, narrow)), shown(writtenIn(true, wide)));
     EXPECT_NE(writtenIn(true, wide).find(u"name=\"n&amp;&quot;\""), std::u16string::npos);
     EXPECT_NE(writtenIn(true, wide).find(u"<value>\u00e9&lt;\uFFFD\"</value>"), std::u16string::npos);
+    // Short ASCII words and long texts take different roads to the same escapes.
+    for (std::size_t size : {std::size_t(7), std::size_t(127), std::size_t(128), std::size_t(129), std::size_t(400)}) {
+        std::string text(size, 'a');
+        text[0] = '&';
+        text[size - 1] = '"';
+        const std::u16string expected = u"&amp;" + std::u16string(size - 2, u'a') + u"&quot;";
+        const std::u16string got = writtenIn(true, [&](AssetXmlWriter& w) { w.openPlugin(text, "x"); });
+        EXPECT_NE(got.find(u"name=\"" + expected + u"\""), std::u16string::npos) << size;
+    }
 }
 
 // The buffered road through a sink gives the string road's text.

@@ -202,8 +202,7 @@ PyObject* getOrvoptXml(PyObject*, PyObject* args) { return convert(args, kOption
 // struct sequence is tuple-like without being a tuple subclass).
 PyStructSequence_Field kOutcomeFields[] = {
     {const_cast<char*>("text"),
-     const_cast<char*>("what getOrvmatXml or getOrvoptXml returns for the path (with wellFormed=True, "
-                       "its document as well-formed XML)")},
+     const_cast<char*>("what getOrvmatXml or getOrvoptXml returns; well-formed with wellFormed=True")},
     {const_cast<char*>("status"), const_cast<char*>("'document', 'text' or 'unreadable'")},
     {const_cast<char*>("reason"),
      const_cast<char*>("why the file isn't a document, as orvxml --explain says; None for a document")},
