@@ -157,12 +157,12 @@ class Scratch(unittest.TestCase):
     def path(self, *parts):
         return os.path.join(self.tmp, *parts)
 
-    def convert(self, command, jobs, source, name):
+    def convert(self, command, jobs, source, name, options=()):
         """Converts `source` into a folder of its own with every output on;
         returns the status and all that the run gave."""
         out, report = self.path(name), self.path(name + '.jsonl')
-        code, stdout, stderr = run(command, ['-j', str(jobs), '--explain', '--report', report,
-                                             '-o', out, source], self.tmp)
+        code, stdout, stderr = run(command, list(options) + ['-j', str(jobs), '--explain', '--report',
+                                                             report, '-o', out, source], self.tmp)
         return {'status': code, 'explain': stdout, 'errors': masked_errors(stderr),
                 'report': masked_report(report), 'files': files_under(out)}
 
@@ -198,6 +198,22 @@ class SameAsLinux(Scratch):
         for jobs in (1, 3):
             self.assertSameRuns(linux, self.convert('windows', jobs, EXAMPLES, 'windows%d' % jobs),
                                 'examples, --jobs %d' % jobs)
+
+    def test_well_formed_remapped_and_listed(self):
+        # The run's XML options reach the workers, which are programs of their own here.
+        options = ['--well-formed', '--remap', 'c:/RENDERS=D:\\r', '--remap', 'textures=maps']
+        linux = self.convert('linux', 1, EXAMPLES, 'linux', options)
+        self.assertIn([{'from': 'textures/wood.png', 'to': 'maps/wood.png'}],
+                      [row.get('remapped') for row in linux['report']])
+        self.assertSameRuns(linux, self.convert('windows', 3, EXAMPLES, 'windows', options), 'options')
+        os.makedirs(self.path('search', 'textures'))
+        write(self.path('search', 'textures', 'stone.png'), b'png')
+        for args in (['--list', EXAMPLES],
+                     ['--files', '--search', self.path('search'),
+                      os.path.join(EXAMPLES, 'materials_old_records_v1.lumat')]):
+            linux, windows = run('linux', args, self.tmp), run('windows', args, self.tmp)
+            self.assertEqual(windows[:2], linux[:2], args)
+            self.assertEqual(windows[2], linux[2], args)
 
     def test_standard_output_is_the_same_bytes(self):
         # Documents of both kinds, and texts whose line ends must pass as they are.

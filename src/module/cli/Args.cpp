@@ -14,6 +14,8 @@ const char kUsage[] =
     "Usage: orvxml [OPTION]... FILE\n"
     "  or:  orvxml -o DIR [OPTION]... PATH...\n"
     "  or:  orvxml --explain [OPTION]... PATH...\n"
+    "  or:  orvxml --list [OPTION]... PATH...\n"
+    "  or:  orvxml --files [--search=DIR]... [OPTION]... PATH...\n"
     "Convert material libraries (.orvmat, .lumat) and render options files\n"
     "(.orvopt, .luopt) to XML, exactly as the PyOrvXml module does. A file that\n"
     "doesn't load as binary comes back as its own text.\n"
@@ -33,11 +35,28 @@ const char kUsage[] =
     "      --explain      print one line per file: a document with its size, or\n"
     "                     why the file fell back to text\n"
     "      --report=FILE  write JSON Lines to FILE, one object per file: path,\n"
-    "                     kind, status, reason, characters, milliseconds\n"
+    "                     kind, status, reason, characters, milliseconds (and\n"
+    "                     with --remap the paths rewritten); with --list or\n"
+    "                     --files one per material, options file or reference\n"
     "      --fallbacks=write|skip\n"
     "                     with -o, write the text of a file that falls back to\n"
     "                     text as its output (the default), or skip it: no\n"
     "                     file, but it is still explained, reported and counted\n"
+    "      --well-formed  write documents that every XML parser reads: every text\n"
+    "                     escaped, characters XML doesn't allow as U+FFFD (the\n"
+    "                     default is the module's exact text)\n"
+    "      --remap=OLD=NEW\n"
+    "                     write a stored file path that starts with OLD (whole\n"
+    "                     folders; case, / and \\ as Windows compares them) with\n"
+    "                     NEW in its place; repeat for more rules, the first\n"
+    "                     that matches wins\n"
+    "      --list         print what each file holds without converting it: a\n"
+    "                     library's materials (name, class, UUID, textures,\n"
+    "                     shape), an options file's record version and camera\n"
+    "      --files        print every file that each file refers to, and where\n"
+    "                     it is found or that it is missing\n"
+    "      --search=DIR   with --files, look for a referenced file in DIR too,\n"
+    "                     after the file's own folder (a Windows path by its name)\n"
     "  -q, --quiet        print nothing but errors\n"
     "  -h, --help         show this help and exit\n"
     "      --version      show the version and exit\n"
@@ -56,7 +75,8 @@ const char kUsage[] =
     "\n"
     "Exit status:\n"
     "  0        every file became a document\n"
-    "  1        some file fell back to text (its text is written), nothing worse\n"
+    "  1        some file fell back to text (its text is written), or with\n"
+    "           --files a referenced file is missing; nothing worse\n"
     "  2        a usage error\n"
     "  3        some input could not be read, or some output (a file, standard\n"
     "           output, the output folder, the report) could not be written\n"
@@ -100,8 +120,9 @@ Parsed parseArgs(const std::vector<std::string>& args, Settings& s, std::string&
             value = a.substr(2);
             hasValue = true;
         }
-        const bool takesValue = name == "-o" || name == "--output" || name == "-j" ||
-                                name == "--jobs" || name == "--report" || name == "--fallbacks";
+        const bool takesValue = name == "-o" || name == "--output" || name == "-j" || name == "--jobs" ||
+                                name == "--report" || name == "--fallbacks" || name == "--remap" ||
+                                name == "--search";
         if (takesValue && !hasValue) {
             if (i + 1 >= args.size()) {
                 error = "option " + name + " needs a value";
@@ -126,6 +147,28 @@ Parsed parseArgs(const std::vector<std::string>& args, Settings& s, std::string&
             s.explain = true;
         } else if (name == "--update") {
             s.update = true;
+        } else if (name == "--well-formed") {
+            s.wellFormed = true;
+        } else if (name == "--list" || name == "--files") {
+            const Mode mode = name == "--list" ? Mode::List : Mode::Files;
+            if (s.mode != Mode::Convert && s.mode != mode) {
+                error = "--list and --files don't go together";
+                return Parsed::UsageError;
+            }
+            s.mode = mode;
+        } else if (name == "--remap") {
+            const std::size_t eq = value.find('=');
+            if (eq == std::string::npos || eq == 0) {
+                error = "--remap takes OLD=NEW, not '" + value + "'";
+                return Parsed::UsageError;
+            }
+            s.remap.emplace_back(value.substr(0, eq), value.substr(eq + 1));
+        } else if (name == "--search") {
+            if (value.empty()) {
+                error = "the search folder is empty";
+                return Parsed::UsageError;
+            }
+            s.searchFolders.push_back(value);
         } else if (name == "-o" || name == "--output") {
             if (value.empty()) {
                 error = "the output folder is empty";
@@ -158,11 +201,24 @@ Parsed parseArgs(const std::vector<std::string>& args, Settings& s, std::string&
         error = "no file given";
         return Parsed::UsageError;
     }
+    if (s.mode != Mode::Convert) {
+        const char* what = s.mode == Mode::List ? "--list" : "--files";
+        const char* other = !s.outDir.empty() ? "-o" : s.explain ? "--explain" : s.update ? "--update"
+                          : s.wellFormed ? "--well-formed" : !s.writeFallbacks ? "--fallbacks"
+                          : s.mode == Mode::List && !s.remap.empty() ? "--remap" : nullptr;
+        if (other) {
+            error = std::string(what) + " doesn't go with " + other;
+            return Parsed::UsageError;
+        }
+    } else if (!s.searchFolders.empty()) {
+        error = "--search goes with --files";
+        return Parsed::UsageError;
+    }
     if (s.update && s.outDir.empty()) {
         error = "--update needs -o DIR";
         return Parsed::UsageError;
     }
-    if (s.outDir.empty() && !s.explain && s.paths.size() > 1) {
+    if (s.mode == Mode::Convert && s.outDir.empty() && !s.explain && s.paths.size() > 1) {
         error = "more than one path needs -o DIR (or --explain)";
         return Parsed::UsageError;
     }

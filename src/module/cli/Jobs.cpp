@@ -16,6 +16,13 @@ using OrvaneLumoCore::FileStatus;
 
 std::string toUtf8(const std::u16string& text) { return platform::encodeUtf8(text.data(), text.size()); }
 
+std::u16string toWide(const std::string& bytes) {
+    std::u16string wide;
+    if (!platform::decodeUtf8Strict(bytes.data(), bytes.size(), wide))
+        wide = platform::decodeAnsi(bytes.data(), bytes.size());
+    return wide;
+}
+
 std::string partPath(const std::string& path, unsigned long pid) { return path + ".part" + std::to_string(pid); }
 
 std::string folderOf(const std::string& path) {
@@ -118,7 +125,11 @@ FileResult runJob(const Job& job, std::FILE* textOut) {
         r.reason = job.refusal;
         r.line = "unreadable: " + job.refusal;
     } else {
-        const OrvaneLumoCore::ConversionOutcome o = OrvaneLumoCore::convertFile(job.widePath, job.kind);
+        OrvaneLumoCore::ConversionOptions options;
+        if (job.xml) static_cast<OrvaneLumoCore::XmlOptions&>(options) = *job.xml;
+        const OrvaneLumoCore::ConversionOutcome o = OrvaneLumoCore::convertFile(job.widePath, job.kind, options);
+        for (const OrvaneLumoCore::RemappedPath& path : o.remapped)
+            r.remapped.emplace_back(toUtf8(path.from), toUtf8(path.to));
         r.status = o.status;
         r.characters = codePoints(o.text);
         r.line = OrvaneLumoCore::explainOutcome(o, job.kind);
@@ -189,6 +200,11 @@ std::string packMessage(const Message& m) {
         body.putText(m.result.reason);
         body.putText(m.result.writeError);
         body.put(static_cast<std::int32_t>(m.result.writeErrno));
+        body.put(static_cast<std::uint32_t>(m.result.remapped.size()));
+        for (const auto& path : m.result.remapped) {
+            body.putText(path.first);
+            body.putText(path.second);
+        }
     }
     return frame(body.bytes);
 }
@@ -199,10 +215,19 @@ bool parseMessage(const char* p, std::size_t n, Message& m) {
     if (m.type != MessageType::Finished) return m.type == MessageType::Started;
     std::uint8_t status = 0;
     std::int32_t writeErrno = 0;
-    return in.get(status) && (m.result.status = static_cast<FileStatus>(status), true) &&
-           in.get(m.result.characters) && in.get(m.result.milliseconds) && in.getText(m.result.line) &&
-           in.getText(m.result.reason) && in.getText(m.result.writeError) && in.get(writeErrno) &&
-           (m.result.writeErrno = writeErrno, true);
+    std::uint32_t remapped = 0;
+    if (!(in.get(status) && in.get(m.result.characters) && in.get(m.result.milliseconds) &&
+          in.getText(m.result.line) && in.getText(m.result.reason) && in.getText(m.result.writeError) &&
+          in.get(writeErrno) && in.get(remapped)))
+        return false;
+    m.result.status = static_cast<FileStatus>(status);
+    m.result.writeErrno = writeErrno;
+    for (std::uint32_t i = 0; i < remapped; ++i) {
+        std::pair<std::string, std::string> path;
+        if (!in.getText(path.first) || !in.getText(path.second)) return false;
+        m.result.remapped.push_back(path);
+    }
+    return true;
 }
 
 }  // namespace orvxml

@@ -8,6 +8,7 @@
 #include <cstdio>
 #include <functional>
 #include <string>
+#include <utility>
 #include <vector>
 
 #include "module/cli/Tree.h"
@@ -23,6 +24,8 @@ struct FileResult {
     std::string writeError;  // why the output couldn't be written; empty if it was
     int writeErrno = 0;      // the errno of that failure
     bool upToDate = false;   // not converted: its output was newer (--update)
+    // The file paths that the job's path rules rewrote: stored, written (UTF-8).
+    std::vector<std::pair<std::string, std::string>> remapped;
 };
 
 // The result of a job that --update finds up to date.
@@ -66,6 +69,9 @@ bool isPartName(const std::string& name);
 // Removes the part files that an earlier run, stopped for good (killed, or
 // the machine went down), left in the folders that these jobs write to.
 void removeLeftParts(const std::vector<Job>& jobs);
+
+// Bytes as UTF-16: UTF-8, or where they aren't, Windows-1252.
+std::u16string toWide(const std::string& bytes);
 
 // The text as UTF-8; a lone surrogate becomes U+FFFD.
 std::string toUtf8(const std::u16string& text);

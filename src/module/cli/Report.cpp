@@ -3,39 +3,16 @@
 #include <cerrno>
 #include <cstring>
 
-#include "platform/Text.h"
+#include "module/Inventory.h"
 
 namespace orvxml {
 
 using OrvaneLumoCore::FileKind;
 using OrvaneLumoCore::FileStatus;
 
-namespace {
+std::string jsonString(const std::string& bytes) { return OrvaneLumoCore::jsonText(toWide(bytes)); }
 
-// A JSON string. Bytes that aren't UTF-8 (a file name may hold any) are
-// read as Windows-1252, so that the line stays valid JSON.
-std::string jsonString(const std::string& bytes) {
-    std::u16string wide;
-    std::string text = bytes;
-    if (!platform::decodeUtf8Strict(bytes.data(), bytes.size(), wide))
-        text = toUtf8(platform::decodeAnsi(bytes.data(), bytes.size()));
-    std::string out = "\"";
-    for (const char c : text) {
-        const unsigned char u = static_cast<unsigned char>(c);
-        if (c == '"' || c == '\\') {
-            out += '\\';
-            out += c;
-        } else if (u < 0x20) {
-            static const char kHex[] = "0123456789abcdef";
-            out += "\\u00";
-            out += kHex[u >> 4];
-            out += kHex[u & 15];
-        } else {
-            out += c;
-        }
-    }
-    return out + "\"";
-}
+namespace {
 
 const char* statusWord(FileStatus status) {
     switch (status) {
@@ -44,6 +21,15 @@ const char* statusWord(FileStatus status) {
     case FileStatus::Unreadable: break;
     }
     return "unreadable";
+}
+
+// [{"from": stored, "to": written}, ...]
+std::string remappedJson(const FileResult& r) {
+    std::string out = "[";
+    for (const auto& path : r.remapped)
+        out += (out.size() > 1 ? ", {\"from\": " : "{\"from\": ") + jsonString(path.first) +
+               ", \"to\": " + jsonString(path.second) + "}";
+    return out + "]";
 }
 
 }  // namespace
@@ -57,7 +43,8 @@ std::string jsonLine(const Job& job, const FileResult& r) {
            (job.hasKind ? (job.kind == FileKind::Materials ? "\"materials\"" : "\"options\"") : "null") +
            ", \"status\": \"" + (r.upToDate ? "up to date" : statusWord(r.status)) + "\", \"reason\": " +
            (reason.empty() ? std::string("null") : jsonString(reason)) +
-           ", \"characters\": " + std::to_string(r.characters) + ", \"milliseconds\": " + ms + "}";
+           ", \"characters\": " + std::to_string(r.characters) + ", \"milliseconds\": " + ms +
+           (job.xml && !job.xml->pathRules.empty() ? ", \"remapped\": " + remappedJson(r) : std::string()) + "}";
 }
 
 Collector::Collector(const std::vector<Job>& jobs, bool explain, bool quiet, Progress& progress,

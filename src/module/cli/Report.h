@@ -12,9 +12,13 @@
 
 namespace orvxml {
 
+// A JSON string of a path or a message. Bytes that aren't UTF-8 (a file
+// name may hold any) are read as Windows-1252, so the line stays valid JSON.
+std::string jsonString(const std::string& bytes);
+
 // One JSON object on one line: path, kind, status ("document", "text",
 // "unreadable", or with --update "up to date"), reason, characters,
-// milliseconds.
+// milliseconds, and with path rules "remapped": the paths they rewrote.
 std::string jsonLine(const Job& job, const FileResult& result);
 
 // Collects the results as they come in, in any order, and passes them on in

@@ -2,10 +2,12 @@
 // From the paths on the command line to the list of files to convert.
 #include <cstddef>
 #include <functional>
+#include <memory>
 #include <string>
 #include <vector>
 
 #include "module/Outcome.h"
+#include "xml/XmlOptions.h"
 
 namespace orvxml {
 
@@ -17,6 +19,9 @@ struct Job {
     bool hasKind = false;
     bool writeText = true;   // false: a file that falls back to text gets no output
     bool upToDate = false;   // its output is newer than it: not converted again
+    // How documents are written (well-formed, path rules), the same for every
+    // job of a run; none: as the module writes them.
+    std::shared_ptr<const OrvaneLumoCore::XmlOptions> xml;
     std::string refusal;     // why the path isn't converted at all; empty: it is
 };
 

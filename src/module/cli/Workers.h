@@ -13,25 +13,16 @@
 
 namespace orvxml {
 
-// The longest of each text of a result message, in bytes, so that a result
-// fits in one atomic pipe write (see WorkersPosix.cpp).
-constexpr std::size_t kMaxText = 1200;
-
-// Values in host order and texts with their length in front.
+// Values in host order and texts with their 32-bit length in front.
 class Packer {
 public:
     template <class T>
     void put(const T& v) {
         bytes.append(reinterpret_cast<const char*>(&v), sizeof v);
     }
-    // A text of at most `max` bytes, its length as 16 or 32 bits.
-    void putText(const std::string& s, std::size_t max = kMaxText) {
-        const std::size_t n = std::min(s.size(), max);
-        if (max <= 0xFFFF)
-            put(static_cast<std::uint16_t>(n));
-        else
-            put(static_cast<std::uint32_t>(n));
-        bytes.append(s, 0, n);
+    void putText(const std::string& s) {
+        put(static_cast<std::uint32_t>(s.size()));
+        bytes.append(s);
     }
     std::string bytes;
 };
@@ -46,12 +37,9 @@ public:
         p_ += sizeof v;
         return true;
     }
-    bool getText(std::string& s, std::size_t max = kMaxText) {
+    bool getText(std::string& s) {
         std::uint32_t n = 0;
-        std::uint16_t n16 = 0;
-        if (max <= 0xFFFF ? !get(n16) : !get(n)) return false;
-        if (max <= 0xFFFF) n = n16;
-        if (static_cast<std::size_t>(end_ - p_) < n) return false;
+        if (!get(n) || static_cast<std::size_t>(end_ - p_) < n) return false;
         s.assign(p_, n);
         p_ += n;
         return true;

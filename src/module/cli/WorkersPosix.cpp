@@ -1,9 +1,9 @@
 // Workers on POSIX systems: forked from the parent before it converts
 // anything, so each starts as a fresh process. They take the next job from a
-// counter on a shared page and report on one pipe that all of them share.
+// counter on a shared page and report on a pipe of their own.
+#include <algorithm>
 #include <atomic>
 #include <cerrno>
-#include <climits>
 #include <csignal>
 #include <map>
 
@@ -22,13 +22,6 @@ namespace orvxml {
 bool runAsWorker(const std::vector<std::string>&, int&) { return false; }
 
 namespace {
-
-// Each message is written with a single write() of at most PIPE_BUF bytes,
-// so messages of different workers never interleave.
-// Length, type, worker, index, status, characters, milliseconds, three
-// texts, the write's errno.
-static_assert(4 + 1 + 4 + 8 + 1 + 8 + 8 + 3 * (2 + kMaxText) + 4 <= PIPE_BUF,
-              "a message is written in one piece");
 
 // The next job's index, shared by all workers through a shared page.
 struct SharedCounter {
@@ -75,28 +68,37 @@ FileResult crashed(int status) {
 void runJobs(const std::vector<Job>& jobs, unsigned workers, const ResultSink& sink) {
     std::vector<bool> reported(jobs.size(), false);
     SharedCounter counter;
-    int fds[2];
     if (workers > jobs.size()) workers = static_cast<unsigned>(jobs.size());
-    if (workers <= 1 || !counter.next || ::pipe2(fds, O_CLOEXEC) != 0) {
+    if (workers <= 1 || !counter.next) {
         runHere(jobs, reported, sink);
         return;
     }
     std::fflush(nullptr);
     std::map<pid_t, std::uint32_t> pids;
+    std::vector<int> pipes(workers, -1);  // each worker's pipe, read end; -1 once it has ended
     for (std::uint32_t w = 0; w < workers; ++w) {
+        int fds[2];
+        if (::pipe2(fds, O_CLOEXEC) != 0) continue;
         const pid_t pid = ::fork();
         if (pid == 0) {
+            for (const int fd : pipes)
+                if (fd >= 0) ::close(fd);
             ::close(fds[0]);
             workerLoop(jobs, w, *counter.next, fds[1]);
         }
-        if (pid > 0) pids[pid] = w;
+        ::close(fds[1]);
+        if (pid > 0) {
+            pids[pid] = w;
+            pipes[w] = fds[0];
+        } else {
+            ::close(fds[0]);
+        }
     }
-    ::close(fds[1]);
 
     // What each worker holds: the index it started and hasn't finished.
     const std::uint64_t kNone = ~std::uint64_t(0);
     std::vector<std::uint64_t> holding(workers, kNone);
-    FrameReader frames;
+    std::vector<FrameReader> frames(workers);
     std::string body;
     char chunk[1 << 16];
     bool forwarded = false, goOn = true;
@@ -107,30 +109,42 @@ void runJobs(const std::vector<Job>& jobs, unsigned workers, const ResultSink& s
             for (const auto& p : pids) ::kill(p.first, platform::interruption());
             forwarded = true;
         }
-        pollfd ready = {fds[0], POLLIN, 0};
-        if (::poll(&ready, 1, 100) <= 0) continue;
-        const ssize_t n = ::read(fds[0], chunk, sizeof chunk);
-        if (n < 0 && errno == EINTR) continue;
-        if (n <= 0) break;
-        frames.append(chunk, static_cast<std::size_t>(n));
-        while (frames.next(body)) {
-            Message m;
-            if (!parseMessage(body.data(), body.size(), m) || m.worker >= workers || m.index >= jobs.size() ||
-                reported[m.index])
+        std::vector<pollfd> open;
+        for (const int fd : pipes)
+            if (fd >= 0) open.push_back(pollfd{fd, POLLIN, 0});
+        if (open.empty()) break;
+        if (::poll(open.data(), open.size(), 100) <= 0) continue;
+        for (std::uint32_t w = 0; w < workers; ++w) {
+            if (pipes[w] < 0) continue;
+            const auto ready = std::find_if(open.begin(), open.end(),
+                                            [&](const pollfd& p) { return p.fd == pipes[w]; });
+            if (ready == open.end() || ready->revents == 0) continue;
+            const ssize_t n = ::read(pipes[w], chunk, sizeof chunk);
+            if (n < 0 && errno == EINTR) continue;
+            if (n <= 0) {
+                ::close(pipes[w]);
+                pipes[w] = -1;
                 continue;
-            if (m.type == MessageType::Started) {
-                holding[m.worker] = m.index;
-            } else {
-                holding[m.worker] = kNone;
-                reported[m.index] = true;
-                if (!sink(static_cast<std::size_t>(m.index), m.result)) {
-                    goOn = false;
-                    counter.next->store(jobs.size());  // the workers take no further job
+            }
+            frames[w].append(chunk, static_cast<std::size_t>(n));
+            while (frames[w].next(body)) {
+                Message m;
+                if (!parseMessage(body.data(), body.size(), m) || m.worker != w || m.index >= jobs.size() ||
+                    reported[m.index])
+                    continue;
+                if (m.type == MessageType::Started) {
+                    holding[w] = m.index;
+                } else {
+                    holding[w] = kNone;
+                    reported[m.index] = true;
+                    if (!sink(static_cast<std::size_t>(m.index), m.result)) {
+                        goOn = false;
+                        counter.next->store(jobs.size());  // the workers take no further job
+                    }
                 }
             }
         }
     }
-    ::close(fds[0]);
 
     for (const auto& p : pids) {
         int status = 0;

@@ -22,8 +22,15 @@ namespace {
 // The first argument of a worker; no path starts with "--".
 const char kWorkerArgument[] = "--orvxml-worker";
 
-// Paths are as long as the system allows; the other texts are short.
-constexpr std::size_t kMaxPath = 0xFFFFFFFF;
+std::string wideBytes(const std::u16string& text) {
+    return std::string(reinterpret_cast<const char*>(text.data()), 2 * text.size());
+}
+
+std::u16string fromWideBytes(const std::string& bytes) {
+    std::u16string text(bytes.size() / 2, u'\0');
+    if (!text.empty()) std::memcpy(&text[0], bytes.data(), 2 * text.size());
+    return text;
+}
 
 std::string packJob(std::uint64_t index, const Job& job) {
     Packer body;
@@ -31,26 +38,44 @@ std::string packJob(std::uint64_t index, const Job& job) {
     body.put(static_cast<std::uint8_t>(job.kind));
     body.put(static_cast<std::uint8_t>(job.hasKind));
     body.put(static_cast<std::uint8_t>(job.writeText));
-    body.putText(job.source, kMaxPath);
-    body.putText(std::string(reinterpret_cast<const char*>(job.widePath.data()), 2 * job.widePath.size()),
-                 kMaxPath);
-    body.putText(job.output, kMaxPath);
-    body.putText(job.refusal, kMaxPath);
+    body.putText(job.source);
+    body.putText(wideBytes(job.widePath));
+    body.putText(job.output);
+    body.putText(job.refusal);
+    // The run's XML options travel with every job: a worker keeps nothing.
+    body.put(static_cast<std::uint8_t>(job.xml ? 1 + job.xml->wellFormed : 0));
+    body.put(static_cast<std::uint32_t>(job.xml ? job.xml->pathRules.size() : 0));
+    if (job.xml)
+        for (const OrvaneLumoCore::PathRule& rule : job.xml->pathRules) {
+            body.putText(wideBytes(rule.from));
+            body.putText(wideBytes(rule.to));
+        }
     return frame(body.bytes);
 }
 
 bool parseJob(const std::string& body, std::uint64_t& index, Job& job) {
     Unpacker in(body.data(), body.size());
-    std::uint8_t kind = 0, hasKind = 0, writeText = 0;
+    std::uint8_t kind = 0, hasKind = 0, writeText = 0, xml = 0;
+    std::uint32_t rules = 0;
     std::string wide;
-    if (!in.get(index) || !in.get(kind) || !in.get(hasKind) || !in.get(writeText) || !in.getText(job.source, kMaxPath) ||
-        !in.getText(wide, kMaxPath) || !in.getText(job.output, kMaxPath) || !in.getText(job.refusal, kMaxPath))
+    if (!in.get(index) || !in.get(kind) || !in.get(hasKind) || !in.get(writeText) || !in.getText(job.source) ||
+        !in.getText(wide) || !in.getText(job.output) || !in.getText(job.refusal) || !in.get(xml) ||
+        !in.get(rules))
         return false;
     job.kind = static_cast<OrvaneLumoCore::FileKind>(kind);
     job.hasKind = hasKind != 0;
     job.writeText = writeText != 0;
-    job.widePath.resize(wide.size() / 2);
-    std::memcpy(&job.widePath[0], wide.data(), 2 * job.widePath.size());
+    job.widePath = fromWideBytes(wide);
+    if (xml) {
+        auto options = std::make_shared<OrvaneLumoCore::XmlOptions>();
+        options->wellFormed = xml == 2;
+        for (std::uint32_t i = 0; i < rules; ++i) {
+            std::string from, to;
+            if (!in.getText(from) || !in.getText(to)) return false;
+            options->pathRules.push_back({fromWideBytes(from), fromWideBytes(to)});
+        }
+        job.xml = options;
+    }
     return true;
 }
 

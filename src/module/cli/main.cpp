@@ -4,6 +4,7 @@
 #include <cerrno>
 #include <cstdio>
 #include <cstring>
+#include <memory>
 #include <set>
 #include <string>
 #include <thread>
@@ -11,6 +12,7 @@
 
 #include "module/cli/Args.h"
 #include "module/cli/Jobs.h"
+#include "module/cli/Listing.h"
 #include "module/cli/Progress.h"
 #include "module/cli/Report.h"
 #include "module/cli/Tree.h"
@@ -33,6 +35,16 @@ int runError(const std::string& message, int error) {
     return 3;
 }
 
+// Closes the report, if there is one; a failure to write it makes the
+// status 3 unless a signal stopped the run.
+int closeReport(std::FILE* report, const std::string& path, int status) {
+    if (report && std::fclose(report) != 0) {
+        const int e = runError("can't write the report " + path, errno);
+        if (status < 128) status = e;
+    }
+    return status;
+}
+
 }  // namespace
 
 int runProgram(const std::vector<std::string>& args) {
@@ -50,16 +62,25 @@ int runProgram(const std::vector<std::string>& args) {
     case Parsed::Run: break;
     }
 
-    const bool toStdout = settings.outDir.empty() && !settings.explain;
-    // A lone file on standard output needs no progress line.
-    Progress progress(toStdout || settings.quiet ? platform::Terminal::None : platform::errorTerminal());
+    const bool listing = settings.mode != Mode::Convert;
+    const bool toStdout = !listing && settings.outDir.empty() && !settings.explain;
+    // A lone file on standard output needs no progress line, nor does a
+    // listing, which prints as it goes.
+    Progress progress(toStdout || listing || settings.quiet ? platform::Terminal::None
+                                                            : platform::errorTerminal());
     std::vector<Job> jobs;
     if (!collectJobs(settings.paths, settings.outDir, !toStdout, jobs, error,
                      [&](std::size_t found) { progress.walking(found); })) {
         progress.clear();
         return usageError(error);
     }
-    for (Job& job : jobs) job.writeText = settings.writeFallbacks;
+    auto xml = std::make_shared<OrvaneLumoCore::XmlOptions>();
+    xml->wellFormed = settings.wellFormed;
+    for (const auto& rule : settings.remap) xml->pathRules.push_back({toWide(rule.first), toWide(rule.second)});
+    for (Job& job : jobs) {
+        job.writeText = settings.writeFallbacks;
+        if (xml->wellFormed || !xml->pathRules.empty()) job.xml = xml;
+    }
     if (settings.update) markUpToDate(jobs);
 
     if (!settings.outDir.empty()) {
@@ -76,6 +97,11 @@ int runProgram(const std::vector<std::string>& args) {
             progress.clear();
             return runError("can't write the report " + settings.reportPath, errno);
         }
+    }
+
+    if (listing) {
+        status = runListing(settings, jobs, xml->pathRules, report);
+        return closeReport(report, settings.reportPath, status);
     }
 
     Collector collector(jobs, settings.explain, settings.quiet, progress, report, settings.update);
@@ -100,9 +126,5 @@ int runProgram(const std::vector<std::string>& args) {
         runJobs(todo, workers, [&](std::size_t k, const FileResult& r) { return collector.add(where[k], r); });
     }
     status = collector.finish(platform::interruption());
-    if (report && std::fclose(report) != 0) {
-        const int e = runError("can't write the report " + settings.reportPath, errno);
-        if (status < 128) status = e;
-    }
-    return status;
+    return closeReport(report, settings.reportPath, status);
 }

@@ -1,0 +1,151 @@
+#include "module/cli/Listing.h"
+
+#include <cerrno>
+#include <cstring>
+#include <string>
+
+#include "module/Inventory.h"
+#include "module/cli/Report.h"
+#include "platform/Interrupt.h"
+
+namespace orvxml {
+
+using OrvaneLumoCore::FileKind;
+using OrvaneLumoCore::FileStatus;
+
+namespace {
+
+class Listing {
+public:
+    Listing(const Settings& settings, const OrvaneLumoCore::PathRules& rules, std::FILE* report)
+        : settings_(settings), rules_(rules), report_(report) {}
+
+    void run(const Job& job);
+    int finish(std::size_t files);
+
+private:
+    // The start of every JSON object of a file: its path and kind.
+    std::string jsonHead(const Job& job) const {
+        return "{\"path\": " + jsonString(job.source) + ", \"kind\": \"" +
+               (job.kind == FileKind::Materials ? "materials" : "options") + "\", ";
+    }
+    void say(const Job& job, const std::string& line);
+    void record(const std::string& json);
+    // A file that isn't listed: why, on every channel.
+    void failed(const Job& job, FileStatus status, const std::string& reason);
+    void list(const Job& job);
+    void references(const Job& job);
+
+    const Settings& settings_;
+    const OrvaneLumoCore::PathRules& rules_;
+    std::FILE* report_;
+    std::size_t done_ = 0, loaded_ = 0, items_ = 0, missing_ = 0, texts_ = 0, unreadable_ = 0;
+    int stdoutError_ = 0;
+};
+
+void Listing::say(const Job& job, const std::string& line) {
+    if (std::printf("%s: %s\n", job.source.c_str(), line.c_str()) < 0 && !stdoutError_)
+        stdoutError_ = errno ? errno : EIO;
+}
+
+void Listing::record(const std::string& json) {
+    if (report_) std::fprintf(report_, "%s\n", json.c_str());
+}
+
+void Listing::failed(const Job& job, FileStatus status, const std::string& reason) {
+    const bool text = status == FileStatus::Text;
+    ++(text ? texts_ : unreadable_);
+    say(job, (text ? "text: " : "unreadable: ") + reason);
+    if (!text) std::fprintf(stderr, "orvxml: %s: %s\n", job.source.c_str(), reason.c_str());
+    record((job.hasKind ? jsonHead(job) : "{\"path\": " + jsonString(job.source) + ", \"kind\": null, ") +
+           "\"status\": \"" + (text ? "text" : "unreadable") + "\", \"reason\": " + jsonString(reason) + "}");
+}
+
+void Listing::list(const Job& job) {
+    const OrvaneLumoCore::FileListing listing = OrvaneLumoCore::listFile(job.widePath, job.kind);
+    if (listing.status != FileStatus::Document) return failed(job, listing.status, listing.reason);
+    ++loaded_;
+    const std::string head = jsonHead(job) + "\"status\": \"document\", ";
+    if (job.kind == FileKind::Options) {
+        say(job, OrvaneLumoCore::listingLine(listing.options));
+        record(head + OrvaneLumoCore::listingJson(listing.options).substr(1));
+        return;
+    }
+    for (const OrvaneLumoCore::MaterialSummary& material : listing.materials) {
+        ++items_;
+        say(job, OrvaneLumoCore::listingLine(material));
+        record(head + OrvaneLumoCore::listingJson(material).substr(1));
+    }
+}
+
+void Listing::references(const Job& job) {
+    OrvaneLumoCore::FileReferences found = OrvaneLumoCore::listFileReferences(job.widePath, job.kind);
+    if (found.status != FileStatus::Document) return failed(job, found.status, found.reason);
+    ++loaded_;
+    // The rules apply before the files are looked for: a reference is found
+    // where its rewritten path leads.
+    std::vector<std::u16string> stored(found.references.size());
+    for (std::size_t i = 0; i < found.references.size(); ++i) {
+        std::u16string rewritten;
+        if (OrvaneLumoCore::remapPath(rules_, found.references[i].path, rewritten)) {
+            stored[i] = found.references[i].path;
+            found.references[i].path = rewritten;
+        }
+    }
+    missing_ += OrvaneLumoCore::checkReferences(found.references, OrvaneLumoCore::folderOf(job.source),
+                                                settings_.searchFolders);
+    for (std::size_t i = 0; i < found.references.size(); ++i) {
+        const OrvaneLumoCore::FileReference& reference = found.references[i];
+        ++items_;
+        const std::string json = OrvaneLumoCore::referenceJson(reference);
+        if (stored[i].empty()) {
+            say(job, OrvaneLumoCore::referenceLine(reference, job.kind));
+            record(jsonHead(job) + json.substr(1));
+        } else {
+            say(job, OrvaneLumoCore::referenceLine(reference, job.kind) + "\tremapped from " +
+                         toUtf8(stored[i]));
+            record(jsonHead(job) + json.substr(1, json.size() - 2) +
+                   ", \"stored\": " + OrvaneLumoCore::jsonText(stored[i]) + "}");
+        }
+    }
+}
+
+void Listing::run(const Job& job) {
+    ++done_;
+    if (!job.refusal.empty()) return failed(job, FileStatus::Unreadable, job.refusal);
+    if (settings_.mode == Mode::List)
+        list(job);
+    else
+        references(job);
+}
+
+int Listing::finish(std::size_t files) {
+    errno = 0;
+    if (std::fflush(stdout) != 0 && !stdoutError_) stdoutError_ = errno ? errno : EIO;
+    if (stdoutError_)
+        std::fprintf(stderr, "orvxml: can't write standard output: %s\n", std::strerror(stdoutError_));
+    if (!settings_.quiet) {
+        if (settings_.mode == Mode::List)
+            std::fprintf(stderr, "orvxml: %zu files listed, %zu materials", loaded_, items_);
+        else
+            std::fprintf(stderr, "orvxml: %zu references in %zu files, %zu missing", items_, loaded_, missing_);
+        std::fprintf(stderr, ", %zu fell back to text, %zu unreadable\n", texts_, unreadable_);
+    }
+    if (const int signal = platform::interruption()) {
+        std::fprintf(stderr, "orvxml: interrupted, %zu of %zu files not read\n", files - done_, files);
+        return 128 + signal;
+    }
+    if (unreadable_ || stdoutError_) return 3;
+    return texts_ || missing_ ? 1 : 0;
+}
+
+}  // namespace
+
+int runListing(const Settings& settings, const std::vector<Job>& jobs, const OrvaneLumoCore::PathRules& rules,
+               std::FILE* report) {
+    Listing listing(settings, rules, report);
+    for (std::size_t i = 0; i < jobs.size() && !platform::interruption(); ++i) listing.run(jobs[i]);
+    return listing.finish(jobs.size());
+}
+
+}  // namespace orvxml
