@@ -4,6 +4,7 @@
 #include <new>
 #include <stdexcept>
 #include <typeinfo>
+#include <unordered_set>
 
 #include "lights/LocalLights.h"
 #include "lights/SunIesDome.h"
@@ -130,9 +131,10 @@ std::string classOf(const boost::shared_ptr<T>& object) {
     return object ? className(&typeid(*object)) : std::string("-");
 }
 
-// A loaded tree is at most kMaxNestingDepth records deep; one built in memory
-// may refer back to itself through a reference's copy, so a walk stops at
-// this depth.
+// A loaded tree is at most kMaxNestingDepth records deep and holds each
+// object once. One built in memory may share objects or refer back to itself
+// through a reference's copy: a walk takes each material and texture once
+// and stops at this depth.
 const int kWalkDepthLimit = 4 * kMaxNestingDepth;
 
 // Visits every object of a tree: materials, layers, textures, bitmaps and
@@ -153,7 +155,7 @@ public:
     std::size_t textureCount = 0;
 
     void material(const MaterialPtr& m) {
-        if (!m) return;
+        if (!m || !seen_.insert(m.get()).second) return;
         Step step(*this, classOf(m));
         if (step.tooDeep()) return;
         materialTextures(*m);
@@ -161,7 +163,7 @@ public:
     }
 
     void texture(const TexturePtr& t) {
-        if (!t) return;
+        if (!t || !seen_.insert(t.get()).second) return;
         Step step(*this, classOf(t));
         if (step.tooDeep()) return;
         ++textureCount;
@@ -287,13 +289,20 @@ private:
     std::vector<FileReference>* out_;
     std::u16string material_;
     std::vector<std::string> trail_;
+    std::unordered_set<const void*> seen_;
 };
 
 // ---- shape ---------------------------------------------------------------------------
 
-void appendShape(std::string& out, const MaterialPtr& m, int depth) {
+// A material shown already (shared, or a reference's copy that leads back)
+// shows as its class and "[...]".
+void appendShape(std::string& out, const MaterialPtr& m, int depth, std::unordered_set<const void*>& seen) {
     out += classOf(m);
     if (!m || depth > kWalkDepthLimit) return;
+    if (!seen.insert(m.get()).second) {
+        out += "[...]";
+        return;
+    }
     std::vector<std::string> inner;
     if (const MaterialLayeredBRDF* layered = dynamic_cast<const MaterialLayeredBRDF*>(m.get())) {
         for (const BrdfPtr& l : layered->brdfs) inner.push_back(classOf(l));
@@ -311,7 +320,7 @@ void appendShape(std::string& out, const MaterialPtr& m, int depth) {
     for (const MaterialPtr& child : children) {
         if (!first) out += ", ";
         first = false;
-        appendShape(out, child, depth + 1);
+        appendShape(out, child, depth + 1, seen);
     }
     out += ']';
 }
@@ -459,7 +468,8 @@ MaterialSummary summarizeMaterial(const MaterialPtr& material) {
     summary.name = material->name;
     summary.className = classOf(material);
     summary.uuid = material->uuid;
-    appendShape(summary.shape, material, 0);
+    std::unordered_set<const void*> seen;
+    appendShape(summary.shape, material, 0, seen);
     TreeWalk walk(nullptr, material->name, std::string());
     walk.material(material);
     summary.textures = walk.textureCount;

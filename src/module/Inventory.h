@@ -37,7 +37,9 @@ struct MaterialSummary {
     // on one line: "MaterialBump[MaterialLayeredBRDF[Diffuse_BRDF, Phong_BRDF]]".
     // A layered material's empty layer slot shows as "-".
     std::string shape;
-    std::size_t textures = 0;  // texture objects anywhere in the tree, nested ones included
+    // Texture objects anywhere in the tree, nested ones included; an object
+    // that a tree built in memory shares counts once.
+    std::size_t textures = 0;
 };
 
 struct OptionsSummary {
@@ -91,7 +93,9 @@ struct FileReferences {
     FileKind kind = FileKind::Materials;
     FileStatus status = FileStatus::Unreadable;  // as in FileListing
     std::string reason;
-    std::vector<FileReference> references;  // in file order; empty paths left out
+    // In file order, a material's own slots before those of the materials
+    // inside it; empty paths left out.
+    std::vector<FileReference> references;
 };
 
 FileReferences listFileReferences(const std::u16string& path, FileKind kind);

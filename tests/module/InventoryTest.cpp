@@ -186,6 +186,30 @@ TEST(InventoryListing, ShapeOfTreesBuiltInMemory) {
     EXPECT_EQ(summarizeMaterial(MaterialPtr()).shape, "");
 }
 
+TEST(InventoryListing, SharedAndCircularTreesInMemoryAreWalkedOnce) {
+    // Forty levels of a multi-material whose two slots share one child: a
+    // walk that took each slot would visit 2^40 materials.
+    MaterialPtr top = layers(u"Bottom", {diffuseWith(bitmap(u"shared.png"))});
+    for (int level = 0; level < 40; ++level) {
+        boost::shared_ptr<MaterialMulti> multi = named<MaterialMulti>(u"Level", u"");
+        multi->materials = {top, top};
+        top = multi;
+    }
+    const MaterialSummary summary = summarizeMaterial(top);
+    EXPECT_EQ(summary.textures, 1u);
+    EXPECT_EQ(summary.shape.substr(0, 28), "MaterialMulti[MaterialMulti[");
+    EXPECT_NE(summary.shape.find("MaterialMulti[...]"), std::string::npos);
+    std::vector<FileReference> refs;
+    collectMaterialReferences(top, refs);
+    ASSERT_EQ(refs.size(), 1u);
+
+    // A reference whose copy leads back to itself.
+    boost::shared_ptr<MaterialReference> loop = referenceTo(u"uuid", u"Loop");
+    loop->target = wrap<MaterialBump>(loop);
+    EXPECT_EQ(summarizeMaterial(loop).shape, "MaterialReference[MaterialBump[MaterialReference[...]]]");
+    loop->target.reset();  // the two own each other
+}
+
 TEST(InventoryListing, TextLinesStayOneLineAndJsonIsEscaped) {
     MaterialPtr m = layers(u"Tab\there \"quoted\" \\ caf\u00e9 ", {});
     m->name += char16_t(0xD800);  // a lone surrogate
