@@ -149,6 +149,31 @@ TEST_F(InventoryRichLibrary, ListingGivesEveryMaterialWithItsShape) {
     testsupport::expectGolden("module/golden/listing.txt", wholeListing(listing));
 }
 
+// Every bundled example loads for a listing as it does for a conversion:
+// the same status, the same number of materials, the same reason.
+TEST(InventoryListing, ExamplesListAsTheyConvert) {
+    std::size_t files = 0;
+    for (const auto& entry : std::filesystem::directory_iterator(tempfiles::examplePath(""))) {
+        const std::u16string path = wide(entry.path().generic_string());
+        FileKind kind;
+        if (!kindOfPath(path, kind)) continue;
+        ++files;
+        SCOPED_TRACE(entry.path().filename().string());
+        const ConversionOutcome outcome = convertFile(path, kind);
+        const FileListing listing = listFile(path, kind);
+        EXPECT_EQ(listing.status, outcome.status);
+        if (outcome.status == FileStatus::Document) {
+            EXPECT_TRUE(listing.reason.empty());
+            if (kind == FileKind::Materials) EXPECT_EQ(listing.materials.size(), outcome.items);
+        } else {
+            const std::string line = explainOutcome(outcome, kind);
+            EXPECT_EQ(line.substr(line.find(": ") + 2), listing.reason);
+        }
+        EXPECT_EQ(listFileReferences(path, kind).status, outcome.status);
+    }
+    EXPECT_EQ(files, 17u);
+}
+
 TEST(InventoryListing, OptionsGiveTheirRecordVersionAndCamera) {
     TempDir dir;
     AllOptions options;
