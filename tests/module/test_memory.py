@@ -8,7 +8,7 @@ import subprocess
 import sys
 import unittest
 
-from support import BUILD, EXAMPLES, ScratchTest, example, explain, read, PyOrvXml
+from support import BUILD, COMMAND, EXAMPLES, ScratchTest, example, explain, read, PyOrvXml
 
 LIMIT_MB = 400
 
@@ -54,6 +54,23 @@ class MemoryLimit(ScratchTest):
             resource.setrlimit(resource.RLIMIT_AS, (LIMIT_MB << 20, LIMIT_MB << 20))
         self.assertEqual(explain(self.large_library(40000), self.dir, limit),
                          'unreadable: out of memory')
+
+    def test_the_batch_goes_on_after_a_file_that_ran_out_of_memory(self):
+        def limit():
+            import resource
+            resource.setrlimit(resource.RLIMIT_AS, (LIMIT_MB << 20, LIMIT_MB << 20))
+        small = example('materials_all_layers.orvmat')
+        out = os.path.join(self.dir, 'out')
+        for jobs in ('1', '2'):  # in this process, and in workers
+            p = subprocess.Popen([COMMAND, '--jobs', jobs, '-o', out, small, self.large_library(40000),
+                                  example('render_settings.orvopt')],
+                                 stdout=subprocess.PIPE, stderr=subprocess.PIPE, preexec_fn=limit)
+            err = p.communicate()[1].decode('utf-8')
+            self.assertEqual(p.returncode, 3, err)
+            self.assertIn('large.orvmat: out of memory\n', err)
+            self.assertIn('orvxml: 2 converted, 0 fell back to text, 1 unreadable', err)
+            self.assertEqual(sorted(os.listdir(out)),
+                             ['materials_all_layers.orvmat.xml', 'render_settings.orvopt.xml'])
 
     def test_the_same_file_converts_without_the_limit(self):
         # The library is valid: what fails above is memory, not the file.

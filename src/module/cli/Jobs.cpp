@@ -3,6 +3,8 @@
 #include <cerrno>
 #include <chrono>
 #include <cstring>
+#include <new>
+#include <stdexcept>
 #include <set>
 
 #include "module/cli/Workers.h"
@@ -118,32 +120,51 @@ FileResult upToDate() {
 
 bool stopsTheRun(const FileResult& result) { return platform::isNoSpace(result.writeErrno); }
 
+namespace {
+
+// Converts the job and writes its text: to its output file, or if it has
+// none and `textOut` is given, there.
+void convertJob(const Job& job, std::FILE* textOut, FileResult& r) {
+    OrvaneLumoCore::ConversionOptions options;
+    if (job.xml) static_cast<OrvaneLumoCore::XmlOptions&>(options) = *job.xml;
+    const OrvaneLumoCore::ConversionOutcome o = OrvaneLumoCore::convertFile(job.widePath, job.kind, options);
+    for (const OrvaneLumoCore::RemappedPath& path : o.remapped)
+        r.remapped.emplace_back(toUtf8(path.from), toUtf8(path.to));
+    r.status = o.status;
+    r.characters = codePoints(o.text);
+    r.line = OrvaneLumoCore::explainOutcome(o, job.kind);
+    if (o.status != FileStatus::Document) r.reason = OrvaneLumoCore::describe(o.note);
+    // A file that can't be read has no text of its own: it gets no output
+    // file, and a text gets one unless the run skips them.
+    const bool written = o.status == FileStatus::Document || (o.status == FileStatus::Text && job.writeText);
+    if (!job.output.empty() && written) {
+        if ((r.writeErrno = writeFile(job.output, toUtf8(o.text))) != 0)
+            r.writeError = job.output + ": " + std::strerror(r.writeErrno);
+    } else if (textOut) {
+        if ((r.writeErrno = writeStream(textOut, toUtf8(o.text))) != 0)
+            r.writeError = std::string("standard output: ") + std::strerror(r.writeErrno);
+    }
+}
+
+}  // namespace
+
 FileResult runJob(const Job& job, std::FILE* textOut) {
     const auto start = std::chrono::steady_clock::now();
     FileResult r;
     if (!job.refusal.empty()) {
-        r.reason = job.refusal;
-        r.line = "unreadable: " + job.refusal;
+        r = stopped(job.refusal);
     } else {
-        OrvaneLumoCore::ConversionOptions options;
-        if (job.xml) static_cast<OrvaneLumoCore::XmlOptions&>(options) = *job.xml;
-        const OrvaneLumoCore::ConversionOutcome o = OrvaneLumoCore::convertFile(job.widePath, job.kind, options);
-        for (const OrvaneLumoCore::RemappedPath& path : o.remapped)
-            r.remapped.emplace_back(toUtf8(path.from), toUtf8(path.to));
-        r.status = o.status;
-        r.characters = codePoints(o.text);
-        r.line = OrvaneLumoCore::explainOutcome(o, job.kind);
-        if (o.status != FileStatus::Document) r.reason = OrvaneLumoCore::describe(o.note);
-        // A file that can't be read has no text of its own: it gets no output
-        // file, and a text gets one unless the run skips them.
-        const bool written =
-            o.status == FileStatus::Document || (o.status == FileStatus::Text && job.writeText);
-        if (!job.output.empty() && written) {
-            if ((r.writeErrno = writeFile(job.output, toUtf8(o.text))) != 0)
-                r.writeError = job.output + ": " + std::strerror(r.writeErrno);
-        } else if (textOut) {
-            if ((r.writeErrno = writeStream(textOut, toUtf8(o.text))) != 0)
-                r.writeError = std::string("standard output: ") + std::strerror(r.writeErrno);
+        // The conversion itself reports running out of memory; what is left
+        // (the UTF-8 copy of a text that only just fit) ends this file, not
+        // the run, here as in a worker.
+        try {
+            convertJob(job, textOut, r);
+        } catch (const std::bad_alloc&) {
+            r = stopped("out of memory");
+        } catch (const std::length_error&) {
+            r = stopped("out of memory");
+        } catch (const std::exception& e) {
+            r = stopped(std::string("the conversion failed: ") + e.what());
         }
     }
     r.milliseconds =
