@@ -210,5 +210,5 @@ TEST(RenderView, RecordVersionsAndXml) {
     std::u16string out;
     AssetXmlWriter writer(out);
     v.writeXml(writer, u"/a&b");
-    EXPECT_EQ(golden("animation/golden/render_view.xml"), wideToUtf8(out));
+    expectGolden("animation/golden/render_view.xml", wideToUtf8(out));
 }

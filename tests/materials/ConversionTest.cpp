@@ -1,7 +1,5 @@
 // The asset conversion against the golden documents under golden/, and the walks over a tree: the search for the
 // layered material, parents, bitmap files.
-#include <cstdio>
-
 #include <algorithm>
 
 #include "materials/MaterialAssets.h"
@@ -9,6 +7,7 @@
 #include "materials/MaterialTree.h"
 #include "materials/WrapperAssets.h"
 #include "persistence/OrvMatFile.h"
+#include "support/TempFiles.h"
 #include "textures/ProceduralTextures.h"
 
 using namespace mattest;
@@ -30,12 +29,11 @@ boost::shared_ptr<L> layer(const std::u16string& name) {
 std::string throughAFile(const std::vector<MaterialPtr>& materials, bool clearTable = false) {
     OrvMatFile file;
     file.materials = materials;
-    const std::string path = ::testing::TempDir() + "conversion_test.orvmat";
-    EXPECT_TRUE(file.save(utf8ToWide(path)));
+    const tempfiles::TempDir dir;
+    const std::u16string path = utf8ToWide(dir.file("conversion_test.orvmat"));
+    EXPECT_TRUE(file.save(path));
     if (clearTable) SceneMaterials::instance()->clear();
-    const std::u16string xml = OrvMatFile().getXml(utf8ToWide(path));
-    std::remove(path.c_str());
-    return wideToUtf8(xml);
+    return wideToUtf8(OrvMatFile().getXml(path));
 }
 
 // A library of four materials: the first holds all six layers, with textures in some slots and none in others; then a

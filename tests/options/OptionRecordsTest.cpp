@@ -81,7 +81,7 @@ TEST(OrvaneFrameData, RecordOwnXmlAndNarrowedOffsets) {
     std::u16string out;
     AssetXmlWriter writer(out);
     f.writeXml(writer, u"/doc");
-    EXPECT_EQ(golden("options/golden/frame_data.xml"), wideToUtf8(out));
+    expectGolden("options/golden/frame_data.xml", wideToUtf8(out));
     // Offsets are f64 in memory and f32 in the record; f64 rows stay whole.
     g.camToWorld.offs[1] = 0.1;
     g.frameStart = 0.1;

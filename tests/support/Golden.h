@@ -13,8 +13,9 @@
 
 namespace testsupport {
 
-// The golden document tests/<path>; EXPECT_EQ on it prints a line-by-line diff.
-inline std::string golden(const std::string& path) {
+// The golden document tests/<path>, for a test that takes values from it.
+// To compare with one, use expectGolden, which ORVXML_UPDATE_GOLDEN reaches.
+inline std::string readGolden(const std::string& path) {
     std::ifstream in(std::string(ORVXML_SOURCE_DIR) + "/tests/" + path, std::ios::binary);
     std::ostringstream text;
     text << in.rdbuf();
@@ -27,7 +28,7 @@ inline std::string golden(const std::string& path) {
 inline void expectGolden(const std::string& path, const std::string& actual) {
     if (std::getenv("ORVXML_UPDATE_GOLDEN"))
         std::ofstream(std::string(ORVXML_SOURCE_DIR) + "/tests/" + path, std::ios::binary) << actual;
-    const std::string expected = golden(path);
+    const std::string expected = readGolden(path);
     if (expected == actual) return;
     const std::size_t at = std::mismatch(expected.begin(), expected.end(), actual.begin(), actual.end()).first - expected.begin();
     auto lineAt = [at](const std::string& text) {

@@ -106,9 +106,9 @@ struct RecordBytes {
 // The bytes written to `ar`, from its start.
 inline std::vector<std::uint8_t> writtenBytes(const QuickArchive& ar) {
     std::vector<std::uint8_t> out(static_cast<std::size_t>(ar.getWritePosition()));
-    QuickArchive copy(ar);
-    copy.setReadPosition(0);
-    if (!out.empty()) copy.getRaw(out.data(), out.size());
+    const std::size_t block = QuickArchive::kBlockSize;
+    for (std::size_t i = 0; i < out.size(); ++i)
+        out[i] = static_cast<std::uint8_t>((*ar.getBlock(i / block))[i % block]);
     return out;
 }
 
@@ -149,6 +149,28 @@ P loadedInto(P object, const RecordBytes& bytes, bool expectOk = true) {
 template <class T>
 boost::shared_ptr<T> loaded(const RecordBytes& bytes, bool expectOk = true) {
     return loadedInto(boost::make_shared<T>(), bytes, expectOk);
+}
+
+// How an old record saves, for a golden list: `object` (which held a newest
+// record) reads `old` to its end and saves; a fresh object from `make` reads
+// the saved record to its end and equals it. Returns `label` and the saved
+// bytes in hex, four to a group, 32 to a line.
+template <class Ptr, class Make>
+std::string savedFromOld(const std::string& label, const Ptr& object, const RecordBytes& old, Make make) {
+    std::string out = label + "\n";
+    if (!loadsWhole(*object, old)) return out + "  (not read to its end)\n";
+    bool ok = false;
+    const RecordBytes saved{savedBytes(*object, &ok)};
+    const auto back = make();
+    EXPECT_TRUE(ok && loadsWhole(*back, saved) && back->isEqual(object)) << label;
+    static const char digits[] = "0123456789abcdef";
+    for (std::size_t i = 0; i < saved.size(); ++i) {
+        out += i % 32 == 0 ? "  " : i % 4 == 0 ? " " : "";
+        out += digits[saved.data[i] >> 4];
+        out += digits[saved.data[i] & 15];
+        if (i % 32 == 31 || i + 1 == saved.size()) out += '\n';
+    }
+    return out;
 }
 
 // `value` saves as `laid`, and `laid` loaded into `other` gives `value`.

@@ -46,7 +46,7 @@ RecordBytes skyV3(const std::string& ownSunId, const std::string& docId, bool su
 
 // The whole Asset of a sky under /M whose sun reference is `reference`.
 std::string skyAsset(const std::string& reference) {
-    std::string text = golden("textures/golden/sky.xml");
+    std::string text = readGolden("textures/golden/sky.xml");
     return text.replace(text.find("SUN"), 3, reference);
 }
 

@@ -5,6 +5,7 @@
 #include "animation/TransformComponents.h"
 #include "textures/BaseTexture.h"
 #include "lights/BaseLight.h"
+#include "support/Golden.h"
 #include "xml/AssetXmlWriter.h"
 
 using namespace OrvaneLumoCore;
@@ -25,103 +26,6 @@ std::string param(F f) {
     for (int i = 0; i < 6; ++i) w.increaseIndent();
     f(w);
     return narrow(out);
-}
-
-const std::string I6(12, ' '), I7(14, ' '), I8(16, ' '), I9(18, ' ');
-
-TEST(AssetXmlWriter, InlineForms) {
-    EXPECT_EQ(param([](AssetXmlWriter& w) { w.writeFloat("color_tex_mult", 0.5f); }),
-              I6 + "<parameter type=\"float\" name=\"color_tex_mult\" handler=\"default\" "
-                   "listType=\"none\" label=\"color_tex_mult\">\n" +
-                  I7 + "<value>0.5</value>\n" + I6 + "</parameter>\n");
-    EXPECT_EQ(param([](AssetXmlWriter& w) { w.writeInteger("n", -3, "Count", true); }),
-              I6 + "<parameter type=\"integer\" name=\"n\" handler=\"default\" listType=\"none\" "
-                   "isUserData=\"1\" label=\"Count\">\n" +
-                  I7 + "<value>-3</value>\n" + I6 + "</parameter>\n");
-    EXPECT_EQ(param([](AssetXmlWriter& w) { w.writeBool("b", true); }),
-              I6 + "<parameter type=\"bool\" name=\"b\" handler=\"default\" listType=\"none\" "
-                   "label=\"b\">\n" +
-                  I7 + "<value>1</value>\n" + I6 + "</parameter>\n");
-    EXPECT_EQ(param([](AssetXmlWriter& w) { w.writeString("s", "a<b"); }),
-              I6 + "<parameter type=\"string\" name=\"s\" handler=\"default\" listType=\"none\" "
-                   "label=\"s\">\n" +
-                  I7 + "<value>a<b</value>\n" + I6 + "</parameter>\n");
-    EXPECT_EQ(param([](AssetXmlWriter& w) { w.writeFileName("file", u"a<b&amp;c"); }),
-              I6 + "<parameter type=\"string\" name=\"file\" handler=\"FileBrowserHandler\" "
-                   "listType=\"none\" label=\"file\">\n" +
-                  I7 + "<value>a&lt;b&amp;c</value>\n" + I6 + "</parameter>\n");
-}
-
-TEST(AssetXmlWriter, BlockForms) {
-    const std::string head = "handler=\"default\" listType=\"none\" label=\"v\">\n";
-    const std::string vec123 = I8 + "<vector>\n" + I9 + "<x>1</x>\n" + I9 + "<y>2</y>\n" + I9 +
-                               "<z>3</z>\n" + I8 + "</vector>\n";
-    EXPECT_EQ(param([](AssetXmlWriter& w) { w.writeVector("v", Vector(1, 2, 3)); }),
-              I6 + "<parameter type=\"vector\" name=\"v\" " + head + I7 + "<value>\n" + vec123 +
-                  I7 + "</value>\n" + I6 + "</parameter>\n");
-    EXPECT_EQ(param([](AssetXmlWriter& w) { w.writeAColor("v", AColor(1, 0.5f, 0, 1e6f)); }),
-              I6 + "<parameter type=\"acolor\" name=\"v\" " + head + I7 + "<value>\n" + I8 +
-                  "<r>1</r>\n" + I8 + "<g>0.5</g>\n" + I8 + "<b>0</b>\n" + I8 + "<a>1e+006</a>\n" +
-                  I7 + "</value>\n" + I6 + "</parameter>\n");
-    const std::string m = param([](AssetXmlWriter& w) {
-        w.writeMatrix("v", Matrix(Vector(1, 2, 3), Vector(1, 2, 3), Vector(1, 2, 3)));
-    });
-    std::string vec9shifted;
-    for (std::size_t p = 0, q; p < vec123.size(); p = q + 1) {
-        q = vec123.find('\n', p);
-        vec9shifted += "  " + vec123.substr(p, q - p + 1);
-    }
-    EXPECT_EQ(m, I6 + "<parameter type=\"matrix\" name=\"v\" " + head + I7 + "<value>\n\n" + I8 +
-                     "<matrix>\n" + vec9shifted + vec9shifted + vec9shifted + I8 + "</matrix>\n" +
-                     I7 + "</value>\n" + I6 + "</parameter>\n");
-    EXPECT_EQ(param([](AssetXmlWriter& w) {
-                  w.writeTransform("v", Transform(Matrix(Vector(1, 2, 3), Vector(1, 2, 3),
-                                                         Vector(1, 2, 3)),
-                                                  Vector(1, 2, 3)));
-              }),
-              I6 + "<parameter type=\"transform\" name=\"v\" " + head + I7 + "<value>\n" + vec123 +
-                  vec123 + vec123 + vec123 + I7 + "</value>\n" + I6 + "</parameter>\n");
-}
-
-TEST(AssetXmlWriter, ComponentForms) {
-    TransformComponents c;
-    c.rotation = Vector(90, 0, 0.25f);
-    c.mirror[2] = 1;
-    const std::string text = param([&](AssetXmlWriter& w) { w.writeComponentMatrix("m", c); });
-    EXPECT_EQ(text, I6 + "<parameter type=\"componentMatrix\" name=\"m\" handler=\"default\" "
-                         "listType=\"none\" label=\"m\">\n" +
-                        I7 + "<value>\n" + I8 + "<x_rotation>90</x_rotation>\n" + I8 +
-                        "<y_rotation>0</y_rotation>\n" + I8 + "<z_rotation>0.25</z_rotation>\n" +
-                        I8 + "<x_scale>1</x_scale>\n" + I8 + "<y_scale>1</y_scale>\n" + I8 +
-                        "<z_scale>1</z_scale>\n" + I8 + "<x_offset>0</x_offset>\n" + I8 +
-                        "<y_offset>0</y_offset>\n" + I8 + "<z_offset>0</z_offset>\n" + I8 +
-                        "<x_mirror>0</x_mirror>\n" + I8 + "<y_mirror>0</y_mirror>\n" + I8 +
-                        "<z_mirror>1</z_mirror>\n" + I7 + "</value>\n" + I6 + "</parameter>\n");
-    const std::string t = param([&](AssetXmlWriter& w) { w.writeComponentTransform("m", c); });
-    EXPECT_EQ(t.substr(0, 53), I6 + "<parameter type=\"componentTransform\" name");
-    EXPECT_EQ(t.size(), text.size() + 3);
-}
-
-TEST(AssetXmlWriter, Lists) {
-    EXPECT_EQ(param([](AssetXmlWriter& w) {
-                  w.openList("brdfs", "plugin", "");
-                  w.writeListEntry(u"/a&b/BRDFDiffuse");
-                  w.writeStringEntry("x<y");
-                  w.closeList();
-              }),
-              I6 + "<parameter type=\"list\" name=\"brdfs\" handler=\"default\" listType=\"plugin\" "
-                   "label=\"brdfs\">\n" +
-                  I7 + "<value>\n" + I7 + "<list>\n" + I8 + "<entry>/a&amp;b/BRDFDiffuse</entry>\n" +
-                  I8 + "<string>\"x<y\"</string>\n" + I7 + "</list>\n" + I7 + "</value>\n" + I6 +
-                  "</parameter>\n");
-    EXPECT_EQ(param([](AssetXmlWriter& w) {
-                  w.openList("l", "", "");
-                  w.closeList();
-              }),
-              I6 + "<parameter type=\"list\" name=\"l\" handler=\"default\" listType=\"\" "
-                   "label=\"l\">\n" +
-                  I7 + "<value>\n" + I7 + "<list>\n" + I7 + "</list>\n" + I7 + "</value>\n" + I6 +
-                  "</parameter>\n");
 }
 
 struct FakeTexture : BaseTexture {
@@ -147,23 +51,39 @@ struct FakeLight : BaseLight {
     std::uint32_t type;
 };
 
-TEST(AssetXmlWriter, PluginReferences) {
-    const std::string head = I6 + "<parameter type=\"plugin\" name=\"tex\" handler=\"default\" "
-                                  "listType=\"none\" label=\"tex\">\n";
-    EXPECT_EQ(param([](AssetXmlWriter& w) {
-                  w.writePluginRef("tex", boost::any(TexturePtr(new FakeTexture)), u"/M&N/x");
-              }),
-              head + I7 + "<value>/M&amp;N/x/TexBitmap</value>\n" + I6 + "</parameter>\n");
-    EXPECT_EQ(param([](AssetXmlWriter& w) { w.writePluginRef("tex", boost::any(TexturePtr()), u"/M"); }),
-              head + I6 + "</parameter>\n");
-    EXPECT_EQ(param([](AssetXmlWriter& w) {
-                  w.writePluginRef("tex", boost::any(LightPtr(new FakeLight(5))), u"/Sun");
-              }),
-              head + I7 + "<value>/Sun</value>\n" + I6 + "</parameter>\n");
-    EXPECT_EQ(param([](AssetXmlWriter& w) {
-                  w.writePluginRef("tex", boost::any(LightPtr(new FakeLight(2))), u"/L");
-              }),
-              head + I7 + "<value>/L/LightOmni</value>\n" + I6 + "</parameter>\n");
+// Every form of parameter, with values that show the number layout, the
+// escaping and the indentation of each level.
+TEST(AssetXmlWriter, EveryFormOfParameter) {
+    const Vector v(1, 2, 3);
+    TransformComponents c;
+    c.rotation = Vector(90, 0, 0.25f);
+    c.mirror[2] = 1;
+    const std::string forms = param([&](AssetXmlWriter& w) {
+        w.writeFloat("color_tex_mult", 0.5f);
+        w.writeInteger("n", -3, "Count", true);
+        w.writeBool("b", true);
+        w.writeString("s", "a<b");
+        w.writeFileName("file", u"a<b&amp;c");
+        w.writeVector("v", v);
+        w.writeAColor("v", AColor(1, 0.5f, 0, 1e6f));
+        w.writeMatrix("v", Matrix(v, v, v));
+        w.writeTransform("v", Transform(Matrix(v, v, v), v));
+        w.writeComponentMatrix("m", c);
+        w.writeComponentTransform("m", c);
+        w.openList("brdfs", "plugin", "");
+        w.writeListEntry(u"/a&b/BRDFDiffuse");
+        w.writeStringEntry("x<y");
+        w.closeList();
+        w.openList("l", "", "");
+        w.closeList();
+        // A plugin reference: a texture's url with its plugin name, none, the
+        // document sun's url alone, another light's with its plugin name.
+        w.writePluginRef("tex", boost::any(TexturePtr(new FakeTexture)), u"/M&N/x");
+        w.writePluginRef("tex", boost::any(TexturePtr()), u"/M");
+        w.writePluginRef("tex", boost::any(LightPtr(new FakeLight(5))), u"/Sun");
+        w.writePluginRef("tex", boost::any(LightPtr(new FakeLight(2))), u"/L");
+    });
+    testsupport::expectGolden("xml/golden/forms.xml", forms);
 }
 
 // A texture slot reference gives the text of a plugin reference whose url is
@@ -237,26 +157,7 @@ TEST(AssetXmlWriter, DocumentFrame) {
     w.closeAsset();
     w.closeAssets();
     w.closeRoot();
-    EXPECT_EQ(narrow(out),
-              "<orvmat>\n"
-              "  <Assets>\n"
-              "    <Asset layout=\"\" renderer=\"lumo\" type=\"BRDF\" url=\"/Wood \"1\"/BRDFDiffuse\" >\n"
-              "      <plugin>\n"
-              "        <lumoplugin name=\"BRDFDiffuse\" type=\"BRDF\">\n"
-              "          <parameters>\n"
-              "            <parameter type=\"color\" name=\"color\" handler=\"default\" listType=\"none\" label=\"color\">\n"
-              "              <value>\n"
-              "                <r>1</r>\n"
-              "                <g>1</g>\n"
-              "                <b>1</b>\n"
-              "              </value>\n"
-              "            </parameter>\n"
-              "          </parameters>\n"
-              "        </lumoplugin>\n"
-              "      </plugin>\n"
-              "    </Asset>\n"
-              "  </Assets>\n"
-              "</orvmat>\n");
+    testsupport::expectGolden("xml/golden/document_frame.xml", narrow(out));
     std::u16string empty;
     AssetXmlWriter e(empty);
     e.openRoot(u"orvopt");

@@ -34,44 +34,6 @@ std::u16string written(const std::function<void(AssetXmlWriter&)>& body) {
     return out;
 }
 
-// Each row of a table against the writer call it stands for, for values
-// that tell the forms apart (a flag of -7 is 1, a count of -7 is -7).
-TEST(ParamRows, EachRowWritesTheFormOfItsField) {
-    Holder h;
-    h.inner.flag = -7;
-    h.inner.count = -7;
-    h.inner.weight = 0.25f;
-    h.inner.file = u"a<b.png";
-    h.ownFlag = 2;
-    h.ownCount = 2;
-    h.on = true;
-    h.scale = 1.5;
-    h.path = u"c&d.exr";
-
-    struct Case {
-        ParamRow<Holder> row;
-        std::function<void(AssetXmlWriter&)> expected;
-    };
-    const Case cases[] = {
-        {{"own_flag", asFlag(&Holder::ownFlag)}, [](AssetXmlWriter& w) { w.writeBool("own_flag", true); }},
-        {{"own_count", &Holder::ownCount}, [](AssetXmlWriter& w) { w.writeInteger("own_count", 2); }},
-        {{"on", &Holder::on, "On", true}, [](AssetXmlWriter& w) { w.writeBool("on", true, "On", true); }},
-        {{"scale", &Holder::scale}, [](AssetXmlWriter& w) { w.writeFloat("scale", 1.5f); }},
-        {{"path", FieldRef<Holder>::path(&Holder::path)},
-         [](AssetXmlWriter& w) { w.writeFileName("path", u"c&d.exr"); }},
-        {{"flag", asFlag(fieldOf<&Holder::inner, &Inner::flag>)},
-         [](AssetXmlWriter& w) { w.writeBool("flag", true); }},
-        {{"count", fieldOf<&Holder::inner, &Inner::count>, "Count", true},
-         [](AssetXmlWriter& w) { w.writeInteger("count", -7, "Count", true); }},
-        {{"weight", fieldOf<&Holder::inner, &Inner::weight>}, [](AssetXmlWriter& w) { w.writeFloat("weight", 0.25f); }},
-        {{"file", FieldRef<Holder>()}, [](AssetXmlWriter&) {}},
-    };
-    for (const Case& c : cases) {
-        SCOPED_TRACE(c.row.name);
-        EXPECT_EQ(written([&](AssetXmlWriter& w) { writeParam(w, c.row, h); }), written(c.expected));
-    }
-}
-
 TEST(ParamRows, AFlagOfZeroIsFalseWhereverItLies) {
     Holder h;
     const ParamRow<Holder> rows[] = {
