@@ -1,7 +1,5 @@
 #include "materials/BaseMaterial.h"
 
-#include <algorithm>
-
 #include "materials/SceneMaterials.h"
 #include "persistence/QuickArchive.h"
 #include "persistence/Record.h"
@@ -14,10 +12,6 @@ const char16_t kDefaultMaterialName[] = u"DefaultMaterial";
 namespace {
 
 const int kBaseRecordVersion = 2;
-
-void removeControlCharacters(std::u16string& text) {
-    text.erase(std::remove_if(text.begin(), text.end(), &platform::isControl), text.end());
-}
 
 }  // namespace
 
@@ -50,7 +44,7 @@ bool BaseMaterial::load(QuickArchive& ar) {
         if (name.empty()) name = uniqueMaterialName(kDefaultMaterialName);
         if (version >= 2) ar.readWString(uuid);
     }
-    removeControlCharacters(name);
+    platform::removeControlCharacters(name);
     return version >= 1;
 }
 

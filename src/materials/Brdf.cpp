@@ -474,10 +474,6 @@ const LayerLayout<Light_BRDF>& lightTable() {
     return table;
 }
 
-void removeControlCharacters(std::u16string& text) {
-    text.erase(std::remove_if(text.begin(), text.end(), &platform::isControl), text.end());
-}
-
 const int kBaseRecordVersion = 4;
 
 }  // namespace
@@ -504,7 +500,7 @@ bool Base_BRDF::load(QuickArchive& ar) {
     const int version = readVersion(ar, 1, kBaseRecordVersion);
     if (version < 0) return false;
     ar.readWString(name);
-    removeControlCharacters(name);
+    platform::removeControlCharacters(name);
     if (version >= 2) ar.readByte(layer_flag_a);
     if (version >= 3) ar.readByte(layer_flag_b);
     if (version >= 4) ar.readByte(layer_flag_c);

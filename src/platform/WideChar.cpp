@@ -1,5 +1,7 @@
 #include "platform/WideChar.h"
 
+#include <algorithm>
+
 namespace platform {
 
 namespace {
@@ -16,6 +18,10 @@ int wcsicmp(const std::u16string& a, const std::u16string& b) {
     }
     if (a.size() == b.size()) return 0;
     return a.size() < b.size() ? -1 : 1;
+}
+
+void removeControlCharacters(std::u16string& text) {
+    text.erase(std::remove_if(text.begin(), text.end(), &isControl), text.end());
 }
 
 }  // namespace platform

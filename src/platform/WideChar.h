@@ -20,6 +20,9 @@ inline bool isDigit(char16_t c) { return c >= u'0' && c <= u'9'; }
 // Control characters: C0, DEL and C1.
 inline bool isControl(char16_t c) { return c < 0x20 || (c >= 0x7F && c <= 0x9F); }
 
+// Drops every control character from `text`, in place.
+void removeControlCharacters(std::u16string& text);
+
 // Ordering of map keys that differ only in the case of ASCII letters as one key.
 struct CaseInsensitiveLess {
     bool operator()(const std::u16string& a, const std::u16string& b) const {

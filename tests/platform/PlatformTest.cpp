@@ -119,6 +119,9 @@ TEST(WideChar, CaseFoldingIsAsciiOnly) {
     EXPECT_TRUE(platform::isControl(0x9F));
     EXPECT_TRUE(platform::isControl(0x7F));
     EXPECT_FALSE(platform::isControl(0xA0));
+    std::u16string text = u"\u0001Wo\u007Fod\u009F\u00A0\t";
+    platform::removeControlCharacters(text);
+    EXPECT_EQ(text, u"Wood\u00A0");
 }
 
 TEST(Uuid, RandomVersion4LowerCaseWithoutBraces) {
