@@ -24,6 +24,8 @@
 // branches inside a version is not a table; it is written by hand.
 #include <cstddef>
 #include <cstdint>
+#include <cstdio>
+#include <cstdlib>
 #include <string>
 #include <type_traits>
 
@@ -39,6 +41,27 @@ namespace OrvaneLumoCore {
 class BaseTexture;
 class BaseMaterial;
 
+// FieldRef::get checks that a row holds the type asked for in debug builds,
+// in sanitizer builds, and where ORVXML_FIELD_KIND_CHECKS is defined.
+#if !defined(NDEBUG) || defined(__SANITIZE_ADDRESS__) || defined(ORVXML_FIELD_KIND_CHECKS)
+constexpr bool kFieldKindChecks = true;
+#elif defined(__has_feature)
+#if __has_feature(address_sanitizer) || __has_feature(undefined_behavior_sanitizer)
+constexpr bool kFieldKindChecks = true;
+#else
+constexpr bool kFieldKindChecks = false;
+#endif
+#else
+constexpr bool kFieldKindChecks = false;
+#endif
+
+// A row was asked for a type it doesn't hold: a fault of the code, not of
+// the data, so the program stops.
+[[noreturn]] inline void fieldKindMismatch(int kind) {
+    std::fprintf(stderr, "FieldRef::get: the row of kind %d doesn't hold the type asked for\n", kind);
+    std::abort();
+}
+
 // A field of class C, of one of the types above; or none, for rows whose
 // bytes belong to no field.
 template <class C>
@@ -52,7 +75,7 @@ public:
     // Not explicit: a table row is written with the bare member pointer. The
     // parameter types are members of C, so a field declared in a base class
     // of C converts as well.
-    constexpr FieldRef() : kind_(Kind::None), i_(nullptr) {}
+    constexpr FieldRef() : kind_(Kind::None), bound_(false), i_(nullptr) {}
     constexpr FieldRef(bool C::*m) : kind_(Kind::Bool), b_(m) {}
     constexpr FieldRef(std::int32_t C::*m) : kind_(Kind::Int), i_(m) {}
     constexpr FieldRef(float C::*m) : kind_(Kind::Float), f_(m) {}
@@ -71,7 +94,11 @@ public:
     static constexpr FieldRef path(std::u16string C::*m) { return FieldRef(Kind::Path, m); }
     static constexpr FieldRef bool32(bool C::*m) { return FieldRef(Kind::Bool32, m); }
     // The bytes of `kind` that belong to no field (constant and dropped rows).
-    static constexpr FieldRef unbound(Kind kind) { return FieldRef(kind, static_cast<bool C::*>(nullptr)); }
+    static constexpr FieldRef unbound(Kind kind) {
+        FieldRef row(kind, static_cast<bool C::*>(nullptr));
+        row.bound_ = false;
+        return row;
+    }
 
     constexpr Kind kind() const { return kind_; }
     constexpr bool isChild() const { return kind_ == Kind::Texture || kind_ == Kind::Material; }
@@ -193,10 +220,20 @@ public:
         }
     }
 
-    // The field in `obj`; T is the type of the field's kind (std::u16string
-    // for a path, bool for a bool32).
+    // Whether the row holds a field of type T: T is the type of the field's
+    // kind (std::u16string for a path, bool for a bool32), and the row names
+    // a member (an unbound row doesn't).
+    template <class T>
+    constexpr bool holds() const {
+        return bound_ && kindHolds<T>(kind_);
+    }
+
+    // The field in `obj`. The row must hold a T (see holds()); builds with
+    // field checks stop the program when it doesn't, rather than read the
+    // wrong member of the union.
     template <class T>
     const T& get(const C& obj) const {
+        if (kFieldKindChecks && !holds<T>()) fieldKindMismatch(static_cast<int>(kind_));
         if constexpr (std::is_same<T, bool>::value) return obj.*b_;
         else if constexpr (std::is_same<T, std::int32_t>::value) return obj.*i_;
         else if constexpr (std::is_same<T, float>::value) return obj.*f_;
@@ -209,7 +246,10 @@ public:
         else if constexpr (std::is_same<T, std::string>::value) return obj.*n_;
         else if constexpr (std::is_same<T, boost::shared_ptr<BaseTexture>>::value) return obj.*x_;
         else if constexpr (std::is_same<T, boost::shared_ptr<BaseMaterial>>::value) return obj.*mt_;
-        else return obj.*s_;
+        else {
+            static_assert(std::is_same<T, std::u16string>::value, "not a type a field row holds");
+            return obj.*s_;
+        }
     }
     template <class T>
     T& get(C& obj) const {
@@ -223,10 +263,29 @@ public:
     }
 
 private:
+    template <class T>
+    static constexpr bool kindHolds(Kind k) {
+        if constexpr (std::is_same<T, bool>::value) return k == Kind::Bool || k == Kind::Bool32;
+        else if constexpr (std::is_same<T, std::int32_t>::value) return k == Kind::Int;
+        else if constexpr (std::is_same<T, float>::value) return k == Kind::Float;
+        else if constexpr (std::is_same<T, double>::value) return k == Kind::Double;
+        else if constexpr (std::is_same<T, Color>::value) return k == Kind::Color;
+        else if constexpr (std::is_same<T, AColor>::value) return k == Kind::AColor;
+        else if constexpr (std::is_same<T, Vector>::value) return k == Kind::Vector;
+        else if constexpr (std::is_same<T, Transform>::value) return k == Kind::Transform;
+        else if constexpr (std::is_same<T, TransformD>::value) return k == Kind::TransformD;
+        else if constexpr (std::is_same<T, std::string>::value) return k == Kind::NarrowText;
+        else if constexpr (std::is_same<T, boost::shared_ptr<BaseTexture>>::value) return k == Kind::Texture;
+        else if constexpr (std::is_same<T, boost::shared_ptr<BaseMaterial>>::value) return k == Kind::Material;
+        else if constexpr (std::is_same<T, std::u16string>::value) return k == Kind::WString || k == Kind::Path;
+        else return false;
+    }
+
     constexpr FieldRef(Kind kind, std::u16string C::*m) : kind_(kind), s_(m) {}
     constexpr FieldRef(Kind kind, bool C::*m) : kind_(kind), b_(m) {}
 
     Kind kind_;
+    bool bound_ = true;
     union {
         bool C::*b_;
         std::int32_t C::*i_;
