@@ -24,7 +24,9 @@ std::int32_t truncateToInt(float f) {
     return static_cast<std::int32_t>(f);
 }
 
-std::int32_t mixInt(std::int32_t a, std::int32_t b, float w) {
+// The mix of each animated value type.
+float mixValue(float a, float b, float w) { return mixReal(a, b, w); }
+std::int32_t mixValue(std::int32_t a, std::int32_t b, float w) {
     return truncateToInt(mixReal(static_cast<float>(a), static_cast<float>(b), w));
 }
 
@@ -88,65 +90,46 @@ double keyTime(const KeyTrack<V>& track, std::int64_t index) {
 
 }  // namespace
 
-// ---- AnimatedReal ------------------------------------------------------------
+// ---- AnimatedReal and AnimatedInt -------------------------------------------
 
-AnimatedReal::AnimatedReal(bool interpolate_) : interpolate(interpolate_) { reset(); }
+template <class V>
+AnimatedValue<V>::AnimatedValue(bool interpolate_) : interpolate(interpolate_) { reset(); }
 
-bool AnimatedReal::save(QuickArchive& ar) const {
+template <class V>
+bool AnimatedValue<V>::save(QuickArchive& ar) const {
     writeVersion(ar, 1);
     saveKeys(ar, track, &interpolate);
     return true;
 }
 
-bool AnimatedReal::load(QuickArchive& ar) {
+template <class V>
+bool AnimatedValue<V>::load(QuickArchive& ar) {
     const int version = readVersion(ar, 1, 1);
     reset();
     if (version < 0) return false;
     return loadKeys(ar, track, &interpolate);
 }
 
-float AnimatedReal::getValue(double time) const {
-    return track.value(time, interpolate, 0.0f, mixReal);
+template <class V>
+V AnimatedValue<V>::getValue(double time) const {
+    return track.value(time, interpolate, V(0), [](V a, V b, float w) { return mixValue(a, b, w); });
 }
 
-void AnimatedReal::setValue(float value, double time) { track.set(time, value); }
-std::size_t AnimatedReal::getKeyCount() const { return track.size(); }
-double AnimatedReal::getKeyTime(std::int64_t index) const { return keyTime(track, index); }
+template <class V>
+void AnimatedValue<V>::setValue(V value, double time) { track.set(time, value); }
+template <class V>
+std::size_t AnimatedValue<V>::getKeyCount() const { return track.size(); }
+template <class V>
+double AnimatedValue<V>::getKeyTime(std::int64_t index) const { return keyTime(track, index); }
 
-void AnimatedReal::reset() {
+template <class V>
+void AnimatedValue<V>::reset() {
     track.clear();
-    track.set(0.0, 0.0f);
+    track.set(0.0, V(0));
 }
 
-// ---- AnimatedInt -------------------------------------------------------------
-
-AnimatedInt::AnimatedInt(bool interpolate_) : interpolate(interpolate_) { reset(); }
-
-bool AnimatedInt::save(QuickArchive& ar) const {
-    writeVersion(ar, 1);
-    saveKeys(ar, track, &interpolate);
-    return true;
-}
-
-bool AnimatedInt::load(QuickArchive& ar) {
-    const int version = readVersion(ar, 1, 1);
-    reset();
-    if (version < 0) return false;
-    return loadKeys(ar, track, &interpolate);
-}
-
-std::int32_t AnimatedInt::getValue(double time) const {
-    return track.value(time, interpolate, 0, mixInt);
-}
-
-void AnimatedInt::setValue(std::int32_t value, double time) { track.set(time, value); }
-std::size_t AnimatedInt::getKeyCount() const { return track.size(); }
-double AnimatedInt::getKeyTime(std::int64_t index) const { return keyTime(track, index); }
-
-void AnimatedInt::reset() {
-    track.clear();
-    track.set(0.0, 0);
-}
+template class AnimatedValue<float>;
+template class AnimatedValue<std::int32_t>;
 
 // ---- AnimatedTransform -------------------------------------------------------
 

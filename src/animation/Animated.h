@@ -82,15 +82,18 @@ V KeyTrack<V>::value(double time, bool interpolate, const V& none, Lerp lerp) co
     return lerp(earlier->second, later->second, w);
 }
 
-class AnimatedReal : public OrvaneSerializable, public OrvaneXMLSerializable {
+// A value of type V (f32 or int32) keyed by time, and whether values between
+// two keys are mixed or held. An int32 is mixed as f32 and truncated back.
+template <class V>
+class AnimatedValue : public OrvaneSerializable, public OrvaneXMLSerializable {
 public:
-    explicit AnimatedReal(bool interpolate);
-    ~AnimatedReal() override = default;
+    explicit AnimatedValue(bool interpolate);
+    ~AnimatedValue() override = default;
 
     bool save(QuickArchive& ar) const override;
     bool load(QuickArchive& ar) override;
-    virtual float getValue(double time) const;
-    virtual void setValue(float value, double time);
+    virtual V getValue(double time) const;
+    virtual void setValue(V value, double time);
     virtual std::size_t getKeyCount() const;
     // Time of the key at `index` in ascending order; quiet NaN outside the keys.
     virtual double getKeyTime(std::int64_t index) const;
@@ -101,40 +104,29 @@ public:
     std::u16string getPluginName() const override { return std::u16string(); }
     std::u16string getAssetType() const override { return std::u16string(); }
 
-    bool operator==(const AnimatedReal& o) const {
+    bool operator==(const AnimatedValue& o) const {
         return interpolate == o.interpolate && track == o.track;
     }
-    bool operator!=(const AnimatedReal& o) const { return !(*this == o); }
+    bool operator!=(const AnimatedValue& o) const { return !(*this == o); }
 
-    KeyTrack<float> track;
+    KeyTrack<V> track;
     bool interpolate;
 };
 
-class AnimatedInt : public OrvaneSerializable, public OrvaneXMLSerializable {
+// Both are built once, in Animated.cpp.
+extern template class AnimatedValue<float>;
+extern template class AnimatedValue<std::int32_t>;
+
+// Classes of their own rather than aliases: a load's explanation names the
+// record's class.
+class AnimatedReal : public AnimatedValue<float> {
 public:
-    explicit AnimatedInt(bool interpolate);
-    ~AnimatedInt() override = default;
+    using AnimatedValue::AnimatedValue;
+};
 
-    bool save(QuickArchive& ar) const override;
-    bool load(QuickArchive& ar) override;
-    // Interpolated values are mixed as f32 and truncated back.
-    virtual std::int32_t getValue(double time) const;
-    virtual void setValue(std::int32_t value, double time);
-    virtual std::size_t getKeyCount() const;
-    virtual double getKeyTime(std::int64_t index) const;
-    virtual void reset();
-
-    void writeXml(AssetXmlWriter&, std::u16string) override {}
-    std::u16string getPluginName() const override { return std::u16string(); }
-    std::u16string getAssetType() const override { return std::u16string(); }
-
-    bool operator==(const AnimatedInt& o) const {
-        return interpolate == o.interpolate && track == o.track;
-    }
-    bool operator!=(const AnimatedInt& o) const { return !(*this == o); }
-
-    KeyTrack<std::int32_t> track;
-    bool interpolate;
+class AnimatedInt : public AnimatedValue<std::int32_t> {
+public:
+    using AnimatedValue::AnimatedValue;
 };
 
 // Always interpolates, each of the twelve numbers on its own.
