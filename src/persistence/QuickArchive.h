@@ -46,11 +46,15 @@ public:
 
     explicit QuickArchive(std::size_t blockCount = 1);
     QuickArchive(const void* data, std::size_t size);
-    // Reads the blocks of `source`, which outlives the archive and its
-    // copies. Such an archive is read-only: writes leave it unchanged.
+    // Reads the blocks of `source`, which outlives the archive. Such an
+    // archive is read-only: writes leave it unchanged.
     explicit QuickArchive(const BlockSource& source);
-    QuickArchive(const QuickArchive&) = default;
-    QuickArchive& operator=(const QuickArchive&) = default;
+    // An archive holds its blocks by pointer: a copy would share them, and a
+    // write to one would show in the other. It moves; it doesn't copy.
+    QuickArchive(const QuickArchive&) = delete;
+    QuickArchive& operator=(const QuickArchive&) = delete;
+    QuickArchive(QuickArchive&&) = default;
+    QuickArchive& operator=(QuickArchive&&) = default;
     virtual ~QuickArchive();
 
     // Primitives. Readers fill their argument only with bytes that exist.
