@@ -65,12 +65,7 @@ FileStatus loadFile(const std::u16string& path, std::string& reason, Load load) 
     LoadNote note;
     platform::RegularFile file;
     FileStatus status = FileStatus::Unreadable;
-    if (!file.open(path)) {
-        if (file.notRegular())
-            note.fail(LoadRule::NotRegularFile, 0);
-        else
-            note.fail(LoadRule::CannotOpen, 0, static_cast<std::uint64_t>(file.error()));
-    } else {
+    if (openForLoading(file, path, note)) {
         bool outOfMemory = false;
         try {
             KeepDocumentSun keepSun;

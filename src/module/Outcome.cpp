@@ -77,13 +77,7 @@ ConversionOutcome convertFile(const std::u16string& path, FileKind kind,
     // The file is opened once, as the containers open it; a path that isn't
     // a regular file is never read.
     platform::RegularFile file;
-    if (!file.open(path)) {
-        if (file.notRegular())
-            out.note.fail(LoadRule::NotRegularFile, 0);
-        else
-            out.note.fail(LoadRule::CannotOpen, 0, static_cast<std::uint64_t>(file.error()));
-        return out;
-    }
+    if (!openForLoading(file, path, out.note)) return out;
     out.fileSize = file.size();
     // What the failed conversion had built is freed by the time it is caught,
     // so the outcome itself can still be made.

@@ -8,6 +8,7 @@
 #include <cxxabi.h>
 
 #include "persistence/QuickArchive.h"
+#include "platform/File.h"
 
 namespace OrvaneLumoCore {
 
@@ -120,6 +121,13 @@ RecordScope::RecordScope(QuickArchive& ar, const std::type_info& type, std::int6
 }
 
 RecordScope::~RecordScope() { ar_.trace.open.pop_back(); }
+
+bool openForLoading(platform::RegularFile& file, const std::u16string& path, LoadNote& note) {
+    if (file.open(path)) return true;
+    note = LoadNote();
+    return file.notRegular() ? note.fail(LoadRule::NotRegularFile, 0)
+                             : note.fail(LoadRule::CannotOpen, 0, static_cast<std::uint64_t>(file.error()));
+}
 
 void RecordScope::noteRefusal() {
     if (ar_.trace.note.isSet()) return;

@@ -9,6 +9,10 @@
 #include <typeinfo>
 #include <vector>
 
+namespace platform {
+class RegularFile;
+}
+
 namespace OrvaneLumoCore {
 
 class QuickArchive;
@@ -76,6 +80,11 @@ std::string describe(const LoadNote& note);
 // read that went past the end of the data makes it DataEndsEarly at that end.
 void noteFailure(QuickArchive& ar, LoadRule rule, std::uint64_t offset, std::uint64_t value = 0,
                  const std::type_info* member = nullptr);
+
+// Opens `path` into `file` for a load. A path that can't be opened, or that
+// names no regular file, replaces `note` with why (the system's error number
+// as its value) and gives false; the file is then never read.
+bool openForLoading(platform::RegularFile& file, const std::u16string& path, LoadNote& note);
 
 // Keeps one record on the archive's list of open records while it is read.
 class RecordScope {

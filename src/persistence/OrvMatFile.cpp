@@ -214,12 +214,7 @@ bool OrvMatFile::save(std::ostream& out) {
 
 bool OrvMatFile::load(const std::u16string& path) {
     platform::RegularFile file;
-    if (!file.open(path)) {
-        loadNote = LoadNote();
-        return file.notRegular() ? loadNote.fail(LoadRule::NotRegularFile, 0)
-                                 : loadNote.fail(LoadRule::CannotOpen, 0,
-                                                 static_cast<std::uint64_t>(file.error()));
-    }
+    if (!openForLoading(file, path, loadNote)) return false;
     return load(file);
 }
 

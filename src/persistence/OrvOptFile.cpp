@@ -12,12 +12,7 @@ namespace OrvaneLumoCore {
 
 bool OrvOptFile::load(AllOptions& options, const std::u16string& path) {
     platform::RegularFile file;
-    if (!file.open(path)) {
-        loadNote = LoadNote();
-        return file.notRegular() ? loadNote.fail(LoadRule::NotRegularFile, 0)
-                                 : loadNote.fail(LoadRule::CannotOpen, 0,
-                                                 static_cast<std::uint64_t>(file.error()));
-    }
+    if (!openForLoading(file, path, loadNote)) return false;
     return load(options, file);
 }
 
