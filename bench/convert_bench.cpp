@@ -12,7 +12,7 @@
 #include "BenchLibrary.h"
 #include "materials/MaterialAssets.h"
 #include "module/Extension.h"
-#include "persistence/OrvMatFile.h"
+#include "module/OrvMatFile.h"
 #include "platform/NumberFormat.h"
 #include "xml/AssetXmlWriter.h"
 

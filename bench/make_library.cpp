@@ -4,7 +4,7 @@
 #include <fstream>
 
 #include "BenchLibrary.h"
-#include "persistence/OrvMatFile.h"
+#include "module/OrvMatFile.h"
 
 int main(int argc, char** argv) {
     if (argc != 2) {

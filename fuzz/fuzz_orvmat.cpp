@@ -4,7 +4,7 @@
 #include <cstddef>
 #include <cstdint>
 
-#include "persistence/OrvMatFile.h"
+#include "module/OrvMatFile.h"
 #include "persistence/QuickArchive.h"
 
 using namespace OrvaneLumoCore;

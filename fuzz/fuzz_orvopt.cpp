@@ -4,8 +4,8 @@
 #include <cstddef>
 #include <cstdint>
 
+#include "module/OrvOptFile.h"
 #include "options/AllOptions.h"
-#include "persistence/OrvOptFile.h"
 #include "persistence/QuickArchive.h"
 #include "platform/File.h"
 

@@ -9,7 +9,7 @@
 #include "animation/Animated.h"
 #include "animation/BaseCamera.h"
 #include "persistence/Serializable.h"
-#include "persistence/Types.h"
+#include "values/Types.h"
 
 namespace OrvaneLumoCore {
 

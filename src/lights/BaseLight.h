@@ -23,6 +23,10 @@ public:
     void writeXml(AssetXmlWriter& writer, std::u16string url) override {}
     std::u16string getPluginName() const override { return std::u16string(); }
     std::u16string getAssetType() const override { return u"light"; }
+    // A sun's Asset stands under the url that refers to it.
+    const std::u16string* referenceName(std::u16string& scratch) const override {
+        return getType() == kSunLightType ? nullptr : OrvaneXMLSerializable::referenceName(scratch);
+    }
 };
 
 typedef boost::shared_ptr<BaseLight> LightPtr;

@@ -8,7 +8,7 @@
 
 #include "animation/Animated.h"
 #include "lights/LightFrame.h"
-#include "persistence/Types.h"
+#include "values/Types.h"
 
 namespace OrvaneLumoCore {
 

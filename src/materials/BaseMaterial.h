@@ -58,6 +58,8 @@ public:
     void writeXml(AssetXmlWriter& writer, std::u16string url) override;
     std::u16string getPluginName() const override;
     std::u16string getAssetType() const override;
+    // A material is referred to by its name.
+    const std::u16string* referenceName(std::u16string&) const override { return &name; }
 
     std::u16string name;
     std::u16string uuid;

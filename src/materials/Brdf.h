@@ -7,8 +7,8 @@
 
 #include "materials/Base_BRDF.h"
 #include "persistence/FamilyOf.h"
-#include "persistence/Types.h"
 #include "textures/BaseTexture.h"
+#include "values/Types.h"
 
 namespace OrvaneLumoCore {
 

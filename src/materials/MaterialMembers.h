@@ -4,8 +4,6 @@
 // plugin references of their own Assets.
 #include <string>
 
-#include <boost/any.hpp>
-
 #include "materials/BaseMaterial.h"
 #include "persistence/Record.h"
 #include "textures/BaseTexture.h"
@@ -56,13 +54,13 @@ inline void writeTextureAssets(AssetXmlWriter& writer, const TexturePtr& texture
 // "/" and the child's name; an absent child gives the parameter without value.
 inline void writeMaterialRef(AssetXmlWriter& writer, const WriterText& name, const MaterialPtr& child,
                              const std::u16string& url) {
-    writer.writePluginRef(name, boost::any(child), url);
+    writer.writePluginRef(name, child.get(), url);
 }
 
 // A `plugin` parameter that refers to a texture under its slot url.
 inline void writeTextureRef(AssetXmlWriter& writer, const WriterText& name, const TexturePtr& texture,
                             const std::u16string& slotUrl) {
-    writer.writePluginRef(name, boost::any(texture), slotUrl);
+    writer.writePluginRef(name, texture.get(), slotUrl);
 }
 
 // The head of a material's own Asset: openAsset (asset type "material"),

@@ -11,8 +11,8 @@
 #include <string>
 
 #include "materials/MaterialRows.h"
-#include "persistence/Types.h"
 #include "textures/BaseTexture.h"
+#include "values/Types.h"
 
 namespace OrvaneLumoCore {
 

@@ -7,8 +7,8 @@
 #include <string>
 
 #include "materials/MaterialOf.h"
-#include "persistence/Types.h"
 #include "textures/BaseTexture.h"
+#include "values/Types.h"
 
 namespace OrvaneLumoCore {
 

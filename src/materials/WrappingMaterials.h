@@ -17,8 +17,8 @@
 #include <vector>
 
 #include "materials/MaterialRows.h"
-#include "persistence/Types.h"
 #include "textures/BaseTexture.h"
+#include "values/Types.h"
 
 namespace OrvaneLumoCore {
 

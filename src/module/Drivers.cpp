@@ -2,10 +2,10 @@
 // file comes back as its text. The text goes to a sink as it is made.
 #include "materials/MaterialAssets.h"
 #include "module/Extension.h"
+#include "module/OrvMatFile.h"
+#include "module/OrvOptFile.h"
 #include "module/TextFallback.h"
 #include "options/AllOptions.h"
-#include "persistence/OrvMatFile.h"
-#include "persistence/OrvOptFile.h"
 #include "xml/AssetXmlWriter.h"
 
 namespace OrvaneLumoCore {

@@ -1,7 +1,7 @@
 #include "module/Extension.h"
 
-#include "persistence/OrvMatFile.h"
-#include "persistence/OrvOptFile.h"
+#include "module/OrvMatFile.h"
+#include "module/OrvOptFile.h"
 #include "platform/WideChar.h"
 #include "xml/XmlSink.h"
 

@@ -5,10 +5,10 @@
 
 #include "lights/SunIesDome.h"
 #include "module/Extension.h"
+#include "module/OrvMatFile.h"
+#include "module/OrvOptFile.h"
 #include "module/TextFallback.h"
 #include "options/AllOptions.h"
-#include "persistence/OrvMatFile.h"
-#include "persistence/OrvOptFile.h"
 #include "platform/File.h"
 #include "xml/XmlSink.h"
 

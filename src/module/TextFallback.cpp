@@ -3,8 +3,8 @@
 #include <cstring>
 #include <string>
 
-#include "persistence/QuickArchive.h"
 #include "platform/File.h"
+#include "platform/Text.h"
 
 namespace OrvaneLumoCore {
 
@@ -22,7 +22,7 @@ std::u16string readFileAsText(const std::u16string& path) {
         text.resize(start + got);
         if (std::memchr(text.data() + start, 0, got) || got < kChunk) break;
     }
-    return utf8ToWide(text);
+    return platform::utf8ToWide(text);
 }
 
 }  // namespace OrvaneLumoCore

@@ -10,8 +10,8 @@
 #include "animation/Camera.h"
 #include "options/OptionRecords.h"
 #include "options/OrvaneOptionsBase.h"
-#include "persistence/Types.h"
 #include "textures/BaseTexture.h"
+#include "values/Types.h"
 
 namespace OrvaneLumoCore {
 

@@ -10,7 +10,7 @@
 #include <cstring>
 #include <string>
 
-#include "persistence/Types.h"
+#include "values/Types.h"
 
 namespace LumoUtils {
 

@@ -8,8 +8,6 @@
 #include <string>
 #include <vector>
 
-#include <boost/any.hpp>
-
 #include "options/AllOptions.h"
 #include "xml/AssetScope.h"
 #include "xml/ParamRows.h"
@@ -454,7 +452,7 @@ void writeHooked(AssetXmlWriter& w, const AllOptions& o, const ParamRow<D>& row,
     const char* name = row.name;
     const WriterText label(row.label);
     if (isTexture(row)) {
-        w.writePluginRef(name, boost::any(row.field.get<TexturePtr>(o)), slotUrl(blockUrl, row), label);
+        w.writePluginRef(name, row.field.get<TexturePtr>(o).get(), slotUrl(blockUrl, row), label);
         return;
     }
     switch (row.hook) {

@@ -19,13 +19,14 @@
 #include <boost/shared_ptr.hpp>
 
 #include "persistence/LoadNote.h"
-#include "persistence/Types.h"
+#include "platform/Text.h"
+#include "values/Types.h"
 
 namespace OrvaneLumoCore {
 
-std::u16string utf8ToWide(const std::string& s);
-std::u16string utf8ToWide(const char* data, std::size_t size);
-std::string wideToUtf8(const std::u16string& s);
+// The model's text conversions, under the names its code uses.
+using platform::utf8ToWide;
+using platform::wideToUtf8;
 
 class QuickArchive {
 public:

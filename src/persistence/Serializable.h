@@ -11,6 +11,15 @@ public:
     virtual void writeXml(AssetXmlWriter& writer, std::u16string url) = 0;
     virtual std::u16string getPluginName() const = 0;
     virtual std::u16string getAssetType() const = 0;
+    // What a `plugin` parameter that refers to the object writes behind the
+    // slot url and "/": the plugin name unless the class says otherwise, kept
+    // in `scratch` if made for the call. Null for an object whose Asset
+    // stands under the slot url itself. The writer learns it here, so it
+    // names no model class.
+    virtual const std::u16string* referenceName(std::u16string& scratch) const {
+        scratch = getPluginName();
+        return &scratch;
+    }
 };
 
 namespace OrvaneLumoCore {

@@ -22,4 +22,12 @@ std::u16string decodeAnsi(const char* data, std::size_t size);
 // Encodes UTF-16 as UTF-8. A lone surrogate becomes U+FFFD.
 std::string encodeUtf8(const char16_t* data, std::size_t size);
 
+// The system's conversions of all narrow text, built on the three above:
+// narrow text ends at its first zero byte and is UTF-8 if it decodes
+// strictly, else the ANSI code page; wide text ends at its first zero unit
+// and becomes UTF-8.
+std::u16string utf8ToWide(const char* data, std::size_t size);
+std::u16string utf8ToWide(const std::string& s);
+std::string wideToUtf8(const std::u16string& s);
+
 }  // namespace platform

@@ -3,9 +3,9 @@
 #include <cstdint>
 #include <string>
 
-#include "persistence/Types.h"
 #include "persistence/FamilyOf.h"
 #include "textures/BaseTexture.h"
+#include "values/Types.h"
 
 namespace OrvaneLumoCore {
 

@@ -15,9 +15,9 @@
 
 #include "persistence/FamilyOf.h"
 #include "persistence/FieldRows.h"
-#include "persistence/Types.h"
 #include "textures/BaseTexture.h"
 #include "textures/BaseUVW.h"
+#include "values/Types.h"
 
 namespace OrvaneLumoCore {
 

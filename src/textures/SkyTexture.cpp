@@ -1,6 +1,5 @@
 #include "textures/SkyTexture.h"
 
-#include <boost/any.hpp>
 #include <boost/make_shared.hpp>
 
 #include "persistence/QuickArchive.h"
@@ -104,7 +103,7 @@ void SkyTexture::writeXml(AssetXmlWriter& w, std::u16string url) {
     }
     frame.open();
     // A sun's reference is the url alone, without a plugin name behind it.
-    w.writePluginRef("sun", boost::any(sun), reference);
+    w.writePluginRef("sun", sun.get(), reference);
     frame.close();
 }
 

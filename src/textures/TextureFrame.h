@@ -47,9 +47,7 @@
 // gives clone and isEqual, and a class's finishClone and sameContent use
 // cloneChild and childrenEqual for each slot.
 #include <string>
-#include <type_traits>
 
-#include <boost/any.hpp>
 #include <boost/shared_ptr.hpp>
 
 #include "persistence/Serializable.h"
@@ -57,17 +55,11 @@
 
 namespace OrvaneLumoCore {
 
-class BaseTexture;
-class BaseMaterial;
-class BaseUVW;
-class BaseCamera;
-class BaseBitmap;
-class BaseLight;
-
-// A declared child slot as the parameters refer to it.
+// A declared child slot as the parameters refer to it. The owner of the
+// frame holds the child while the frame is written.
 struct SlotRef {
-    boost::any child;     // shared_ptr of the slot's root type; may hold null
-    std::u16string url;   // the slot's url, without the child's plugin name
+    const OrvaneXMLSerializable* child = nullptr;  // may be null
+    std::u16string url;                            // the slot's url, without the child's plugin name
 };
 
 // What the url given to TextureFrame is.
@@ -84,16 +76,11 @@ public:
     TextureFrame& operator=(const TextureFrame&) = delete;
 
     // Declares the next child slot: forms its url and writes the child's
-    // Assets now if the child is present. `T` is the slot's root type (the
-    // field's declared type), which is what the writer recognises.
+    // Assets now if the child is present.
     template <class T>
     SlotRef slot(const boost::shared_ptr<T>& child, const char16_t* segment) {
-        static_assert(std::is_same<T, BaseTexture>::value || std::is_same<T, BaseMaterial>::value ||
-                          std::is_same<T, BaseUVW>::value || std::is_same<T, BaseCamera>::value ||
-                          std::is_same<T, BaseBitmap>::value || std::is_same<T, BaseLight>::value,
-                      "a slot holds a pointer of one of the six root types");
         SlotRef ref;
-        ref.child = child;
+        ref.child = child.get();
         ref.url = slotUrl(segment);
         if (child) child->writeXml(writer_, ref.url);
         return ref;

@@ -8,10 +8,10 @@
 #include <string>
 
 #include "animation/TransformComponents.h"
-#include "persistence/Types.h"
 #include "persistence/FamilyOf.h"
 #include "textures/BaseTexture.h"
 #include "textures/BaseUVW.h"
+#include "values/Types.h"
 
 namespace OrvaneLumoCore {
 

@@ -6,15 +6,9 @@
 #include <emmintrin.h>
 #endif
 
-#include "animation/BaseCamera.h"
-#include "animation/TransformComponents.h"
-#include "lights/BaseLight.h"
-#include "materials/BaseMaterial.h"
-#include "persistence/QuickArchive.h"
+#include "persistence/Serializable.h"
 #include "platform/NumberFormat.h"
-#include "textures/BaseBitmap.h"
-#include "textures/BaseTexture.h"
-#include "textures/BaseUVW.h"
+#include "platform/Text.h"
 
 using namespace OrvaneLumoCore;
 
@@ -69,7 +63,7 @@ void WriterText::appendTo(std::u16string& out) const {
     out.resize(old + size_);
     if (!widenAscii(narrow_, size_, &out[old])) {
         out.resize(old);
-        out += utf8ToWide(narrow_, size_);
+        out += platform::utf8ToWide(narrow_, size_);
     }
 }
 
@@ -225,7 +219,7 @@ void AssetXmlWriter::putText(const WriterText& text) {
         pos_ += text.size_;
         return;
     }
-    const std::u16string wide = utf8ToWide(text.narrow_, text.size_);
+    const std::u16string wide = platform::utf8ToWide(text.narrow_, text.size_);
     put(wide.data(), wide.size());
 }
 
@@ -505,9 +499,9 @@ void AssetXmlWriter::writeFileName(const WriterText& name, const std::u16string&
 void AssetXmlWriter::vectorBlock(const Vector& v) {
     line(u"<vector>\n");
     ++indent_;
-    numberLine(u"<x>", v[0], u"</x>\n");
-    numberLine(u"<y>", v[1], u"</y>\n");
-    numberLine(u"<z>", v[2], u"</z>\n");
+    numberLine(u"<x>", v.x, u"</x>\n");
+    numberLine(u"<y>", v.y, u"</y>\n");
+    numberLine(u"<z>", v.z, u"</z>\n");
     --indent_;
     line(u"</vector>\n");
 }
@@ -560,18 +554,18 @@ void AssetXmlWriter::writeTransform(const WriterText& name, const Transform& val
 }
 
 void AssetXmlWriter::componentParameter(Word open, const WriterText& name,
-                                        const TransformComponents& c, const WriterText& label) {
+                                        const TransformParts& c, const WriterText& label) {
     head(open, name, kPlainMiddle, false, label);
     blockStart();
-    numberLine(u"<x_rotation>", c.rotation[0], u"</x_rotation>\n");
-    numberLine(u"<y_rotation>", c.rotation[1], u"</y_rotation>\n");
-    numberLine(u"<z_rotation>", c.rotation[2], u"</z_rotation>\n");
-    numberLine(u"<x_scale>", c.scale[0], u"</x_scale>\n");
-    numberLine(u"<y_scale>", c.scale[1], u"</y_scale>\n");
-    numberLine(u"<z_scale>", c.scale[2], u"</z_scale>\n");
-    numberLine(u"<x_offset>", c.offset[0], u"</x_offset>\n");
-    numberLine(u"<y_offset>", c.offset[1], u"</y_offset>\n");
-    numberLine(u"<z_offset>", c.offset[2], u"</z_offset>\n");
+    numberLine(u"<x_rotation>", c.rotation.x, u"</x_rotation>\n");
+    numberLine(u"<y_rotation>", c.rotation.y, u"</y_rotation>\n");
+    numberLine(u"<z_rotation>", c.rotation.z, u"</z_rotation>\n");
+    numberLine(u"<x_scale>", c.scale.x, u"</x_scale>\n");
+    numberLine(u"<y_scale>", c.scale.y, u"</y_scale>\n");
+    numberLine(u"<z_scale>", c.scale.z, u"</z_scale>\n");
+    numberLine(u"<x_offset>", c.offset.x, u"</x_offset>\n");
+    numberLine(u"<y_offset>", c.offset.y, u"</y_offset>\n");
+    numberLine(u"<z_offset>", c.offset.z, u"</z_offset>\n");
     const Word mirrors[3][2] = {{u"<x_mirror>", u"</x_mirror>\n"},
                                 {u"<y_mirror>", u"</y_mirror>\n"},
                                 {u"<z_mirror>", u"</z_mirror>\n"}};
@@ -584,13 +578,13 @@ void AssetXmlWriter::componentParameter(Word open, const WriterText& name,
     blockEnd();
 }
 
-void AssetXmlWriter::writeComponentMatrix(const WriterText& name, const TransformComponents& components,
+void AssetXmlWriter::writeComponentMatrix(const WriterText& name, const TransformParts& components,
                                           const WriterText& label) {
     componentParameter(u"<parameter type=\"componentMatrix\" name=\"", name, components, label);
 }
 
 void AssetXmlWriter::writeComponentTransform(const WriterText& name,
-                                             const TransformComponents& components,
+                                             const TransformParts& components,
                                              const WriterText& label) {
     componentParameter(u"<parameter type=\"componentTransform\" name=\"", name, components, label);
 }
@@ -602,58 +596,22 @@ void AssetXmlWriter::writePlugin(const WriterText& name, const WriterText& text,
     inlineEnd();
 }
 
-namespace {
-
-// Stands for a sun, whose Asset stands under the url itself.
-const std::u16string kUrlItself;
-
-// The name behind the url's "/" in a reference: null if the pointer is null
-// (or of a type outside the six roots, which no caller passes); kUrlItself
-// for a sun.
-const std::u16string* referenceName(const boost::any& reference, std::u16string& scratch) {
-    if (auto p = boost::any_cast<boost::shared_ptr<BaseTexture>>(&reference)) {
-        if (!*p) return nullptr;
-        return &(scratch = (*p)->getPluginName());
-    }
-    if (auto p = boost::any_cast<boost::shared_ptr<BaseMaterial>>(&reference)) {
-        return *p ? &(*p)->name : nullptr;
-    }
-    if (auto p = boost::any_cast<boost::shared_ptr<BaseUVW>>(&reference)) {
-        if (!*p) return nullptr;
-        return &(scratch = (*p)->getPluginName());
-    }
-    if (auto p = boost::any_cast<boost::shared_ptr<BaseCamera>>(&reference)) {
-        if (!*p) return nullptr;
-        return &(scratch = (*p)->getPluginName());
-    }
-    if (auto p = boost::any_cast<boost::shared_ptr<BaseBitmap>>(&reference)) {
-        if (!*p) return nullptr;
-        return &(scratch = (*p)->getPluginName());
-    }
-    if (auto p = boost::any_cast<boost::shared_ptr<BaseLight>>(&reference)) {
-        if (!*p) return nullptr;
-        if ((*p)->getType() == BaseLight::kSunLightType) return &kUrlItself;
-        return &(scratch = (*p)->getPluginName());
-    }
-    return nullptr;
-}
-
-}  // namespace
-
-// A plugin parameter whose value is the child's url, `url` and `urlTail`,
-// then "/" and `child` unless the child stands under the url itself; no
-// value when `child` is null.
+// A plugin parameter whose value is the url, `url` and `urlTail`, then "/"
+// and the reference's name unless its Asset stands under the url itself; no
+// value when `reference` is null.
 void AssetXmlWriter::pluginRef(const WriterText& name, const WriterText& label,
-                               const std::u16string* child, const std::u16string& url,
+                               const OrvaneXMLSerializable* reference, const std::u16string& url,
                                const WriterText& urlTail) {
     head(u"<parameter type=\"plugin\" name=\"", name, kPlainMiddle, false, label);
-    if (child) {
+    if (reference) {
+        std::u16string scratch;
+        const std::u16string* child = reference->referenceName(scratch);
         line(u"<value>");
         putEscaped(url.data(), url.size(), Place::Content);
         // The tail is a slot word, plain letters, so escaping the two parts
         // one after the other gives what escaping the whole url gives.
         if (!urlTail.empty()) putEscaped(urlTail, Place::Content);
-        if (child != &kUrlItself) {
+        if (child) {
             put(u'/');
             putPlain(*child, Place::Content);
         }
@@ -664,17 +622,14 @@ void AssetXmlWriter::pluginRef(const WriterText& name, const WriterText& label,
     done();
 }
 
-void AssetXmlWriter::writePluginRef(const WriterText& name, const boost::any& reference,
+void AssetXmlWriter::writePluginRef(const WriterText& name, const OrvaneXMLSerializable* reference,
                                     const std::u16string& url, const WriterText& label) {
-    std::u16string scratch;
-    pluginRef(name, label, referenceName(reference, scratch), url, WriterText());
+    pluginRef(name, label, reference, url, WriterText());
 }
 
-void AssetXmlWriter::writeTextureRef(const WriterText& name, const BaseTexture* texture,
+void AssetXmlWriter::writeTextureRef(const WriterText& name, const OrvaneXMLSerializable* texture,
                                      const std::u16string& slotPrefix, const char16_t* slotWord) {
-    std::u16string scratch;
-    if (texture) scratch = texture->getPluginName();
-    pluginRef(name, WriterText(), texture ? &scratch : nullptr, slotPrefix, slotWord);
+    pluginRef(name, WriterText(), texture, slotPrefix, slotWord);
 }
 
 void AssetXmlWriter::openList(const WriterText& name, const WriterText& listType, const WriterText& label) {

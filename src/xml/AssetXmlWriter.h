@@ -11,16 +11,11 @@
 #include <string>
 #include <vector>
 
-#include <boost/any.hpp>
-
-#include "persistence/Types.h"
+#include "values/Types.h"
 #include "xml/XmlOptions.h"
 #include "xml/XmlSink.h"
 
-namespace OrvaneLumoCore {
-class BaseTexture;
-class TransformComponents;
-}
+class OrvaneXMLSerializable;
 
 // A text argument of the writer: wide, or narrow (UTF-8, else the ANSI code
 // page, like every narrow text of the system). Holds a view, no copy.
@@ -104,20 +99,19 @@ public:
                      const WriterText& label = {});
     void writeTransform(const WriterText& name, const OrvaneLumoCore::Transform& value,
                         const WriterText& label = {});
-    void writeComponentMatrix(const WriterText& name,
-                              const OrvaneLumoCore::TransformComponents& components,
+    void writeComponentMatrix(const WriterText& name, const OrvaneLumoCore::TransformParts& components,
                               const WriterText& label = {});
-    void writeComponentTransform(const WriterText& name,
-                                 const OrvaneLumoCore::TransformComponents& components,
+    void writeComponentTransform(const WriterText& name, const OrvaneLumoCore::TransformParts& components,
                                  const WriterText& label = {});
     void writePlugin(const WriterText& name, const WriterText& text, const WriterText& label = {});
-    // `reference` holds a boost::shared_ptr of BaseTexture, BaseMaterial,
-    // BaseUVW, BaseCamera, BaseBitmap or BaseLight; `url` is the child's slot url.
-    void writePluginRef(const WriterText& name, const boost::any& reference, const std::u16string& url,
-                        const WriterText& label = {});
+    // A reference to the model object `reference` (a texture, material, UVW
+    // generator, camera, bitmap or light) under its slot url `url`: the url,
+    // "/" and the object's referenceName. No value if `reference` is null.
+    void writePluginRef(const WriterText& name, const OrvaneXMLSerializable* reference,
+                        const std::u16string& url, const WriterText& label = {});
     // The same for a texture in a slot, whose url is `slotPrefix` followed by
-    // `slotWord`: no url string and no boost::any are made per parameter.
-    void writeTextureRef(const WriterText& name, const OrvaneLumoCore::BaseTexture* texture,
+    // `slotWord`: no url string is made per parameter.
+    void writeTextureRef(const WriterText& name, const OrvaneXMLSerializable* texture,
                          const std::u16string& slotPrefix, const char16_t* slotWord);
     void openList(const WriterText& name, const WriterText& listType, const WriterText& label = {});
     void writeListEntry(const std::u16string& text);
@@ -220,14 +214,13 @@ private:
     void numberLine(Word open, double value, Word close);
     void head(Word open, const WriterText& name, Word middle, bool isUserData, const WriterText& label);
     void inlineEnd();
-    void pluginRef(const WriterText& name, const WriterText& label, const std::u16string* child,
+    void pluginRef(const WriterText& name, const WriterText& label, const OrvaneXMLSerializable* reference,
                    const std::u16string& url, const WriterText& urlTail);
     void blockStart();
     void blockEnd();
     void vectorBlock(const OrvaneLumoCore::Vector& v);
     void componentParameter(Word open, const WriterText& name,
-                            const OrvaneLumoCore::TransformComponents& components,
-                            const WriterText& label);
+                            const OrvaneLumoCore::TransformParts& components, const WriterText& label);
 
     // The sink of a writer over a string.
     struct OwnString final : XmlSink {

@@ -6,7 +6,7 @@
 #include "materials/MaterialTestUtil.h"
 #include "materials/MaterialTree.h"
 #include "materials/WrapperAssets.h"
-#include "persistence/OrvMatFile.h"
+#include "module/OrvMatFile.h"
 #include "support/TempFiles.h"
 #include "textures/ProceduralTextures.h"
 

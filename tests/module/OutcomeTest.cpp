@@ -5,9 +5,9 @@
 #include <string>
 
 #include "lights/SunIesDome.h"
+#include "module/OrvMatFile.h"
+#include "module/OrvOptFile.h"
 #include "module/Outcome.h"
-#include "persistence/OrvMatFile.h"
-#include "persistence/OrvOptFile.h"
 #include "persistence/QuickArchive.h"
 #include "support/TempFiles.h"
 

@@ -9,7 +9,7 @@
 #include <sstream>
 
 #include "OptionBytes.h"
-#include "persistence/OrvOptFile.h"
+#include "module/OrvOptFile.h"
 #include "support/TempFiles.h"
 #include "textures/BasicTextures.h"
 

@@ -4,9 +4,9 @@
 
 #include <string>
 
+#include "module/OrvMatFile.h"
+#include "module/OrvOptFile.h"
 #include "options/AllOptions.h"
-#include "persistence/OrvMatFile.h"
-#include "persistence/OrvOptFile.h"
 #include "support/PosixFiles.h"
 
 using namespace OrvaneLumoCore;

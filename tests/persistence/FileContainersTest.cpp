@@ -5,9 +5,9 @@
 #include <sstream>
 #include <string>
 
+#include "module/OrvMatFile.h"
+#include "module/OrvOptFile.h"
 #include "options/AllOptions.h"
-#include "persistence/OrvMatFile.h"
-#include "persistence/OrvOptFile.h"
 #include "platform/File.h"
 #include "support/TempFiles.h"
 

@@ -5,8 +5,8 @@
 #include <sstream>
 #include <string>
 
+#include "module/OrvMatFile.h"
 #include "options/AllOptions.h"
-#include "persistence/OrvMatFile.h"
 #include "persistence/QuickArchive.h"
 #include "persistence/Record.h"
 

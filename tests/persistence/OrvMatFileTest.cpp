@@ -3,7 +3,7 @@
 #include <sstream>
 #include <string>
 
-#include "persistence/OrvMatFile.h"
+#include "module/OrvMatFile.h"
 
 using namespace OrvaneLumoCore;
 

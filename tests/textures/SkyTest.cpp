@@ -6,7 +6,7 @@
 
 #include "materials/Brdf.h"
 #include "materials/LayeredMaterials.h"
-#include "persistence/OrvMatFile.h"
+#include "module/OrvMatFile.h"
 #include "support/Golden.h"
 #include "support/LightFixtures.h"
 #include "textures/SkyTexture.h"

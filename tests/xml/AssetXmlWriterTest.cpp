@@ -78,10 +78,10 @@ TEST(AssetXmlWriter, EveryFormOfParameter) {
         w.closeList();
         // A plugin reference: a texture's url with its plugin name, none, the
         // document sun's url alone, another light's with its plugin name.
-        w.writePluginRef("tex", boost::any(TexturePtr(new FakeTexture)), u"/M&N/x");
-        w.writePluginRef("tex", boost::any(TexturePtr()), u"/M");
-        w.writePluginRef("tex", boost::any(LightPtr(new FakeLight(5))), u"/Sun");
-        w.writePluginRef("tex", boost::any(LightPtr(new FakeLight(2))), u"/L");
+        w.writePluginRef("tex", TexturePtr(new FakeTexture).get(), u"/M&N/x");
+        w.writePluginRef("tex", nullptr, u"/M");
+        w.writePluginRef("tex", LightPtr(new FakeLight(5)).get(), u"/Sun");
+        w.writePluginRef("tex", LightPtr(new FakeLight(2)).get(), u"/L");
     });
     testsupport::expectGolden("xml/golden/forms.xml", forms);
 }
@@ -96,7 +96,7 @@ TEST(AssetXmlWriter, TextureSlotReferenceMatchesPluginReference) {
             SCOPED_TRACE(narrow(prefix));
             EXPECT_EQ(param([&](AssetXmlWriter& w) { w.writeTextureRef("tex", child.get(), prefix, u"color_texture"); }),
                       param([&](AssetXmlWriter& w) {
-                          w.writePluginRef("tex", boost::any(child), prefix + u"color_texture");
+                          w.writePluginRef("tex", child.get(), prefix + u"color_texture");
                       }));
         }
     }

@@ -108,7 +108,7 @@ const Operation kOperations[] = {
      [](AssetXmlWriter& w, const std::u16string& a, const std::u16string& c) {
          boost::shared_ptr<MaterialLayeredBRDF> material(new MaterialLayeredBRDF);
          material->name = c;
-         w.writePluginRef(a, boost::any(MaterialPtr(material)), u"/" + c, a);
+         w.writePluginRef(a, material.get(), u"/" + c, a);
      }},
     {"list entries",
      [](AssetXmlWriter& w, const std::u16string& a, const std::u16string& c) {

@@ -9,7 +9,7 @@
 #include "Samples.h"
 #include "materials/Brdf.h"
 #include "materials/LayeredMaterials.h"
-#include "persistence/OrvMatFile.h"
+#include "module/OrvMatFile.h"
 #include "persistence/QuickArchive.h"
 #include "textures/Bitmaps.h"
 #include "textures/UVWGenerators.h"

@@ -7,7 +7,7 @@
 #include "Samples.h"
 #include "materials/Brdf.h"
 #include "materials/LayeredMaterials.h"
-#include "persistence/OrvMatFile.h"
+#include "module/OrvMatFile.h"
 #include "persistence/QuickArchive.h"
 #include "textures/BasicTextures.h"
 #include "textures/Bitmaps.h"

@@ -6,8 +6,8 @@
 #include <vector>
 
 #include "Samples.h"
+#include "module/OrvOptFile.h"
 #include "options/AllOptions.h"
-#include "persistence/OrvOptFile.h"
 #include "persistence/QuickArchive.h"
 #include "textures/BasicTextures.h"
 

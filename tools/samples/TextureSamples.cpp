@@ -13,7 +13,7 @@
 #include "lights/SunIesDome.h"
 #include "materials/Brdf.h"
 #include "materials/LayeredMaterials.h"
-#include "persistence/OrvMatFile.h"
+#include "module/OrvMatFile.h"
 #include "persistence/QuickArchive.h"
 #include "persistence/Record.h"
 #include "textures/BasicTextures.h"

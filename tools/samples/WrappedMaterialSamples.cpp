@@ -13,7 +13,7 @@
 #include "materials/ToonMaterial.h"
 #include "materials/TwoSidedBump.h"
 #include "materials/WrappingMaterials.h"
-#include "persistence/OrvMatFile.h"
+#include "module/OrvMatFile.h"
 #include "persistence/QuickArchive.h"
 #include "textures/BasicTextures.h"
 #include "textures/Bitmaps.h"

@@ -25,7 +25,7 @@
 #include <sys/mman.h>
 #endif
 
-#include "xml/UnitConversion.h"
+#include "module/python/ResultEncoder.h"
 #include "xml/XmlSink.h"
 
 namespace pyorvxml {

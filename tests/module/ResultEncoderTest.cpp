@@ -7,7 +7,7 @@
 #include <string>
 #include <vector>
 
-#include "xml/UnitConversion.h"
+#include "module/python/ResultEncoder.h"
 
 namespace {
 

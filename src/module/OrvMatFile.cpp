@@ -1,4 +1,4 @@
-#include "persistence/OrvMatFile.h"
+#include "module/OrvMatFile.h"
 
 #include <algorithm>
 #include <cstdint>

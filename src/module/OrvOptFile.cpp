@@ -1,4 +1,4 @@
-#include "persistence/OrvOptFile.h"
+#include "module/OrvOptFile.h"
 
 #include <fstream>
 
