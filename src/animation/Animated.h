@@ -11,7 +11,7 @@
 #include <string>
 
 #include "persistence/Serializable.h"
-#include "persistence/Types.h"
+#include "values/Types.h"
 
 namespace OrvaneLumoCore {
 

@@ -33,8 +33,8 @@
 
 #include "persistence/QuickArchive.h"
 #include "persistence/Record.h"
-#include "persistence/Types.h"
 #include "platform/WideChar.h"
+#include "values/Types.h"
 
 namespace OrvaneLumoCore {
 

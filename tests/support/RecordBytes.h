@@ -15,7 +15,7 @@
 #include "materials/BaseMaterial.h"
 #include "materials/Base_BRDF.h"
 #include "persistence/QuickArchive.h"
-#include "persistence/Types.h"
+#include "values/Types.h"
 
 namespace testsupport {
 
