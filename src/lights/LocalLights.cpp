@@ -6,199 +6,112 @@ namespace OrvaneLumoCore {
 
 namespace {
 
-// ---- records: the fields in record order, with the versions that hold them ----
+// ---- records: the fields in record order, with the versions that hold them,
+// the XML parameters that show them and their places among the parameters ----
 
 typedef MayaDirectLight Dir;
 // Behind these fields stands the transform: a plain transform in version 2,
 // the AnimatedTransform record from version 3 on.
 const RecordRow<Dir> kDirectRecord[] = {
-    {&Dir::color},
-    {&Dir::shadowColor, 4},
-    {&Dir::shadowBias},
-    {&Dir::intensity},
+    {&Dir::color, "color", 1},
+    {&Dir::shadowColor, 4, "shadowColor", 2},
+    {&Dir::shadowBias, "shadowBias", 3},
+    {&Dir::intensity, "intensity", 5},
     {&Dir::storedFactor},
-    {&Dir::causticSubdivs},
-    {&Dir::photonSubdivs},
+    {&Dir::causticSubdivs, "causticSubdivs", 6},
+    {&Dir::photonSubdivs, "photonSubdivs", 7},
     {&Dir::storedMode},
-    {&Dir::enabled},
-    {&Dir::shadows, 2},
-    {&Dir::shadowSubdivs, 2},
-    {&Dir::shadowRadius, 2},
+    {&Dir::enabled, "enabled", 9},
+    {&Dir::shadows, 2, "shadows", 10},
+    {&Dir::shadowSubdivs, 2, "shadowSubdivs", 8},
+    {&Dir::shadowRadius, 2, "shadowRadius", 4},
 };
 
 const RecordRow<OmniLight> kOmniRecord[] = {
-    {&OmniLight::color},
-    {&OmniLight::shadowColor, 3},
-    {&OmniLight::cutoffThreshold, 3},
-    {&OmniLight::shadowBias},
-    {&OmniLight::decay},
-    {&OmniLight::intensity},
+    {&OmniLight::color, "color", 1},
+    {&OmniLight::shadowColor, 3, "shadowColor", 2},
+    {&OmniLight::cutoffThreshold, 3, "cutoffThreshold", 3},
+    {&OmniLight::shadowBias, "shadowBias", 4},
+    {&OmniLight::decay, "decay", 5},
+    {&OmniLight::intensity, "intensity", 6},
     {&OmniLight::storedFactor},
-    {&OmniLight::units, 3},
-    {&OmniLight::photonSubdivs},
-    {&OmniLight::causticSubdivs},
+    {&OmniLight::units, 3, "units", 8},
+    {&OmniLight::photonSubdivs, "photonSubdivs", 9},
+    {&OmniLight::causticSubdivs, "causticSubdivs", 10},
     {&OmniLight::storedMode},
-    {&OmniLight::enabled},
-    {&OmniLight::shadows, 2},
-    {&OmniLight::shadowSubdivs, 2},
-    {&OmniLight::shadowRadius, 2},
-    {&OmniLight::transform, 2},
-    {&OmniLight::affectDiffuse, 4},
-    {&OmniLight::affectSpecular, 4},
+    {&OmniLight::enabled, "enabled", 12},
+    {&OmniLight::shadows, 2, "shadows", 13},
+    {&OmniLight::shadowSubdivs, 2, "shadowSubdivs", 11},
+    {&OmniLight::shadowRadius, 2, "shadowRadius", 7},
+    {&OmniLight::transform, 2, "transform", 16},
+    {&OmniLight::affectDiffuse, 4, "affectDiffuse", 14},
+    {&OmniLight::affectSpecular, 4, "affectSpecular", 15},
 };
 
 const RecordRow<SpotLight> kSpotRecord[] = {
-    {&SpotLight::color},
-    {&SpotLight::shadowColor, 3},
-    {&SpotLight::cutoffThreshold, 3},
-    {&SpotLight::barnDoorLeft, 3},
-    {&SpotLight::barnDoorRight, 3},
-    {&SpotLight::barnDoorTop, 3},
-    {&SpotLight::barnDoorBottom, 3},
-    {&SpotLight::shadowBias},
-    {&SpotLight::decay},
-    {&SpotLight::intensity},
+    {&SpotLight::color, "color", 1},
+    {&SpotLight::shadowColor, 3, "shadowColor", 2},
+    {&SpotLight::cutoffThreshold, 3, "cutoffThreshold", 3},
+    {&SpotLight::barnDoorLeft, 3, "barnDoorLeft", 4},
+    {&SpotLight::barnDoorRight, 3, "barnDoorRight", 5},
+    {&SpotLight::barnDoorTop, 3, "barnDoorTop", 6},
+    {&SpotLight::barnDoorBottom, 3, "barnDoorBottom", 7},
+    {&SpotLight::shadowBias, "shadowBias", 8},
+    {&SpotLight::decay, "decay", 9},
+    {&SpotLight::intensity, "intensity", 10},
     {&SpotLight::storedFactor},
-    {&SpotLight::units, 3},
-    {&SpotLight::photonSubdivs},
-    {&SpotLight::causticSubdivs},
+    {&SpotLight::units, 3, "units", 14},
+    {&SpotLight::photonSubdivs, "photonSubdivs", 15},
+    {&SpotLight::causticSubdivs, "causticSubdivs", 16},
     {&SpotLight::storedMode},
-    {&SpotLight::enabled},
-    {&SpotLight::barnDoor, 3},
-    {&SpotLight::shadows, 2},
-    {&SpotLight::shadowSubdivs, 2},
-    {&SpotLight::shadowRadius, 2},
-    {&SpotLight::transform, 2},
-    {&SpotLight::coneAngle, 2},
-    {&SpotLight::penumbraAngle, 2},
-    {&SpotLight::affectDiffuse, 4},
-    {&SpotLight::affectSpecular, 4},
+    {&SpotLight::enabled, "enabled", 18},
+    {&SpotLight::barnDoor, 3, "barnDoor", 19},
+    {&SpotLight::shadows, 2, "shadows", 20},
+    {&SpotLight::shadowSubdivs, 2, "shadowSubdivs", 17},
+    {&SpotLight::shadowRadius, 2, "shadowRadius", 11},
+    {&SpotLight::transform, 2, "transform", 23},
+    {&SpotLight::coneAngle, 2, "coneAngle", 12},
+    {&SpotLight::penumbraAngle, 2, "penumbraAngle", 13},
+    {&SpotLight::affectDiffuse, 4, "affectDiffuse", 21},
+    {&SpotLight::affectSpecular, 4, "affectSpecular", 22},
 };
 
 typedef RectangleLight RectLight;
 const RecordRow<RectLight> kRectangleRecord[] = {
-    {&RectLight::color},
-    {&RectLight::shadowColor, 3},
-    {&RectLight::cutoffThreshold, 3},
-    {&RectLight::shadowBias},
-    {&RectLight::intensity},
+    {&RectLight::color, "color", 1},
+    {&RectLight::shadowColor, 3, "shadowColor", 2},
+    {&RectLight::cutoffThreshold, 3, "cutoffThreshold", 3},
+    {&RectLight::shadowBias, "shadowBias", 4},
+    {&RectLight::intensity, "intensity", 5},
     {&RectLight::storedFactor},
-    {&RectLight::units, 3},
-    {&RectLight::subdivs},
-    {&RectLight::causticSubdivs},
-    {&RectLight::photonSubdivs},
+    {&RectLight::units, 3, "units", 8},
+    {&RectLight::subdivs, "subdivs", 11},
+    {&RectLight::causticSubdivs, "causticSubdivs", 10},
+    {&RectLight::photonSubdivs, "photonSubdivs", 9},
     {&RectLight::storedMode},
-    {&RectLight::doubleSided},
-    {&RectLight::invisible},
-    {&RectLight::lightPortal},
-    {&RectLight::noDecay},
-    {&RectLight::enabled},
-    {&RectLight::storeWithIrradianceMap},
-    {&RectLight::ignoreLightNormals},
-    {&RectLight::shadows, 2},
-    {&RectLight::transform, 2},
-    {&RectLight::u_size, 2},
-    {&RectLight::v_size, 2},
-    {&RectLight::affectDiffuse, 4},
-    {&RectLight::affectSpecular, 4},
-    {&RectLight::affectReflections, 4},
-};
-
-// ---- XML parameters, in the order they are written ----
-
-const ParamRow<Dir> kDirectParams[] = {
-    {"color", &Dir::color},
-    {"shadowColor", &Dir::shadowColor},
-    {"shadowBias", &Dir::shadowBias},
-    {"shadowRadius", &Dir::shadowRadius},
-    {"intensity", &Dir::intensity},
-    {"causticSubdivs", &Dir::causticSubdivs},
-    {"photonSubdivs", &Dir::photonSubdivs},
-    {"shadowSubdivs", &Dir::shadowSubdivs},
-    {"enabled", &Dir::enabled},
-    {"shadows", &Dir::shadows},
-};
-
-const ParamRow<OmniLight> kOmniParams[] = {
-    {"color", &OmniLight::color},
-    {"shadowColor", &OmniLight::shadowColor},
-    {"cutoffThreshold", &OmniLight::cutoffThreshold},
-    {"shadowBias", &OmniLight::shadowBias},
-    {"decay", &OmniLight::decay},
-    {"intensity", &OmniLight::intensity},
-    {"shadowRadius", &OmniLight::shadowRadius},
-    {"units", &OmniLight::units},
-    {"photonSubdivs", &OmniLight::photonSubdivs},
-    {"causticSubdivs", &OmniLight::causticSubdivs},
-    {"shadowSubdivs", &OmniLight::shadowSubdivs},
-    {"enabled", &OmniLight::enabled},
-    {"shadows", &OmniLight::shadows},
-    {"affectDiffuse", &OmniLight::affectDiffuse},
-    {"affectSpecular", &OmniLight::affectSpecular},
-    {"transform", &OmniLight::transform},
-};
-
-// Followed by "legacyMode", which no field holds.
-const ParamRow<SpotLight> kSpotParams[] = {
-    {"color", &SpotLight::color},
-    {"shadowColor", &SpotLight::shadowColor},
-    {"cutoffThreshold", &SpotLight::cutoffThreshold},
-    {"barnDoorLeft", &SpotLight::barnDoorLeft},
-    {"barnDoorRight", &SpotLight::barnDoorRight},
-    {"barnDoorTop", &SpotLight::barnDoorTop},
-    {"barnDoorBottom", &SpotLight::barnDoorBottom},
-    {"shadowBias", &SpotLight::shadowBias},
-    {"decay", &SpotLight::decay},
-    {"intensity", &SpotLight::intensity},
-    {"shadowRadius", &SpotLight::shadowRadius},
-    {"coneAngle", &SpotLight::coneAngle},
-    {"penumbraAngle", &SpotLight::penumbraAngle},
-    {"units", &SpotLight::units},
-    {"photonSubdivs", &SpotLight::photonSubdivs},
-    {"causticSubdivs", &SpotLight::causticSubdivs},
-    {"shadowSubdivs", &SpotLight::shadowSubdivs},
-    {"enabled", &SpotLight::enabled},
-    {"barnDoor", &SpotLight::barnDoor},
-    {"shadows", &SpotLight::shadows},
-    {"affectDiffuse", &SpotLight::affectDiffuse},
-    {"affectSpecular", &SpotLight::affectSpecular},
-    {"transform", &SpotLight::transform},
-};
-
-const ParamRow<RectLight> kRectangleParams[] = {
-    {"color", &RectLight::color},
-    {"shadowColor", &RectLight::shadowColor},
-    {"cutoffThreshold", &RectLight::cutoffThreshold},
-    {"shadowBias", &RectLight::shadowBias},
-    {"intensity", &RectLight::intensity},
-    {"u_size", &RectLight::u_size},
-    {"v_size", &RectLight::v_size},
-    {"units", &RectLight::units},
-    {"photonSubdivs", &RectLight::photonSubdivs},
-    {"causticSubdivs", &RectLight::causticSubdivs},
-    {"subdivs", &RectLight::subdivs},
-    {"enabled", &RectLight::enabled},
-    {"doubleSided", &RectLight::doubleSided},
-    {"invisible", &RectLight::invisible},
-    {"lightPortal", &RectLight::lightPortal},
-    {"noDecay", &RectLight::noDecay},
-    {"storeWithIrradianceMap", &RectLight::storeWithIrradianceMap},
-    {"ignoreLightNormals", &RectLight::ignoreLightNormals},
-    {"shadows", &RectLight::shadows},
-    {"affectDiffuse", &RectLight::affectDiffuse},
-    {"affectSpecular", &RectLight::affectSpecular},
-    {"affectReflections", &RectLight::affectReflections},
-    {"transform", &RectLight::transform},
+    {&RectLight::doubleSided, "doubleSided", 13},
+    {&RectLight::invisible, "invisible", 14},
+    {&RectLight::lightPortal, "lightPortal", 15},
+    {&RectLight::noDecay, "noDecay", 16},
+    {&RectLight::enabled, "enabled", 12},
+    {&RectLight::storeWithIrradianceMap, "storeWithIrradianceMap", 17},
+    {&RectLight::ignoreLightNormals, "ignoreLightNormals", 18},
+    {&RectLight::shadows, 2, "shadows", 19},
+    {&RectLight::transform, 2, "transform", 23},
+    {&RectLight::u_size, 2, "u_size", 6},
+    {&RectLight::v_size, 2, "v_size", 7},
+    {&RectLight::affectDiffuse, 4, "affectDiffuse", 20},
+    {&RectLight::affectSpecular, 4, "affectSpecular", 21},
+    {&RectLight::affectReflections, 4, "affectReflections", 22},
 };
 
 constexpr int kNewest = 4;
 
 // The light's Asset under its own url: the owner's url, "/", the plugin name.
-template <class L, std::size_t N>
-void writeParamAsset(AssetXmlWriter& w, const std::u16string& url, const L& light,
-                     const ParamRow<L> (&params)[N]) {
+template <class L, class Rows>
+void writeParamAsset(AssetXmlWriter& w, const std::u16string& url, const L& light, const Rows& rows) {
     writeLightAsset(w, url + u"/" + light.getPluginName(), light.getPluginName(),
-                    [&] { writeParams(w, light, params); });
+                    [&] { writeShownFields(w, light, rows); });
 }
 
 }  // namespace
@@ -228,7 +141,7 @@ bool MayaDirectLight::sameContent(const MayaDirectLight& o) const {
 }
 
 void MayaDirectLight::writeXml(AssetXmlWriter& writer, std::u16string url) {
-    writeParamAsset(writer, url, *this, kDirectParams);
+    writeParamAsset(writer, url, *this, kDirectRecord);
 }
 
 // ---- OmniLight ----
@@ -236,7 +149,7 @@ void MayaDirectLight::writeXml(AssetXmlWriter& writer, std::u16string url) {
 RowSpan<RecordRow<OmniLight>> OmniLight::record() { return rowSpan(kOmniRecord); }
 
 void OmniLight::writeXml(AssetXmlWriter& writer, std::u16string url) {
-    writeParamAsset(writer, url, *this, kOmniParams);
+    writeParamAsset(writer, url, *this, kOmniRecord);
 }
 
 // ---- SpotLight ----
@@ -245,7 +158,7 @@ RowSpan<RecordRow<SpotLight>> SpotLight::record() { return rowSpan(kSpotRecord);
 
 void SpotLight::writeXml(AssetXmlWriter& writer, std::u16string url) {
     writeLightAsset(writer, url + u"/" + getPluginName(), getPluginName(), [&] {
-        writeParams(writer, *this, kSpotParams);
+        writeShownFields(writer, *this, kSpotRecord);
         // Always on; the consumer reads it as a setting of its own.
         writer.writeBool("legacyMode", true, "Legacy Mode", true);
     });
@@ -256,7 +169,7 @@ void SpotLight::writeXml(AssetXmlWriter& writer, std::u16string url) {
 RowSpan<RecordRow<RectangleLight>> RectangleLight::record() { return rowSpan(kRectangleRecord); }
 
 void RectangleLight::writeXml(AssetXmlWriter& writer, std::u16string url) {
-    writeParamAsset(writer, url, *this, kRectangleParams);
+    writeParamAsset(writer, url, *this, kRectangleRecord);
 }
 
 // ---- SphereLight ----

@@ -45,42 +45,25 @@ const ParamRow<SunLight> kSunParams[] = {
     {"invisible", &SunLight::invisible},
 };
 
+// The fields in record order, with the versions that hold them, the XML
+// parameters that show them and their places among the parameters.
 const RecordRow<IESLight> kIesRecord[] = {
-    {&IESLight::transform},
-    {&IESLight::color},
-    {&IESLight::shadowColor},
-    {&IESLight::filter_color},
-    {&IESLight::shadowBias},
-    {&IESLight::cutoffThreshold},
-    {&IESLight::photonSubdivs},
-    {&IESLight::causticSubdivs},
-    {&IESLight::shadow_subdivs},
-    {&IESLight::enabled},
-    {&IESLight::shadows},
-    {&IESLight::soft_shadows},
-    {FieldRef<IESLight>::path(&IESLight::ies_file)},
-    {&IESLight::affectDiffuse, 2},
-    {&IESLight::affectSpecular, 2},
-    {&IESLight::intensity, 3},
-};
-
-const ParamRow<IESLight> kIesParams[] = {
-    {"transform", &IESLight::transform},
-    {"color", &IESLight::color},
-    {"shadowColor", &IESLight::shadowColor},
-    {"filter_color", &IESLight::filter_color},
-    {"shadowBias", &IESLight::shadowBias},
-    {"cutoffThreshold", &IESLight::cutoffThreshold},
-    {"intensity", &IESLight::intensity},
-    {"photonSubdivs", &IESLight::photonSubdivs},
-    {"causticSubdivs", &IESLight::causticSubdivs},
-    {"shadow_subdivs", &IESLight::shadow_subdivs},
-    {"enabled", &IESLight::enabled},
-    {"shadows", &IESLight::shadows},
-    {"soft_shadows", &IESLight::soft_shadows},
-    {"affectDiffuse", &IESLight::affectDiffuse},
-    {"affectSpecular", &IESLight::affectSpecular},
-    {"ies_file", FieldRef<IESLight>::path(&IESLight::ies_file)},
+    {&IESLight::transform, "transform", 1},
+    {&IESLight::color, "color", 2},
+    {&IESLight::shadowColor, "shadowColor", 3},
+    {&IESLight::filter_color, "filter_color", 4},
+    {&IESLight::shadowBias, "shadowBias", 5},
+    {&IESLight::cutoffThreshold, "cutoffThreshold", 6},
+    {&IESLight::photonSubdivs, "photonSubdivs", 8},
+    {&IESLight::causticSubdivs, "causticSubdivs", 9},
+    {&IESLight::shadow_subdivs, "shadow_subdivs", 10},
+    {&IESLight::enabled, "enabled", 11},
+    {&IESLight::shadows, "shadows", 12},
+    {&IESLight::soft_shadows, "soft_shadows", 13},
+    {FieldRef<IESLight>::path(&IESLight::ies_file), "ies_file", 16},
+    {&IESLight::affectDiffuse, 2, "affectDiffuse", 14},
+    {&IESLight::affectSpecular, 2, "affectSpecular", 15},
+    {&IESLight::intensity, 3, "intensity", 7},
 };
 
 constexpr int kSunNewest = 4;
@@ -187,7 +170,7 @@ RowSpan<RecordRow<IESLight>> IESLight::record() { return rowSpan(kIesRecord); }
 
 void IESLight::writeXml(AssetXmlWriter& writer, std::u16string url) {
     writeLightAsset(writer, url + u"/" + getPluginName(), getPluginName(),
-                    [&] { writeParams(writer, *this, kIesParams); });
+                    [&] { writeShownFields(writer, *this, kIesRecord); });
 }
 
 // ---- DomeLight ----

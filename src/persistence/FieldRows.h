@@ -22,6 +22,12 @@
 // depend on other fields) is a hook row: the walkers hand it to the class's
 // hook, with the code number the table gives it. A record whose layout
 // branches inside a version is not a table; it is written by hand.
+//
+// A row also says how its field is shown in the XML: the parameter's name,
+// its place among the class's parameters where that order differs from the
+// record's, a label, and for a child texture the word of its url. The writer
+// walks the same table (xml/ParamRows.h, writeShownFields), so a field is
+// named in one row only.
 #include <cstddef>
 #include <cstdint>
 #include <cstdio>
@@ -313,6 +319,19 @@ enum class RowUse : std::uint8_t {
     Dropped,  // no field: read and dropped, written as zero (old versions only)
     Forced,   // the field, read and then set to the default: it is the default after any load
     Hook,     // the class's own code, given `hook`; the field, if any, is the hook's
+    Shown,    // no bytes: the field once more in the XML, under another name
+};
+
+// How a row's field is shown in the XML. A row without a name isn't shown.
+struct RowXml {
+    const char* name = nullptr;
+    // The parameter's place among the class's parameters, from 1, where the
+    // XML order isn't the record's; 0: the row's place in the table.
+    int at = 0;
+    const char* label = "";
+    bool userData = false;
+    bool asFlag = false;          // an integer shown as a bool: any value but 0 is 1
+    const char16_t* slot = nullptr;  // a child's url word
 };
 
 // The code number of a hook row that has no field, for tables written as
@@ -326,6 +345,11 @@ struct RowHook {
 // written as &C::field, {&C::field, since} or {&C::field, since, until} is a
 // plain field whose default lies elsewhere (the class's member initialisers or
 // its reset); a child texture or material is a hook row with code 0.
+//
+// A row shown in the XML names its parameter, and where the XML order isn't
+// the record's, its place there: {&C::field, "name", 3}, or with the version
+// that brought the field, {&C::field, 2, "name", 3}. Label, flag form, user
+// data and url word are set on the row: {&C::tex, "tex"}.slot(u"texture").
 template <class C>
 struct RecordRow {
     constexpr RecordRow() = default;
@@ -334,7 +358,42 @@ struct RecordRow {
         : RecordRow(FieldRef<C>(m), first, last) {}
     constexpr RecordRow(FieldRef<C> f, int first = 1, int last = kLastVersion)
         : field(f), since(first), until(last), use(f.isChild() ? RowUse::Hook : RowUse::Field) {}
+    template <class M>
+    constexpr RecordRow(M C::*m, const char* name, int at = 0) : RecordRow(FieldRef<C>(m), 1, name, at) {}
+    template <class M>
+    constexpr RecordRow(M C::*m, int first, const char* name, int at = 0)
+        : RecordRow(FieldRef<C>(m), first, name, at) {}
+    constexpr RecordRow(FieldRef<C> f, const char* name, int at = 0) : RecordRow(f, 1, name, at) {}
+    constexpr RecordRow(FieldRef<C> f, int first, const char* name, int at = 0) : RecordRow(f, first) {
+        xml.name = name;
+        xml.at = at;
+    }
     constexpr RecordRow(RowHook h) : use(RowUse::Hook), hook(h.code) {}
+
+    // The field shown once more, as parameter `name` at place `at`.
+    template <class M>
+    static constexpr RecordRow shownAgain(M C::*m, const char* name, int at = 0) {
+        RecordRow row(FieldRef<C>(m), name, at);
+        row.use = RowUse::Shown;
+        return row;
+    }
+
+    constexpr RecordRow labelled(const char* text, bool userData = false) const {
+        RecordRow row = *this;
+        row.xml.label = text;
+        row.xml.userData = userData;
+        return row;
+    }
+    constexpr RecordRow asFlag() const {
+        RecordRow row = *this;
+        row.xml.asFlag = true;
+        return row;
+    }
+    constexpr RecordRow slot(const char16_t* word) const {
+        RecordRow row = *this;
+        row.xml.slot = word;
+        return row;
+    }
 
     FieldRef<C> field;
     int since = 1;
@@ -343,8 +402,10 @@ struct RecordRow {
     Color color;
     RowUse use = RowUse::Field;
     int hook = 0;
+    RowXml xml;
 
     bool inVersion(int version) const { return version >= since && version <= until; }
+    bool hasBytes() const { return use != RowUse::Shown; }
 };
 
 // Row builders, so that a table with defaults reads like the record it
@@ -426,7 +487,8 @@ void readRow(QuickArchive& ar, C& obj, const RecordRow<C>& row) {
                 ar.readFloat(dropped);
             }
             break;
-        case RowUse::Hook: break;
+        case RowUse::Hook:
+        case RowUse::Shown: break;
     }
 }
 
@@ -446,7 +508,8 @@ void writeRow(QuickArchive& ar, const C& obj, const RecordRow<C>& row) {
                 ar.writeFloat(static_cast<float>(value));
             break;
         }
-        case RowUse::Hook: break;
+        case RowUse::Hook:
+        case RowUse::Shown: break;
     }
 }
 
@@ -456,7 +519,7 @@ void writeRow(QuickArchive& ar, const C& obj, const RecordRow<C>& row) {
 template <class C, class Rows, class Hook>
 bool readFields(QuickArchive& ar, C& obj, const Rows& rows, int version, Hook hook) {
     for (const RecordRow<C>& row : rows) {
-        if (!row.inVersion(version)) continue;
+        if (!row.inVersion(version) || !row.hasBytes()) continue;
         if (row.use != RowUse::Hook)
             readRow(ar, obj, row);
         else if (!hook(row))
@@ -475,7 +538,7 @@ void readFields(QuickArchive& ar, C& obj, const Rows& rows, int version) {
 template <class C, class Rows, class Hook>
 bool writeFields(QuickArchive& ar, const C& obj, const Rows& rows, int version, Hook hook) {
     for (const RecordRow<C>& row : rows) {
-        if (!row.inVersion(version)) continue;
+        if (!row.inVersion(version) || !row.hasBytes()) continue;
         if (row.use != RowUse::Hook)
             writeRow(ar, obj, row);
         else if (!hook(row))

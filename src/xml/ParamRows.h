@@ -132,4 +132,42 @@ void writeParams(AssetXmlWriter& w, const C& obj, const Rows& rows, Hook hook) {
     }
 }
 
+// ---- parameters that a record table shows ----
+
+// The parameter that a record row shows, as a ParamRow.
+template <class C>
+ParamRow<C> shownParam(const RecordRow<C>& row) {
+    ParamRow<C> p{row.xml.name, ParamField<C>(row.field), row.xml.label, row.xml.userData};
+    p.field.shownAsFlag = row.xml.asFlag;
+    return p;
+}
+
+// Writes the parameters that the rows of a record table show (the rows with
+// a name): in the order of their places where the rows give places, those
+// without a place behind them in table order; otherwise in table order. A
+// child's row, and a hook row, goes to `hook(row)`.
+template <class C, class Rows, class Hook>
+void writeShownFields(AssetXmlWriter& w, const C& obj, const Rows& rows, Hook hook) {
+    auto writeRow = [&](const RecordRow<C>& row) {
+        if (row.field.isChild() || row.use == RowUse::Hook)
+            hook(row);
+        else
+            writeParam(w, shownParam(row), obj);
+    };
+    int places = 0;
+    for (const RecordRow<C>& row : rows)
+        if (row.xml.name && row.xml.at > places) places = row.xml.at;
+    // Tables are a few dozen rows, so a scan per place costs less than sorting.
+    for (int place = 1; place <= places; ++place)
+        for (const RecordRow<C>& row : rows)
+            if (row.xml.name && row.xml.at == place) writeRow(row);
+    for (const RecordRow<C>& row : rows)
+        if (row.xml.name && row.xml.at == 0) writeRow(row);
+}
+
+template <class C, class Rows>
+void writeShownFields(AssetXmlWriter& w, const C& obj, const Rows& rows) {
+    writeShownFields(w, obj, rows, [](const RecordRow<C>&) {});
+}
+
 }  // namespace OrvaneLumoCore

@@ -5,9 +5,11 @@
 #include <string>
 #include <vector>
 
+#include "support/RecordBytes.h"
 #include "xml/ParamRows.h"
 
 using namespace OrvaneLumoCore;
+using namespace testsupport;
 
 namespace {
 
@@ -71,6 +73,67 @@ TEST(ParamRows, HookRowsGoToTheHookInOrder) {
                   w.writeString("hooked", "x");
                   w.writeInteger("inner", 9);
                   w.writeString("last", "x");
+              }));
+}
+
+// A record table shows its fields in the order of the places it gives, rows
+// without a place behind them; a field shown again writes no bytes; the
+// flag, label and user-data columns reach the writer; a row without a name
+// is in the record only.
+TEST(ShownFields, PlacesOrderTheParametersAndTheRecordKeepsItsOwn) {
+    Holder h;
+    h.ownFlag = 7;
+    h.ownCount = 3;
+    h.scale = 0.5;
+    h.on = true;
+    h.path = u"C:\\maps\\a.png";
+    const RecordRow<Holder> rows[] = {
+        {&Holder::ownCount, "count", 2},
+        RecordRow<Holder>(&Holder::ownFlag, "flag", 1).asFlag(),
+        {&Holder::scale},
+        RecordRow<Holder>(&Holder::on, 2, "on", 0).labelled("Switch", true),
+        RecordRow<Holder>::shownAgain(&Holder::ownCount, "count_again", 3),
+        {FieldRef<Holder>::path(&Holder::path), "file", 4},
+    };
+    const std::u16string expected = written([](AssetXmlWriter& w) {
+        w.writeBool("flag", true);
+        w.writeInteger("count", 3);
+        w.writeInteger("count_again", 3);
+        w.writeFileName("file", u"C:\\maps\\a.png");
+        w.writeBool("on", true, "Switch", true);
+    });
+    EXPECT_EQ(written([&](AssetXmlWriter& w) { writeShownFields(w, h, rows); }), expected);
+
+    // Only the five rows with bytes are in the record, in table order.
+    QuickArchive ar(1);
+    writeFields(ar, h, rows, 2);
+    EXPECT_EQ(RecordBytes().i32(3).i32(7).f64(0.5).b8(true).wstr("C:\\maps\\a.png").bytes(), writtenBytes(ar));
+}
+
+// Without places the parameters follow the table; a child's row goes to the hook.
+TEST(ShownFields, TableOrderAndChildrenToTheHook) {
+    struct WithChild {
+        std::int32_t a = 1;
+        boost::shared_ptr<BaseTexture> tex;
+        float b = 2;
+    };
+    const RecordRow<WithChild> rows[] = {
+        {&WithChild::b, "b"},
+        RecordRow<WithChild>(&WithChild::tex, "tex").slot(u"texture"),
+        {&WithChild::a, "a"},
+    };
+    std::vector<std::string> hooked;
+    WithChild c;
+    const std::u16string out = written([&](AssetXmlWriter& w) {
+        writeShownFields(w, c, rows, [&](const RecordRow<WithChild>& row) {
+            hooked.push_back(row.xml.name);
+            EXPECT_EQ(std::u16string(row.xml.slot), u"texture");
+        });
+    });
+    EXPECT_EQ(hooked, std::vector<std::string>{"tex"});
+    EXPECT_EQ(out, written([](AssetXmlWriter& w) {
+                  w.writeFloat("b", 2);
+                  w.writeInteger("a", 1);
               }));
 }
 
