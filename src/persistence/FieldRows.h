@@ -46,6 +46,7 @@ namespace OrvaneLumoCore {
 
 class BaseTexture;
 class BaseMaterial;
+class BaseUVW;
 
 // FieldRef::get checks that a row holds the type asked for in debug builds,
 // in sanitizer builds, and where ORVXML_FIELD_KIND_CHECKS is defined.
@@ -75,7 +76,7 @@ class FieldRef {
 public:
     enum class Kind {
         None, Bool, Bool32, Int, Float, Double, Color, AColor, Vector, Transform, TransformD,
-        WString, Path, NarrowText, Texture, Material
+        WString, Path, NarrowText, Texture, Material, Generator
     };
 
     // Not explicit: a table row is written with the bare member pointer. The
@@ -93,10 +94,12 @@ public:
     constexpr FieldRef(TransformD C::*m) : kind_(Kind::TransformD), td_(m) {}
     constexpr FieldRef(std::u16string C::*m) : kind_(Kind::WString), s_(m) {}
     constexpr FieldRef(std::string C::*m) : kind_(Kind::NarrowText), n_(m) {}
-    // A child texture or material: its bytes and its comparison are the
-    // class's code (a hook row), since they depend on the child's family.
+    // A child texture, material or UVW generator: its bytes and its
+    // comparison are the class's code (a hook row), since they depend on the
+    // child's family.
     constexpr FieldRef(boost::shared_ptr<BaseTexture> C::*m) : kind_(Kind::Texture), x_(m) {}
     constexpr FieldRef(boost::shared_ptr<BaseMaterial> C::*m) : kind_(Kind::Material), mt_(m) {}
+    constexpr FieldRef(boost::shared_ptr<BaseUVW> C::*m) : kind_(Kind::Generator), g_(m) {}
     static constexpr FieldRef path(std::u16string C::*m) { return FieldRef(Kind::Path, m); }
     static constexpr FieldRef bool32(bool C::*m) { return FieldRef(Kind::Bool32, m); }
     // The bytes of `kind` that belong to no field (constant and dropped rows).
@@ -107,13 +110,16 @@ public:
     }
 
     constexpr Kind kind() const { return kind_; }
-    constexpr bool isChild() const { return kind_ == Kind::Texture || kind_ == Kind::Material; }
+    constexpr bool isChild() const {
+        return kind_ == Kind::Texture || kind_ == Kind::Material || kind_ == Kind::Generator;
+    }
 
     void read(QuickArchive& ar, C& obj) const {
         switch (kind_) {
             case Kind::None:
             case Kind::Texture:
-            case Kind::Material: break;
+            case Kind::Material:
+            case Kind::Generator: break;
             case Kind::Bool: ar.readByte(obj.*b_); break;
             case Kind::Bool32: {
                 std::int32_t flag = (obj.*b_) ? 1 : 0;
@@ -153,7 +159,8 @@ public:
         switch (kind_) {
             case Kind::None:
             case Kind::Texture:
-            case Kind::Material: break;
+            case Kind::Material:
+            case Kind::Generator: break;
             case Kind::Bool: ar.writeByte(obj.*b_); break;
             case Kind::Bool32: ar.writeInt(obj.*b_ ? 1 : 0); break;
             case Kind::Int: ar.writeInt(obj.*i_); break;
@@ -192,6 +199,7 @@ public:
             case Kind::NarrowText: return x.*n_ == y.*n_;
             case Kind::Texture: return x.*x_ == y.*x_;
             case Kind::Material: return x.*mt_ == y.*mt_;
+            case Kind::Generator: return x.*g_ == y.*g_;
         }
         return false;
     }
@@ -223,6 +231,7 @@ public:
             case Kind::NarrowText: (obj.*n_).clear(); break;
             case Kind::Texture: (obj.*x_).reset(); break;
             case Kind::Material: (obj.*mt_).reset(); break;
+            case Kind::Generator: (obj.*g_).reset(); break;
         }
     }
 
@@ -252,6 +261,7 @@ public:
         else if constexpr (std::is_same<T, std::string>::value) return obj.*n_;
         else if constexpr (std::is_same<T, boost::shared_ptr<BaseTexture>>::value) return obj.*x_;
         else if constexpr (std::is_same<T, boost::shared_ptr<BaseMaterial>>::value) return obj.*mt_;
+        else if constexpr (std::is_same<T, boost::shared_ptr<BaseUVW>>::value) return obj.*g_;
         else {
             static_assert(std::is_same<T, std::u16string>::value, "not a type a field row holds");
             return obj.*s_;
@@ -283,6 +293,7 @@ private:
         else if constexpr (std::is_same<T, std::string>::value) return k == Kind::NarrowText;
         else if constexpr (std::is_same<T, boost::shared_ptr<BaseTexture>>::value) return k == Kind::Texture;
         else if constexpr (std::is_same<T, boost::shared_ptr<BaseMaterial>>::value) return k == Kind::Material;
+        else if constexpr (std::is_same<T, boost::shared_ptr<BaseUVW>>::value) return k == Kind::Generator;
         else if constexpr (std::is_same<T, std::u16string>::value) return k == Kind::WString || k == Kind::Path;
         else return false;
     }
@@ -306,6 +317,7 @@ private:
         std::string C::*n_;
         boost::shared_ptr<BaseTexture> C::*x_;
         boost::shared_ptr<BaseMaterial> C::*mt_;
+        boost::shared_ptr<BaseUVW> C::*g_;
     };
 };
 
@@ -332,6 +344,7 @@ struct RowXml {
     bool userData = false;
     bool asFlag = false;          // an integer shown as a bool: any value but 0 is 1
     const char16_t* slot = nullptr;  // a child's url word
+    int form = 0;  // nonzero: a form of the class's own, written by its hook
 };
 
 // The code number of a hook row that has no field, for tables written as
@@ -349,7 +362,8 @@ struct RowHook {
 // A row shown in the XML names its parameter, and where the XML order isn't
 // the record's, its place there: {&C::field, "name", 3}, or with the version
 // that brought the field, {&C::field, 2, "name", 3}. Label, flag form, user
-// data and url word are set on the row: {&C::tex, "tex"}.slot(u"texture").
+// data, url word and a form of the class's own are set on the row:
+// RecordRow<C>(&C::tex, "tex").slot(u"texture").
 template <class C>
 struct RecordRow {
     constexpr RecordRow() = default;
@@ -392,6 +406,19 @@ struct RecordRow {
     constexpr RecordRow slot(const char16_t* word) const {
         RecordRow row = *this;
         row.xml.slot = word;
+        return row;
+    }
+    // The field shown in a form of the class's own: the XML walk hands the
+    // row to the class's hook with `xml.form` set to `code`.
+    constexpr RecordRow shownBy(int code) const {
+        RecordRow row = *this;
+        row.xml.form = code;
+        return row;
+    }
+    // The code that a hook row hands to the class's hook.
+    constexpr RecordRow coded(int code) const {
+        RecordRow row = *this;
+        row.hook = code;
         return row;
     }
 

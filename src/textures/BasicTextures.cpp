@@ -24,19 +24,24 @@ Color complement(const Color& c) {
 
 typedef FresnelTexture Fr;
 
+// The colours are stored as complements; the XML shows max(0, 1 - c).
+enum FresnelForm { kComplement = 1 };
+
 const RecordRow<Fr> kFresnelRecord[] = {
-    &Fr::whiteInverse,
-    &Fr::blackInverse,
-    &Fr::fresnel_ior,
-    &Fr::refract_ior,
-    {&Fr::black_color_tex_mult, 2},
-    {&Fr::white_color_tex_mult, 2},
-    {&Fr::fresnel_ior_tex_mult, 2},
-    {&Fr::refract_ior_tex_mult, 2},
-    {&Fr::reflection_tex, 2},
-    {&Fr::refraction_tex, 2},
-    {&Fr::fresnel_ior_tex, 2},
-    {&Fr::refract_ior_tex, 2},
+    RecordRow<Fr>(&Fr::whiteInverse, "white_color").shownBy(kComplement),
+    RecordRow<Fr>(&Fr::blackInverse, "black_color").shownBy(kComplement),
+    {&Fr::fresnel_ior, "fresnel_ior"},
+    {&Fr::refract_ior, "refract_ior"},
+    {&Fr::black_color_tex_mult, 2, "black_color_tex_mult"},
+    {&Fr::white_color_tex_mult, 2, "white_color_tex_mult"},
+    {&Fr::fresnel_ior_tex_mult, 2, "fresnel_ior_tex_mult"},
+    {&Fr::refract_ior_tex_mult, 2, "refract_ior_tex_mult"},
+    // The first texture feeds the black colour and the second the white one,
+    // crosswise to the colours above.
+    RecordRow<Fr>(&Fr::reflection_tex, 2, "black_color_tex").slot(u"reflection_tex"),
+    RecordRow<Fr>(&Fr::refraction_tex, 2, "white_color_tex").slot(u"refraction_tex"),
+    {&Fr::fresnel_ior_tex, 2, "fresnel_ior_tex"},
+    {&Fr::refract_ior_tex, 2, "refract_ior_tex"},
 };
 
 bool FresnelTexture::save(QuickArchive& ar) const { return saveTextureRecord(*this, ar, kFresnelRecord, 2); }
@@ -48,27 +53,9 @@ void FresnelTexture::finishClone() { cloneTextureRows(*this, kFresnelRecord); }
 bool FresnelTexture::sameContent(const FresnelTexture& o) const { return rowsEqual(*this, o, kFresnelRecord); }
 
 void FresnelTexture::writeXml(AssetXmlWriter& w, std::u16string url) {
-    TextureFrame frame(w, *this, url);
-    const SlotRef reflection = frame.slot(reflection_tex, u"reflection_tex");
-    const SlotRef refraction = frame.slot(refraction_tex, u"refraction_tex");
-    const SlotRef fresnelIor = frame.slot(fresnel_ior_tex, u"fresnel_ior_tex");
-    const SlotRef refractIor = frame.slot(refract_ior_tex, u"refract_ior_tex");
-    frame.open();
-    w.writeColor("white_color", complement(whiteInverse));
-    w.writeColor("black_color", complement(blackInverse));
-    w.writeFloat("fresnel_ior", fresnel_ior);
-    w.writeFloat("refract_ior", refract_ior);
-    w.writeFloat("black_color_tex_mult", black_color_tex_mult);
-    w.writeFloat("white_color_tex_mult", white_color_tex_mult);
-    w.writeFloat("fresnel_ior_tex_mult", fresnel_ior_tex_mult);
-    w.writeFloat("refract_ior_tex_mult", refract_ior_tex_mult);
-    // The first slot feeds the black colour and the second the white one,
-    // crosswise to the colours above.
-    frame.writeRef("black_color_tex", reflection);
-    frame.writeRef("white_color_tex", refraction);
-    frame.writeRef("fresnel_ior_tex", fresnelIor);
-    frame.writeRef("refract_ior_tex", refractIor);
-    frame.close();
+    writeTextureRows(w, *this, url, kFresnelRecord, [&](const RecordRow<Fr>& row) {
+        w.writeColor(row.xml.name, complement(row.field.get<Color>(*this)));
+    });
 }
 
 // ---- BlendTexture --------------------------------------------------------------

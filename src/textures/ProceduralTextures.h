@@ -2,14 +2,14 @@
 // Procedural textures: ramp, bulge, grid, cloth, noise and checker. Each has
 // a UVW generator as its first child.
 //
-// All six share one shape. The record is the version tag, the children in
-// slot order, then the plain fields; the XML has one child slot per child,
-// a `plugin` parameter per slot in slot order (the slot's word is also the
-// parameter's name), then the plain parameters. A class therefore only
-// describes its slots, its record rows and its parameter rows
-// (ProceduralLayout, in ProceduralTextures.cpp); ProceduralTexture does the
-// rest. A required child that is missing makes `save` fail before anything
-// is written.
+// All six share one shape. The record is the version tag, the children,
+// then the plain fields; the XML has one child slot per child, a `plugin`
+// parameter per slot in slot order (the slot's word is also the parameter's
+// name), then the plain parameters. A class therefore only describes its
+// record table, one row per child or field with the XML parameter that shows
+// it (ProceduralLayout, in ProceduralTextures.cpp); the texture family's
+// walkers (textures/TextureRows.h) do the rest. A required child that is
+// missing makes `save` fail before anything is written.
 #include <cstdint>
 #include <string>
 

@@ -1,13 +1,65 @@
 #pragma once
-// Records of the texture family in the one record row form: a table whose
-// texture rows are optional texture members (tag and record behind a bool8
-// "present"), read with createTexture. With these a class whose record is
-// flat names each field once, in its table.
+// Records of the texture family in the one record row form, and the one
+// child-member policy of the family:
+//
+//   - a texture row is an optional texture member (a bool8 "present", then
+//     tag and record), or a required one (tag and record) where the row is
+//     coded kRequiredChild; it is read with createTexture;
+//   - a UVW generator row is a required member, read with createUVW;
+//   - a required child that is missing makes `save` fail before anything is
+//     written.
+//
+// In the XML every child has a slot (the row's url word, else its parameter
+// name) and a `plugin` parameter that refers to it, where the row's place
+// among the parameters puts it. With these a texture whose record is flat
+// names each field and child once, in its table; rows that need code of
+// their own are hook rows with codes from kFirstClassCode on.
+#include <string>
+#include <utility>
+#include <vector>
+
 #include "persistence/FieldRows.h"
 #include "persistence/Record.h"
+#include "platform/Text.h"
 #include "textures/BaseTexture.h"
+#include "textures/BaseUVW.h"
+#include "textures/TextureFrame.h"
+#include "xml/ParamRows.h"
 
 namespace OrvaneLumoCore {
+
+// Codes of the family's child rows; a class's own hook rows use codes from
+// kFirstClassCode on.
+enum TextureRowCode { kOptionalChild = 0, kRequiredChild = 1, kFirstClassCode = 2 };
+
+template <class C>
+constexpr RecordRow<C> required(RecordRow<C> row) {
+    return row.coded(kRequiredChild);
+}
+
+template <class C>
+bool isTextureChild(const RecordRow<C>& row) {
+    return row.field.kind() == FieldRef<C>::Kind::Texture && row.use == RowUse::Hook;
+}
+template <class C>
+bool isGeneratorChild(const RecordRow<C>& row) {
+    return row.field.kind() == FieldRef<C>::Kind::Generator && row.use == RowUse::Hook;
+}
+
+template <class C>
+bool loadTextureChild(QuickArchive& ar, C& obj, const RecordRow<C>& row) {
+    if (isGeneratorChild(row)) return loadRequiredMember(ar, row.field.template get<UVWPtr>(obj), createUVW);
+    TexturePtr& texture = row.field.template get<TexturePtr>(obj);
+    return row.hook == kRequiredChild ? loadRequiredMember(ar, texture, createTexture)
+                                      : loadOptionalMember(ar, texture, createTexture);
+}
+
+template <class C>
+bool saveTextureChild(QuickArchive& ar, const C& obj, const RecordRow<C>& row) {
+    if (isGeneratorChild(row)) return saveRequiredMember(ar, row.field.template get<UVWPtr>(obj));
+    const TexturePtr& texture = row.field.template get<TexturePtr>(obj);
+    return row.hook == kRequiredChild ? saveRequiredMember(ar, texture) : saveOptionalMember(ar, texture);
+}
 
 // Resets `obj` and reads a version tag of 1 to `newest`, then the rows that
 // the version holds. False for a refused tag or a child that doesn't load.
@@ -16,40 +68,78 @@ bool loadTextureRecord(C& obj, QuickArchive& ar, const Rows& rows, int newest) {
     obj.reset();
     const int v = readVersion(ar, 1, newest);
     if (v < 0) return false;
-    return readFields(ar, obj, rows, v, [&](const RecordRow<C>& row) {
-        return loadOptionalMember(ar, row.field.template get<TexturePtr>(obj), createTexture);
-    });
+    return readFields(ar, obj, rows, v, [&](const RecordRow<C>& row) { return loadTextureChild(ar, obj, row); });
 }
 
-// Writes the tag of version `newest` and the rows of that version.
+// Writes the tag of version `newest` and the rows of that version; false,
+// with nothing written, if a required child is missing.
 template <class C, class Rows>
 bool saveTextureRecord(const C& obj, QuickArchive& ar, const Rows& rows, int newest) {
+    for (const RecordRow<C>& row : rows) {
+        if (isGeneratorChild(row) && !row.field.template get<UVWPtr>(obj)) return false;
+        if (isTextureChild(row) && row.hook == kRequiredChild && !row.field.template get<TexturePtr>(obj))
+            return false;
+    }
     writeVersion(ar, newest);
-    return writeFields(ar, obj, rows, newest, [&](const RecordRow<C>& row) {
-        return saveOptionalMember(ar, row.field.template get<TexturePtr>(obj));
-    });
+    return writeFields(ar, obj, rows, newest, [&](const RecordRow<C>& row) { return saveTextureChild(ar, obj, row); });
 }
 
-// Every row equal: plain fields as the row form compares them, textures
+// Every row equal: plain fields as the row form compares them, children
 // through their own isEqual.
 template <class C, class Rows>
 bool rowsEqual(const C& a, const C& b, const Rows& rows) {
     for (const RecordRow<C>& row : rows) {
-        if (row.field.kind() != FieldRef<C>::Kind::Texture) continue;
-        const TexturePtr& x = row.field.template get<TexturePtr>(a);
-        if (!childrenEqual(x, row.field.template get<TexturePtr>(b))) return false;
+        if (isGeneratorChild(row) &&
+            !childrenEqual(row.field.template get<UVWPtr>(a), row.field.template get<UVWPtr>(b)))
+            return false;
+        if (isTextureChild(row) &&
+            !childrenEqual(row.field.template get<TexturePtr>(a), row.field.template get<TexturePtr>(b)))
+            return false;
     }
     return fieldsEqual(a, b, rows);
 }
 
-// On a fresh copy: every texture of the table cloned.
+// On a fresh copy: every child of the table cloned.
 template <class C, class Rows>
 void cloneTextureRows(C& copy, const Rows& rows) {
     for (const RecordRow<C>& row : rows) {
-        if (row.field.kind() != FieldRef<C>::Kind::Texture) continue;
-        TexturePtr& texture = row.field.template get<TexturePtr>(copy);
-        texture = cloneChild(texture);
+        if (isGeneratorChild(row)) {
+            UVWPtr& generator = row.field.template get<UVWPtr>(copy);
+            generator = cloneChild(generator);
+        } else if (isTextureChild(row)) {
+            TexturePtr& texture = row.field.template get<TexturePtr>(copy);
+            texture = cloneChild(texture);
+        }
     }
+}
+
+// The Asset of a texture whose table names its parameters: a slot per child
+// row in table order, then the parameters in their order, a child referred
+// to from its slot. Hook rows that aren't children go to `hook(row)`.
+template <class C, class Rows, class Hook>
+void writeTextureRows(AssetXmlWriter& w, const C& obj, const std::u16string& url, const Rows& rows, Hook hook) {
+    TextureFrame frame(w, obj, url);
+    std::vector<std::pair<const RecordRow<C>*, SlotRef>> slots;
+    for (const RecordRow<C>& row : rows) {
+        if (!isGeneratorChild(row) && !isTextureChild(row)) continue;
+        const std::u16string word = row.xml.slot ? std::u16string(row.xml.slot)
+                                    : row.xml.name ? utf8ToWide(row.xml.name)
+                                                   : std::u16string();
+        slots.emplace_back(&row, isGeneratorChild(row) ? frame.slot(row.field.template get<UVWPtr>(obj), word.c_str())
+                                                       : frame.slot(row.field.template get<TexturePtr>(obj), word.c_str()));
+    }
+    frame.open();
+    writeShownFields(w, obj, rows, [&](const RecordRow<C>& row) {
+        for (const auto& slot : slots)
+            if (slot.first == &row) return frame.writeRef(row.xml.name, slot.second);
+        hook(row);
+    });
+    frame.close();
+}
+
+template <class C, class Rows>
+void writeTextureRows(AssetXmlWriter& w, const C& obj, const std::u16string& url, const Rows& rows) {
+    writeTextureRows(w, obj, url, rows, [](const RecordRow<C>&) {});
 }
 
 }  // namespace OrvaneLumoCore

@@ -99,7 +99,8 @@ void writeParam(AssetXmlWriter& w, const ParamRow<C>& row, const C& obj) {
         case Kind::NarrowText: w.writeString(name, f.template get<std::string>(obj), label, row.isUserData); break;
         case Kind::None:
         case Kind::Texture:
-        case Kind::Material: break;
+        case Kind::Material:
+        case Kind::Generator: break;
     }
 }
 
@@ -145,11 +146,12 @@ ParamRow<C> shownParam(const RecordRow<C>& row) {
 // Writes the parameters that the rows of a record table show (the rows with
 // a name): in the order of their places where the rows give places, those
 // without a place behind them in table order; otherwise in table order. A
-// child's row, and a hook row, goes to `hook(row)`.
+// child's row, a hook row and a row shown in a form of the class's own go to
+// `hook(row)`.
 template <class C, class Rows, class Hook>
 void writeShownFields(AssetXmlWriter& w, const C& obj, const Rows& rows, Hook hook) {
     auto writeRow = [&](const RecordRow<C>& row) {
-        if (row.field.isChild() || row.use == RowUse::Hook)
+        if (row.field.isChild() || row.use == RowUse::Hook || row.xml.form != 0)
             hook(row);
         else
             writeParam(w, shownParam(row), obj);
