@@ -2,6 +2,9 @@
 // The two interfaces of every model class: the binary record and the XML Asset.
 #include <string>
 
+// The writer (xml/AssetXmlWriter.h) is only named here, by reference: the
+// archive's folder stands below xml/ and doesn't include it; a class that
+// writes its Asset includes the writer itself.
 class AssetXmlWriter;
 
 class OrvaneXMLSerializable {

@@ -25,7 +25,7 @@ int wmain(int argc, wchar_t** argv) {
 
     std::vector<std::string> args;
     for (int i = 1; i < argc; ++i) args.push_back(platform::utf8Path(argv[i], std::wcslen(argv[i])));
-    const int status = runProgram(args);
+    const int status = platform::runProgram(args);
 
     std::fflush(nullptr);
     if (console) SetConsoleOutputCP(codePage);

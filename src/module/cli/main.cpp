@@ -45,9 +45,8 @@ int closeReport(std::FILE* report, const std::string& path, int status) {
     return status;
 }
 
-}  // namespace
-
-int runProgram(const std::vector<std::string>& args) {
+// The command with the arguments behind its name; returns the exit status.
+int runCommand(const std::vector<std::string>& args) {
     using namespace orvxml;
     platform::catchInterrupts();
     int status = 0;
@@ -128,3 +127,8 @@ int runProgram(const std::vector<std::string>& args) {
     status = collector.finish(platform::interruption());
     return closeReport(report, settings.reportPath, status);
 }
+
+// The entry point of the system (platform/Program*.cpp) runs the command.
+[[maybe_unused]] const bool kNamed = platform::setProgram(&runCommand);
+
+}  // namespace
