@@ -267,11 +267,9 @@ private:
             slots({checker->white_color, checker->black_color});
         } else if (const SkyTexture* sky = dynamic_cast<const SkyTexture*>(&t)) {
             light(sky->sun);
-        } else {
-            byTable<AColorTexture>(t);
         }
-        // UVW generators hold neither paths nor textures; bulge, cloth and the
-        // UVW texture hold nothing else.
+        // UVW generators hold neither paths nor textures; bulge, cloth, the
+        // constant colour and the UVW texture hold nothing else.
     }
 
     void light(const LightPtr& l) {
@@ -555,13 +553,6 @@ std::size_t checkReferences(std::vector<FileReference>& references, const std::s
         if (!ref.found) ++missing;
     }
     return missing;
-}
-
-std::string folderOf(const std::string& path) {
-    const std::size_t last = path.find_last_of(platform::kPathSeparators);
-    if (last == std::string::npos) return ".";
-    if (last == 0) return path.substr(0, 1);
-    return path.substr(0, last);
 }
 
 // ---- lines and JSON -----------------------------------------------------------------

@@ -122,9 +122,6 @@ bool resolveReference(const std::u16string& stored, PathUse use, const std::stri
 std::size_t checkReferences(std::vector<FileReference>& references, const std::string& libraryFolder,
                             const std::vector<std::string>& searchFolders);
 
-// The folder that holds the file `path` (UTF-8): "." for a bare name.
-std::string folderOf(const std::string& path);
-
 // ---- lines and JSON -----------------------------------------------------------------
 //
 // Text is UTF-8; in a text line a control character shows as \xNN. Each

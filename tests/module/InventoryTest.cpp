@@ -634,11 +634,4 @@ TEST_F(InventoryResolve, CheckedReferencesShowWhereTheyWereFound) {
     EXPECT_NE(referenceJson(refs[2]).find("\"use\": \"written\", \"status\": \"written\""), std::string::npos);
 }
 
-TEST(InventoryFolders, FolderOfAPath) {
-    EXPECT_EQ(folderOf("libs/walls.orvmat"), "libs");
-    EXPECT_EQ(folderOf("walls.orvmat"), ".");
-    EXPECT_EQ(folderOf("/walls.orvmat"), "/");
-    EXPECT_EQ(folderOf("/a/b/walls.orvmat"), "/a/b");
-}
-
 }  // namespace

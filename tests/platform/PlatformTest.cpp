@@ -8,6 +8,7 @@
 #include <string>
 
 #include "platform/NumberFormat.h"
+#include "platform/Path.h"
 #include "platform/Text.h"
 #include "platform/Uuid.h"
 #include "platform/WideChar.h"
@@ -129,6 +130,29 @@ TEST(Uuid, RandomVersion4LowerCaseWithoutBraces) {
     EXPECT_NE(a, b);
     EXPECT_TRUE(std::regex_match(narrow(a), std::regex(
         "[0-9a-f]{8}-[0-9a-f]{4}-4[0-9a-f]{3}-[89ab][0-9a-f]{3}-[0-9a-f]{12}")));
+}
+
+TEST(Path, FolderOfAPathByTheGivenSeparators) {
+    const struct {
+        const char* path;
+        const char* separators;
+        const char* folder;
+    } cases[] = {
+        {"libs/walls.orvmat", "/", "libs"},
+        {"walls.orvmat", "/", "."},
+        {"/walls.orvmat", "/", "/"},
+        {"/a/b/walls.orvmat", "/", "/a/b"},
+        {"out/", "/", "out"},
+        // A "\" is part of a name unless the set holds it.
+        {"C:\\libs\\walls.orvmat", "/", "."},
+        {"C:\\libs\\walls.orvmat", "/\\", "C:\\libs"},
+        {"C:\\walls.orvmat", "/\\", "C:"},
+        {"\\walls.orvmat", "/\\", "\\"},
+        {"a/b\\c.png", "/\\", "a/b"},
+        {"a\\b/c.png", "/\\", "a\\b"},
+    };
+    for (const auto& c : cases)
+        EXPECT_EQ(platform::folderOf(c.path, c.separators), c.folder) << c.path << " by " << c.separators;
 }
 
 }  // namespace

@@ -9,6 +9,7 @@
 
 #include "module/cli/Workers.h"
 #include "platform/Interrupt.h"
+#include "platform/Path.h"
 #include "platform/System.h"
 #include "platform/Text.h"
 
@@ -26,11 +27,6 @@ std::u16string toWide(const std::string& bytes) {
 }
 
 std::string partPath(const std::string& path, unsigned long pid) { return path + ".part" + std::to_string(pid); }
-
-std::string folderOf(const std::string& path) {
-    const std::size_t slash = path.find_last_of(platform::kPathSeparators);
-    return slash == std::string::npos ? std::string(".") : path.substr(0, slash);
-}
 
 int makeFolders(const std::string& dir) {
     int error = 0;
@@ -96,7 +92,7 @@ int writeFile(const std::string& path, const std::string& bytes) {
     int error = platform::writeNewFile(part, bytes);
     // Folders are made as their first output is written, so that files
     // that give none leave no empty folder behind.
-    if (error == ENOENT && makeFolders(folderOf(path)) == 0) error = platform::writeNewFile(part, bytes);
+    if (error == ENOENT && makeFolders(platform::folderOf(path, platform::kPathSeparators)) == 0) error = platform::writeNewFile(part, bytes);
     if (error == 0 && (error = platform::replaceFile(part, path)) != 0) platform::removeFile(part);
     return error;
 }

@@ -55,9 +55,6 @@ void runJobs(const std::vector<Job>& jobs, unsigned workers, const ResultSink& s
 // true with the exit status. Elsewhere it returns false.
 bool runAsWorker(const std::vector<std::string>& args, int& status);
 
-// The folder part of `path`; "." for a bare name.
-std::string folderOf(const std::string& path);
-
 // Creates `dir` and the folders above it that are missing. Returns 0, or
 // the errno of the failure.
 int makeFolders(const std::string& dir);

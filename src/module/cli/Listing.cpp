@@ -1,12 +1,12 @@
 #include "module/cli/Listing.h"
 
-#include <cerrno>
-#include <cstring>
 #include <string>
 
 #include "module/Inventory.h"
 #include "module/cli/Report.h"
 #include "platform/Interrupt.h"
+#include "platform/Path.h"
+#include "platform/System.h"
 
 namespace orvxml {
 
@@ -29,7 +29,7 @@ private:
         return "{\"path\": " + jsonString(job.source) + ", \"kind\": \"" +
                (job.kind == FileKind::Materials ? "materials" : "options") + "\", ";
     }
-    void say(const Job& job, const std::string& line);
+    void say(const Job& job, const std::string& line) { tally_.say(job.source, line); }
     void record(const std::string& json);
     // A file that isn't listed: why, on every channel.
     void failed(const Job& job, FileStatus status, const std::string& reason);
@@ -39,14 +39,10 @@ private:
     const Settings& settings_;
     const OrvaneLumoCore::PathRules& rules_;
     std::FILE* report_;
-    std::size_t done_ = 0, loaded_ = 0, items_ = 0, missing_ = 0, texts_ = 0, unreadable_ = 0;
-    int stdoutError_ = 0;
+    // The files listed count as documents.
+    Tally tally_;
+    std::size_t done_ = 0, items_ = 0, missing_ = 0;
 };
-
-void Listing::say(const Job& job, const std::string& line) {
-    if (std::printf("%s: %s\n", job.source.c_str(), line.c_str()) < 0 && !stdoutError_)
-        stdoutError_ = errno ? errno : EIO;
-}
 
 void Listing::record(const std::string& json) {
     if (report_) std::fprintf(report_, "%s\n", json.c_str());
@@ -54,9 +50,9 @@ void Listing::record(const std::string& json) {
 
 void Listing::failed(const Job& job, FileStatus status, const std::string& reason) {
     const bool text = status == FileStatus::Text;
-    ++(text ? texts_ : unreadable_);
+    tally_.count(status);
     say(job, (text ? "text: " : "unreadable: ") + reason);
-    if (!text) std::fprintf(stderr, "orvxml: %s: %s\n", job.source.c_str(), reason.c_str());
+    if (!text) Tally::unreadableFile(job.source, reason);
     record((job.hasKind ? jsonHead(job) : "{\"path\": " + jsonString(job.source) + ", \"kind\": null, ") +
            "\"status\": \"" + (text ? "text" : "unreadable") + "\", \"reason\": " + jsonString(reason) + "}");
 }
@@ -64,7 +60,7 @@ void Listing::failed(const Job& job, FileStatus status, const std::string& reaso
 void Listing::list(const Job& job) {
     const OrvaneLumoCore::FileListing listing = OrvaneLumoCore::listFile(job.widePath, job.kind);
     if (listing.status != FileStatus::Document) return failed(job, listing.status, listing.reason);
-    ++loaded_;
+    tally_.count(FileStatus::Document);
     const std::string head = jsonHead(job) + "\"status\": \"document\", ";
     if (job.kind == FileKind::Options) {
         say(job, OrvaneLumoCore::listingLine(listing.options));
@@ -81,7 +77,7 @@ void Listing::list(const Job& job) {
 void Listing::references(const Job& job) {
     OrvaneLumoCore::FileReferences found = OrvaneLumoCore::listFileReferences(job.widePath, job.kind);
     if (found.status != FileStatus::Document) return failed(job, found.status, found.reason);
-    ++loaded_;
+    tally_.count(FileStatus::Document);
     // The rules apply before the files are looked for: a reference is found
     // where its rewritten path leads.
     std::vector<std::u16string> stored(found.references.size());
@@ -92,7 +88,7 @@ void Listing::references(const Job& job) {
             found.references[i].path = rewritten;
         }
     }
-    missing_ += OrvaneLumoCore::checkReferences(found.references, OrvaneLumoCore::folderOf(job.source),
+    missing_ += OrvaneLumoCore::checkReferences(found.references, platform::folderOf(job.source, platform::kPathSeparators),
                                                 settings_.searchFolders);
     for (std::size_t i = 0; i < found.references.size(); ++i) {
         const OrvaneLumoCore::FileReference& reference = found.references[i];
@@ -120,23 +116,18 @@ void Listing::run(const Job& job) {
 }
 
 int Listing::finish(std::size_t files) {
-    errno = 0;
-    if (std::fflush(stdout) != 0 && !stdoutError_) stdoutError_ = errno ? errno : EIO;
-    if (stdoutError_)
-        std::fprintf(stderr, "orvxml: can't write standard output: %s\n", std::strerror(stdoutError_));
+    tally_.flushStandardOutput();
     if (!settings_.quiet) {
         if (settings_.mode == Mode::List)
-            std::fprintf(stderr, "orvxml: %zu files listed, %zu materials", loaded_, items_);
+            std::fprintf(stderr, "orvxml: %zu files listed, %zu materials", tally_.documents, items_);
         else
-            std::fprintf(stderr, "orvxml: %zu references in %zu files, %zu missing", items_, loaded_, missing_);
-        std::fprintf(stderr, ", %zu fell back to text, %zu unreadable\n", texts_, unreadable_);
+            std::fprintf(stderr, "orvxml: %zu references in %zu files, %zu missing", items_, tally_.documents,
+                         missing_);
+        tally_.summaryEnd();
+        std::fputs("\n", stderr);
     }
-    if (const int signal = platform::interruption()) {
-        std::fprintf(stderr, "orvxml: interrupted, %zu of %zu files not read\n", files - done_, files);
-        return 128 + signal;
-    }
-    if (unreadable_ || stdoutError_) return 3;
-    return texts_ || missing_ ? 1 : 0;
+    if (const int signal = platform::interruption()) return Tally::interrupted(signal, files - done_, files, "read");
+    return tally_.status(false, missing_ != 0);
 }
 
 }  // namespace

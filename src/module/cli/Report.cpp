@@ -47,6 +47,42 @@ std::string jsonLine(const Job& job, const FileResult& r) {
            (job.xml && !job.xml->pathRules.empty() ? ", \"remapped\": " + remappedJson(r) : std::string()) + "}";
 }
 
+void Tally::count(FileStatus status) {
+    switch (status) {
+    case FileStatus::Document: ++documents; break;
+    case FileStatus::Text: ++texts; break;
+    case FileStatus::Unreadable: ++unreadable; break;
+    }
+}
+
+bool Tally::say(const std::string& source, const std::string& line) {
+    if (std::printf("%s: %s\n", source.c_str(), line.c_str()) >= 0) return true;
+    if (!stdoutError) stdoutError = errno ? errno : EIO;
+    return false;
+}
+
+void Tally::unreadableFile(const std::string& source, const std::string& reason) {
+    std::fprintf(stderr, "orvxml: %s: %s\n", source.c_str(), reason.c_str());
+}
+
+void Tally::flushStandardOutput() {
+    errno = 0;
+    if (std::fflush(stdout) != 0 && !stdoutError) stdoutError = errno ? errno : EIO;
+    if (stdoutError) std::fprintf(stderr, "orvxml: can't write standard output: %s\n", std::strerror(stdoutError));
+}
+
+void Tally::summaryEnd() const { std::fprintf(stderr, ", %zu fell back to text, %zu unreadable", texts, unreadable); }
+
+int Tally::interrupted(int signal, std::size_t left, std::size_t files, const char* verb) {
+    std::fprintf(stderr, "orvxml: interrupted, %zu of %zu files not %s\n", left, files, verb);
+    return 128 + signal;
+}
+
+int Tally::status(bool failed, bool fellShort) const {
+    if (unreadable || stdoutError || failed) return 3;
+    return texts || fellShort ? 1 : 0;
+}
+
 Collector::Collector(const std::vector<Job>& jobs, bool explain, bool quiet, Progress& progress,
                      std::FILE* report, bool update)
     : jobs_(jobs),
@@ -70,11 +106,7 @@ bool Collector::add(std::size_t index, const FileResult& result) {
         ++notWritten_;
         if (!noSpace_ && stopsTheRun(result)) noSpace_ = result.writeErrno;
     } else {
-        switch (result.status) {
-        case FileStatus::Document: ++documents_; break;
-        case FileStatus::Text: ++texts_; break;
-        case FileStatus::Unreadable: ++unreadable_; break;
-        }
+        tally_.count(result.status);
     }
     while (next_ < results_.size() && arrived_[next_]) {
         emit(next_);
@@ -91,12 +123,9 @@ void Collector::emit(std::size_t index) {
     const FileResult& r = results_[index];
     const bool unreadable = r.status == FileStatus::Unreadable && !r.upToDate;
     if (unreadable || !r.writeError.empty() || explain_) progress_.clear();
-    if (explain_ && std::printf("%s: %s\n", job.source.c_str(), r.line.c_str()) < 0 && !stdoutError_) {
-        stdoutError_ = errno ? errno : EIO;
-        if (platform::isNoSpace(stdoutError_) && !noSpace_) noSpace_ = stdoutError_;
-    }
-    if (unreadable)
-        std::fprintf(stderr, "orvxml: %s: %s\n", job.source.c_str(), r.reason.c_str());
+    if (explain_ && !tally_.say(job.source, r.line) && platform::isNoSpace(tally_.stdoutError) && !noSpace_)
+        noSpace_ = tally_.stdoutError;
+    if (unreadable) Tally::unreadableFile(job.source, r.reason);
     if (!r.writeError.empty()) std::fprintf(stderr, "orvxml: can't write %s\n", r.writeError.c_str());
     if (report_) std::fprintf(report_, "%s\n", jsonLine(job, r).c_str());
 }
@@ -105,30 +134,22 @@ int Collector::finish(int interruption) {
     // An interrupted run leaves gaps: what came in after one still shows.
     for (std::size_t i = next_; i < results_.size(); ++i)
         if (arrived_[i]) emit(i);
-    errno = 0;
-    if (std::fflush(stdout) != 0 && !stdoutError_) stdoutError_ = errno ? errno : EIO;
     progress_.clear();
-    if (stdoutError_)
-        std::fprintf(stderr, "orvxml: can't write standard output: %s\n", std::strerror(stdoutError_));
+    tally_.flushStandardOutput();
     if (!quiet_) {
         const double seconds =
             std::chrono::duration<double>(std::chrono::steady_clock::now() - start_).count();
-        std::fprintf(stderr, "orvxml: %zu converted, %zu fell back to text, %zu unreadable", documents_,
-                     texts_, unreadable_);
+        std::fprintf(stderr, "orvxml: %zu converted", tally_.documents);
+        tally_.summaryEnd();
         if (notWritten_) std::fprintf(stderr, ", %zu not written", notWritten_);
         if (update_) std::fprintf(stderr, ", %zu up to date", upToDate_);
         std::fprintf(stderr, " (%.2f s)\n", seconds);
     }
-    if (interruption) {
-        std::fprintf(stderr, "orvxml: interrupted, %zu of %zu files not converted\n", jobs_.size() - done_,
-                     jobs_.size());
-        return 128 + interruption;
-    }
+    if (interruption) return Tally::interrupted(interruption, jobs_.size() - done_, jobs_.size(), "converted");
     if (noSpace_ && done_ < jobs_.size())
         std::fprintf(stderr, "orvxml: stopped: no space for the outputs (%s), %zu of %zu files not "
                      "converted\n", std::strerror(noSpace_), jobs_.size() - done_, jobs_.size());
-    if (unreadable_ || notWritten_ || stdoutError_) return 3;
-    return texts_ ? 1 : 0;
+    return tally_.status(notWritten_ != 0, false);
 }
 
 }  // namespace orvxml

@@ -21,6 +21,30 @@ std::string jsonString(const std::string& bytes);
 // milliseconds, and with path rules "remapped": the paths they rewrote.
 std::string jsonLine(const Job& job, const FileResult& result);
 
+// What a conversion and a listing both count and say: how many files ended
+// in each status, the lines on standard output and its first failure, the
+// unreadable files on standard error, the end of the summary and the exit
+// status.
+struct Tally {
+    std::size_t documents = 0, texts = 0, unreadable = 0;
+    int stdoutError = 0;  // the errno of the first line standard output refused, or 0
+
+    void count(OrvaneLumoCore::FileStatus status);
+    // "source: line" on standard output; false if it wasn't written.
+    bool say(const std::string& source, const std::string& line);
+    // "orvxml: source: reason" on standard error.
+    static void unreadableFile(const std::string& source, const std::string& reason);
+    // Flushes standard output and says on standard error if it failed, now or before.
+    void flushStandardOutput();
+    // ", N fell back to text, N unreadable": how the summary goes on.
+    void summaryEnd() const;
+    // "orvxml: interrupted, N of N files not <verb>"; returns 128 + the signal.
+    static int interrupted(int signal, std::size_t left, std::size_t files, const char* verb);
+    // 3 when a file was unreadable, standard output refused a line or
+    // `failed`; else 1 when a file fell back to text or `fellShort`; else 0.
+    int status(bool failed, bool fellShort) const;
+};
+
 // Collects the results as they come in, in any order, and passes them on in
 // the order of the jobs, so that every output of a run is the same whatever
 // the number of workers.
@@ -50,9 +74,9 @@ private:
     std::vector<bool> arrived_;
     std::size_t next_ = 0, done_ = 0;
     // Each result counts once: not written if its output failed, else by its status.
-    std::size_t documents_ = 0, texts_ = 0, unreadable_ = 0, notWritten_ = 0, upToDate_ = 0;
-    int noSpace_ = 0;      // the errno of the write that stopped the run, or 0
-    int stdoutError_ = 0;  // the errno of the first failed --explain line, or 0
+    Tally tally_;
+    std::size_t notWritten_ = 0, upToDate_ = 0;
+    int noSpace_ = 0;  // the errno of the write that stopped the run, or 0
     std::chrono::steady_clock::time_point start_;
 };
 
