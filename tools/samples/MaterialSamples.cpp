@@ -1,13 +1,12 @@
 // Material libraries: current records through the library's own save, and
 // old container and record versions laid by hand, as older writers left them.
 #include <cstdint>
-#include <fstream>
 #include <vector>
 
+#include "SampleParts.h"
 #include "Samples.h"
 #include "materials/Brdf.h"
 #include "materials/LayeredMaterials.h"
-#include "module/OrvMatFile.h"
 #include "persistence/QuickArchive.h"
 #include "textures/BasicTextures.h"
 #include "textures/Bitmaps.h"
@@ -18,23 +17,11 @@ namespace samples {
 
 namespace {
 
-bool saveLibrary(const std::vector<MaterialPtr>& materials, const std::string& path) {
-    OrvMatFile file;
-    file.materials = materials;
-    return file.save(utf8ToWide(path));
-}
-
 template <class L>
 boost::shared_ptr<L> namedLayer(const char16_t* name) {
     boost::shared_ptr<L> layer(new L);
     layer->name = name;
     return layer;
-}
-
-TexturePtr constantColor(float r, float g, float b) {
-    boost::shared_ptr<AColorTexture> t(new AColorTexture);
-    t->color = AColor(r, g, b, 1);
-    return t;
 }
 
 // One layered material with each of the six layers, textures in some slots.
@@ -81,8 +68,7 @@ bool writeTopLevelKinds(const std::string& path) {
 }
 
 // The material stream of two materials in old record versions.
-std::vector<char> oldRecordStream() {
-    QuickArchive ar;
+void writeOldRecordStream(QuickArchive& ar) {
     // MaterialLayeredBRDF version 1: layers, double_sided, layered_value_a,
     // inline name.
     ar.writeInt(kMaterialLayeredBRDF);
@@ -96,14 +82,8 @@ std::vector<char> oldRecordStream() {
     ar.writeUInt(0x10000);
     ar.writeColor(Color(0.8f, 0.1f, 0.1f));
     ar.writeColor(Color(0.3f, 0.3f, 0.3f));
-    ar.writeFloat(0.8f);
-    ar.writeFloat(0.9f);
-    ar.writeFloat(1.6f);
-    ar.writeFloat(0.01f);
-    ar.writeInt(8);
-    ar.writeInt(1);
-    ar.writeInt(0);
-    ar.writeInt(5);
+    writeFloats(ar, {0.8f, 0.9f, 1.6f, 0.01f});
+    writeInts(ar, {8, 1, 0, 5});
 
     // Glass_BRDF version 2: rows 1 to 3 (colours, five floats, four
     // integers); three multipliers; paths of transparency_tex,
@@ -112,18 +92,9 @@ std::vector<char> oldRecordStream() {
     ar.writeUInt(0x20000);
     ar.writeColor(Color(1, 1, 1));
     ar.writeColor(Color(0.9f, 1, 0.9f));
-    ar.writeFloat(1.5f);
-    ar.writeFloat(1.5f);
-    ar.writeFloat(0.001f);
-    ar.writeFloat(1);
-    ar.writeFloat(1);
-    ar.writeInt(5);
-    ar.writeInt(8);
-    ar.writeInt(1);
-    ar.writeInt(0);
-    ar.writeFloat(1);
-    ar.writeFloat(0.5f);
-    ar.writeFloat(1);
+    writeFloats(ar, {1.5f, 1.5f, 0.001f, 1, 1});
+    writeInts(ar, {5, 8, 1, 0});
+    writeFloats(ar, {1, 0.5f, 1});
     ar.writeWString(u"textures/glass_tint.png");
     ar.writeWString(u"");
     ar.writeWString(u"");
@@ -135,11 +106,8 @@ std::vector<char> oldRecordStream() {
     ar.writeUInt(0x20000);
     ar.writeColor(Color(1, 1, 1));
     ar.writeColor(Color(0.5f, 0.5f, 0.5f));
-    ar.writeFloat(1);
-    ar.writeFloat(1.55f);
-    ar.writeFloat(0.01f);
-    ar.writeInt(0);
-    ar.writeInt(1);
+    writeFloats(ar, {1, 1.55f, 0.01f});
+    writeInts(ar, {0, 1});
     ar.writeWString(u"textures/mirror_mask.png");
     ar.writeFloat(1);
     ar.writeWString(u"");
@@ -152,48 +120,28 @@ std::vector<char> oldRecordStream() {
     // name, then a Diffuse_BRDF version 1 (colours, multipliers, two paths).
     ar.writeInt(kMaterialSingleBRDF);
     ar.writeUInt(0x10000);
-    ar.writeInt(0);
-    ar.writeInt(0);
+    writeInts(ar, {0, 0});
     ar.writeWString(u"OldSingle");
     ar.writeInt(kDiffuseBrdf);
     ar.writeUInt(0x10000);
     ar.writeColor(Color(0.5f, 0.4f, 0.3f));
     ar.writeColor(Color(0, 0, 0));
-    ar.writeFloat(1);
-    ar.writeFloat(1);
+    writeFloats(ar, {1, 1});
     ar.writeWString(u"textures/stone.png");
     ar.writeWString(u"");
-
-    std::vector<char> bytes(static_cast<std::size_t>(ar.getWritePosition()));
-    ar.getRaw(bytes.data(), bytes.size());
-    return bytes;
 }
 
-// A container of version 1 or 2: the header, then the material stream
-// directly behind it (version 1 files were written in text mode).
-bool writeOldContainer(const std::string& path, std::uint32_t version, std::uint32_t count,
-                       const std::vector<char>& stream) {
-    std::ofstream out(path.c_str(), std::ios::out | std::ios::binary | std::ios::trunc);
-    if (!out) return false;
-    const std::uint32_t header[2] = {version << 16, count};
-    out.write(reinterpret_cast<const char*>(header), sizeof header);
-    out.write(stream.data(), static_cast<std::streamsize>(stream.size()));
-    return static_cast<bool>(out);
-}
-
+// Containers of version 2 and 1 around the same material stream.
 bool writeOldRecordsV2(const std::string& path) {
-    return writeOldContainer(path, 2, 2, oldRecordStream());
+    QuickArchive ar;
+    writeOldRecordStream(ar);
+    return writeOldContainer(path, 2, 2, ar);
 }
 
 bool writeOldRecordsV1(const std::string& path) {
-    // Text mode turned each line feed into a carriage return and a line
-    // feed; the reader undoes that.
-    std::vector<char> crlf;
-    for (char c : oldRecordStream()) {
-        if (c == '\n') crlf.push_back('\r');
-        crlf.push_back(c);
-    }
-    return writeOldContainer(path, 1, 2, crlf);
+    QuickArchive ar;
+    writeOldRecordStream(ar);
+    return writeOldContainer(path, 1, 2, ar);
 }
 
 }  // namespace

@@ -9,11 +9,11 @@
 #include <string>
 #include <vector>
 
+#include "SampleParts.h"
 #include "Samples.h"
 #include "lights/SunIesDome.h"
 #include "materials/Brdf.h"
 #include "materials/LayeredMaterials.h"
-#include "module/OrvMatFile.h"
 #include "persistence/QuickArchive.h"
 #include "persistence/Record.h"
 #include "textures/BasicTextures.h"
@@ -39,16 +39,6 @@ MaterialPtr materialOf(const char16_t* name,
         m->brdfs.push_back(diffuse);
     }
     return m;
-}
-
-bool saveLibrary(const std::vector<MaterialPtr>& materials, const std::string& path) {
-    OrvMatFile file;
-    file.materials = materials;
-    return file.save(utf8ToWide(path));
-}
-
-TexturePtr constantColor(float r, float g, float b, float a = 1) {
-    return TexturePtr(new AColorTexture(AColor(r, g, b, a)));
 }
 
 UVWPtr channelGenerator(int channel, float rotation) {
@@ -106,62 +96,59 @@ bool writeProcedural(const std::string& path) {
 
 // ---- old procedural records ----
 
+// The children, each as tag and record; false if one is missing.
+template <class... Child>
+bool saveChildren(QuickArchive& ar, const Child&... children) {
+    return (saveRequiredMember(ar, children) && ...);
+}
+
 // GridTexture version 1: uvw, line_color, fill_color, u_width, v_width.
-class GridTextureV1 : public GridTexture {
-public:
-    bool save(QuickArchive& ar) const override {
-        writeVersion(ar, 1);
-        if (!saveRequiredMember(ar, uvw) || !saveRequiredMember(ar, line_color) ||
-            !saveRequiredMember(ar, fill_color))
-            return false;
-        ar.writeFloat(u_width);
-        ar.writeFloat(v_width);
-        return true;
-    }
-};
+bool layVersion1(QuickArchive& ar, const GridTexture& t) {
+    if (!saveChildren(ar, t.uvw, t.line_color, t.fill_color)) return false;
+    writeFloats(ar, {t.u_width, t.v_width});
+    return true;
+}
 
 // ClothTexture version 1: uvw, gap_color, u_color, v_color, u_width,
 // v_width. Without `tile`, a reader tiles in both directions.
-class ClothTextureV1 : public ClothTexture {
-public:
-    bool save(QuickArchive& ar) const override {
-        writeVersion(ar, 1);
-        if (!saveRequiredMember(ar, uvw)) return false;
-        ar.writeAColor(gap_color);
-        ar.writeAColor(u_color);
-        ar.writeAColor(v_color);
-        ar.writeFloat(u_width);
-        ar.writeFloat(v_width);
-        return true;
-    }
-};
+bool layVersion1(QuickArchive& ar, const ClothTexture& t) {
+    if (!saveChildren(ar, t.uvw)) return false;
+    for (const AColor& c : {t.gap_color, t.u_color, t.v_color}) ar.writeAColor(c);
+    writeFloats(ar, {t.u_width, t.v_width});
+    return true;
+}
 
 // CheckerTexture version 1: uvw, white_color, black_color, tile_u, tile_v.
-class CheckerTextureV1 : public CheckerTexture {
+bool layVersion1(QuickArchive& ar, const CheckerTexture& t) {
+    if (!saveChildren(ar, t.uvw, t.white_color, t.black_color)) return false;
+    ar.writeByte(t.tile_u);
+    ar.writeByte(t.tile_v);
+    return true;
+}
+
+// A texture whose save writes the version 1 record under its class's tag:
+// the version, then what layVersion1 lays for its class.
+template <class T>
+class Version1 : public T {
 public:
     bool save(QuickArchive& ar) const override {
         writeVersion(ar, 1);
-        if (!saveRequiredMember(ar, uvw) || !saveRequiredMember(ar, white_color) ||
-            !saveRequiredMember(ar, black_color))
-            return false;
-        ar.writeByte(tile_u);
-        ar.writeByte(tile_v);
-        return true;
+        return layVersion1(ar, *this);
     }
 };
 
 bool writeProceduralOld(const std::string& path) {
-    boost::shared_ptr<GridTextureV1> grid(new GridTextureV1);
+    boost::shared_ptr<Version1<GridTexture>> grid(new Version1<GridTexture>);
     grid->uvw = createUVW(4);
     grid->line_color = constantColor(0, 0, 0);
     grid->fill_color = constantColor(1, 1, 1);
     grid->u_width = 0.05f;
 
-    boost::shared_ptr<ClothTextureV1> cloth(new ClothTextureV1);
+    boost::shared_ptr<Version1<ClothTexture>> cloth(new Version1<ClothTexture>);
     cloth->uvw = createUVW(4);
     cloth->tile = false;  // not in a version 1 record: it reads as true
 
-    boost::shared_ptr<CheckerTextureV1> checker(new CheckerTextureV1);
+    boost::shared_ptr<Version1<CheckerTexture>> checker(new Version1<CheckerTexture>);
     checker->uvw = channelGenerator(3, 30);
     checker->white_color = constantColor(1, 1, 0);
     checker->tile_u = false;

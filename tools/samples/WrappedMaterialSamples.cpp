@@ -2,9 +2,9 @@
 // toon materials around layered ones, written by the library's own save, and
 // old records of the wrapping classes laid by hand.
 #include <cstdint>
-#include <fstream>
 #include <vector>
 
+#include "SampleParts.h"
 #include "Samples.h"
 #include "materials/Brdf.h"
 #include "materials/LayeredMaterials.h"
@@ -33,12 +33,6 @@ boost::shared_ptr<MaterialLayeredBRDF> layered(const char16_t* name, const char1
     layer->color = color;
     m->brdfs.push_back(layer);
     return m;
-}
-
-TexturePtr constantColor(float r, float g, float b) {
-    boost::shared_ptr<AColorTexture> t(new AColorTexture);
-    t->color = AColor(r, g, b, 1);
-    return t;
 }
 
 // Wall:  a bump over a two-sided material over two layered materials;
@@ -232,15 +226,7 @@ bool writeOldWrapperRecords(const std::string& path) {
     ar.writeWString(u"OldToon");
     ar.writeWString(u"");
 
-    std::vector<char> stream(static_cast<std::size_t>(ar.getWritePosition()));
-    ar.getRaw(stream.data(), stream.size());
-
-    std::ofstream out(path.c_str(), std::ios::out | std::ios::binary | std::ios::trunc);
-    if (!out) return false;
-    const std::uint32_t header[2] = {0x20000u, 5u};
-    out.write(reinterpret_cast<const char*>(header), sizeof header);
-    out.write(stream.data(), static_cast<std::streamsize>(stream.size()));
-    return static_cast<bool>(out);
+    return writeOldContainer(path, 2, 5, ar);
 }
 
 }  // namespace
