@@ -9,12 +9,10 @@
 
 namespace OrvaneLumoCore {
 
-class BaseCamera : public OrvaneSerializable, public OrvaneXMLSerializable {
+class BaseCamera : public OrvaneRecord {
 public:
-    ~BaseCamera() override = default;
     virtual std::uint32_t getType() const = 0;
     virtual boost::shared_ptr<BaseCamera> clone() const = 0;
-    virtual void reset() = 0;
 };
 
 typedef boost::shared_ptr<BaseCamera> CameraPtr;

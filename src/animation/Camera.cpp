@@ -157,39 +157,31 @@ bool RenderView::load(QuickArchive& ar) {
     const int version = readVersion(ar, 1, 3);
     reset();
     if (version < 0) return false;
+    if (version == 3) {
+        ar.readRect(viewRect1);
+        ar.readRect(viewRect2);
+        ar.readInt(img_width);
+        ar.readInt(img_height);
+        return loadNested(ar, viewAngle) && loadNested(ar, viewReal2) && loadNested(ar, viewReal3) &&
+               loadNested(ar, viewState) && loadNested(ar, cameraTransform);
+    }
+    // Versions 1 and 2: both rectangles, the three reals as f32 keys at time
+    // 0, the image size and the state flag. The transform comes first in
+    // version 1, as a key at time 0, and last in version 2, as its record.
     if (version == 1) {
-        // Version 1: transform (key at time 0), both rectangles, the three
-        // reals as f32 keys at time 0, the image size and the state flag.
         Transform t = cameraTransform.getValue(0.0);
         ar.readTransform(t);
         cameraTransform.setValue(t, 0.0);
-        ar.readRect(viewRect1);
-        ar.readRect(viewRect2);
-        readKeyAtZero(ar, viewAngle);
-        readKeyAtZero(ar, viewReal2);
-        readKeyAtZero(ar, viewReal3);
-        ar.readInt(img_width);
-        ar.readInt(img_height);
-        readStateFlag(ar, viewState);
-        return true;
     }
     ar.readRect(viewRect1);
     ar.readRect(viewRect2);
-    if (version == 2) {
-        // Version 2: the reals as f32 keys, the image size, the state flag,
-        // then the transform's record.
-        readKeyAtZero(ar, viewAngle);
-        readKeyAtZero(ar, viewReal2);
-        readKeyAtZero(ar, viewReal3);
-        ar.readInt(img_width);
-        ar.readInt(img_height);
-        readStateFlag(ar, viewState);
-        return loadNested(ar, cameraTransform);
-    }
+    readKeyAtZero(ar, viewAngle);
+    readKeyAtZero(ar, viewReal2);
+    readKeyAtZero(ar, viewReal3);
     ar.readInt(img_width);
     ar.readInt(img_height);
-    return loadNested(ar, viewAngle) && loadNested(ar, viewReal2) && loadNested(ar, viewReal3) &&
-           loadNested(ar, viewState) && loadNested(ar, cameraTransform);
+    readStateFlag(ar, viewState);
+    return version == 1 || loadNested(ar, cameraTransform);
 }
 
 void RenderView::writeXml(AssetXmlWriter& writer, std::u16string url) {

@@ -6,10 +6,8 @@
 
 namespace OrvaneLumoCore {
 
-class OrvaneOptionsBase : public OrvaneSerializable, public OrvaneXMLSerializable {
+class OrvaneOptionsBase : public OrvaneRecord {
 public:
-    ~OrvaneOptionsBase() override = default;
-    virtual void reset() = 0;
     std::u16string getAssetType() const override { return u"settings"; }
 };
 

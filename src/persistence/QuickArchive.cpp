@@ -151,13 +151,9 @@ void QuickArchive::readString(std::string& s) {
 void QuickArchive::writeWString(const std::u16string& s) { writeString(wideToUtf8(s)); }
 
 void QuickArchive::readWString(std::u16string& s) {
-    std::uint64_t n = 0;
-    readLength(n);
-    if (n == 0) {
-        s.clear();
-        return;
-    }
-    s = utf8ToWide(readCappedBytes(*this, n));
+    std::string bytes;
+    readString(bytes);
+    s = utf8ToWide(bytes);
 }
 
 void QuickArchive::writeColor(const Color& c) { writeFloat(c.r); writeFloat(c.g); writeFloat(c.b); }

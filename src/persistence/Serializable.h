@@ -39,4 +39,11 @@ public:
     virtual bool load(QuickArchive& ar) = 0;
 };
 
+// A record with an Asset of its own that can be set back to its defaults:
+// what the root of a family is.
+class OrvaneRecord : public OrvaneSerializable, public OrvaneXMLSerializable {
+public:
+    virtual void reset() = 0;
+};
+
 }  // namespace OrvaneLumoCore
