@@ -1,13 +1,10 @@
-// The six layers are described once as data: per class the rows of each
-// record version, the texture slots with their url words, and the XML
-// parameters. save, load, isEqual, clone and writeXml walk these tables.
+// The six layers are described once as data: per class one table of rows,
+// each a field with the versions that hold it, its default, the XML
+// parameter that shows it and, for a texture, the word of its slot. save,
+// load, reset, isEqual, clone and writeXml walk these tables.
 #include "materials/Brdf.h"
 
 #include <algorithm>
-#include <initializer_list>
-#include <vector>
-
-#include <boost/any.hpp>
 
 #include "persistence/FieldRows.h"
 #include "persistence/QuickArchive.h"
@@ -22,10 +19,12 @@ namespace OrvaneLumoCore {
 
 namespace {
 
-// ---- record rows -----------------------------------------------------------------
+// ---- the row form of a layer ---------------------------------------------------------
 //
-// A layer's record is one list of rows per version, in the one record row
-// form. Plain fields are written as bare member pointers; a texture member is
+// A table lists the rows of every version in record order; a version reads
+// the rows that hold it. Where old versions held a field at another place,
+// or a texture as a bare path, a row for that place stands beside the
+// field's own row, which carries the default and the XML. A texture row is
 // an optional texture member. The rows that need code are hook rows:
 
 enum LayerHook {
@@ -42,55 +41,174 @@ const RowHook kFresnelIor{kFresnelIorCode};
 const RowHook kFresnelSwitch{kFresnelSwitchCode};
 const RowHook kFresnelRule{kFresnelRuleCode};
 
-template <class L>
-using Rows = std::vector<RecordRow<L>>;
+// The colour "transparency" of the reflection layers: 1 - reflection per
+// component, 0 where negative.
+enum LayerForm { kFromReflection = 1 };
 
-// Rows of several groups, one after the other: a version of a record reads
-// like its table ("rows 1 to 3; rows 5 to 7").
+const Color kWhite(1, 1, 1);
+
 template <class L>
-Rows<L> join(std::initializer_list<Rows<L>> groups) {
-    Rows<L> all;
-    for (const Rows<L>& g : groups) all.insert(all.end(), g.begin(), g.end());
-    return all;
+RecordRow<L> path(TexturePtr L::*texture, int since, int until) {
+    return RecordRow<L>(texture, since, until).coded(kPathCode);
 }
 
+// What a load resets before it reads.
+enum class LoadResets { Layer, BaseRecordOnly };
+
+// What a layer class describes.
 template <class L>
-RecordRow<L> path(TexturePtr L::*texture) {
-    RecordRow<L> row(texture);
-    row.hook = kPathCode;
-    return row;
+struct LayerTable {
+    int newest;  // the version save writes
+    RowSpan<RecordRow<L>> rows;
+    TexturePtr L::*fresnelTarget;  // what the old Fresnel pair fills
+    // A new layer holds a Fresnel texture in the target, which a loaded
+    // layer doesn't keep.
+    bool newHoldsFresnel;
+    LoadResets loadResets;
+};
+
+// ---- Glass_BRDF ------------------------------------------------------------------------
+
+typedef Glass_BRDF G;
+typedef RecordRow<G> GlassRow;
+// field, since[, until] | XML parameter, its place | default
+const GlassRow kGlassRows[] = {
+    GlassRow(&G::color, "color", 1).byDefault(kWhite),
+    GlassRow(&G::fog_color, "fog_color", 3).byDefault(kWhite),
+    GlassRow(&G::ior, "ior", 8).byDefault(1.55),
+    GlassRow(&G::ior_second).byDefault(1.55),
+    GlassRow(&G::cutoff, "cutoff", 18).byDefault(0.001),
+    GlassRow(&G::fog_color_mult, "fog_color_mult", 9).byDefault(1),
+    GlassRow(&G::glossiness, "glossiness", 10).byDefault(1),
+    GlassRow(&G::depth_value).byDefault(5),
+    GlassRow(&G::subdivs, "subdivs", 20).byDefault(8),
+    GlassRow(&G::affect_shadows, "affect_shadows", 5).asFlag(),
+    GlassRow(&G::affect_alpha, "affect_alpha", 6).asFlag(),
+    GlassRow(&G::transparency_tex_mult, 2, 4),
+    GlassRow(&G::color_tex_mult, 5, "color_tex_mult", 19).byDefault(1),
+    GlassRow(&G::glossiness_tex_mult, 2, "glossiness_tex_mult", 11).byDefault(1),
+    GlassRow(&G::ior_tex_mult, 2, "ior_tex_mult", 12).byDefault(1),
+    path(&G::transparency_tex, 2, 3),
+    path(&G::glossiness_tex, 2, 3),
+    path(&G::ior_tex, 2, 3),
+    GlassRow(&G::translucency_on, 3, "translucency_on", 7).asFlag(),
+    GlassRow(&G::thickness, 3, "thickness", 16).byDefault(1000),
+    GlassRow(&G::scatter_coeff, 3, "scatter_coeff", 14),
+    GlassRow(&G::scatter_direction, 3, "scatter_direction", 15).byDefault(1),
+    GlassRow(&G::translucency_tex_mult, 3, "translucency_tex_mult", 13).byDefault(1),
+    GlassRow(&G::translucency, 3, "translucency", 4).byDefault(kWhite),
+    path(&G::translucency_tex, 3, 3),
+    GlassRow(&G::transparency_tex, 4, 4),
+    GlassRow(&G::color_tex, 5, "color_tex", 22).slot(u"color_texture"),
+    GlassRow(&G::glossiness_tex, 4, "glossiness_tex", 23).slot(u"glossy_texture"),
+    GlassRow(&G::ior_tex, 4, "ior_texture", 24).slot(u"ior_texture"),
+    GlassRow(&G::translucency_tex, 4, "translucency_tex", 25).slot(u"translucency_texture"),
+    GlassRow(&G::transparency, 5, "transparency", 2),
+    GlassRow(&G::transparency_tex_mult, 5, "transparency_tex_mult", 17).byDefault(1),
+    GlassRow(&G::transparency_tex, 5, "transparency_tex", 21).slot(u"transparency_texture"),
+    GlassRow(kBase, 6),
+};
+
+// ---- Phong_BRDF, Blinn_BRDF ------------------------------------------------------------
+
+typedef BaseGlossy_BRDF P;
+typedef RecordRow<P> GlossyRow;
+// Up to version 5 the Fresnel pair stands inside the head of the record.
+const GlossyRow kGlossyRows[] = {
+    GlossyRow(&P::color, "color", 1).byDefault(kWhite),
+    GlossyRow(&P::reflection, "transparency", 2).byDefault(kWhite).shownBy(kFromReflection),
+    GlossyRow(&P::hilightGlossiness, "hilightGlossiness", 3).byDefault(1),
+    GlossyRow(&P::reflectionGlossiness, "reflectionGlossiness", 4).byDefault(1),
+    GlossyRow(kFresnelIor, 1, 5),
+    GlossyRow(&P::cutoff, "cutoff", 5).byDefault(0.01),
+    GlossyRow(&P::subdivs, "subdivs", 6).byDefault(8),
+    GlossyRow(kFresnelSwitch, 1, 5),
+    GlossyRow(&P::back_side, "back_side", 7),
+    GlossyRow(&P::depth_value).byDefault(5),
+    GlossyRow(&P::color_tex_mult, 2, "color_tex_mult", 8).byDefault(1),
+    GlossyRow(&P::hilightGlossiness_tex_mult, 2, "hilightGlossiness_tex_mult", 9).byDefault(1),
+    GlossyRow(&P::reflectionGlossiness_tex_mult, 2, "reflectionGlossiness_tex_mult", 10).byDefault(1),
+    GlossyRow(&P::transparency_tex_mult, 6, "transparency_tex_mult", 11).byDefault(1),
+    path(&P::color_tex, 2, 3),
+    path(&P::hilightGlossiness_tex, 2, 3),
+    path(&P::reflectionGlossiness_tex, 2, 3),
+    GlossyRow(&P::color_tex, 4, "color_tex", 14).slot(u"color_texture"),
+    GlossyRow(&P::hilightGlossiness_tex, 4, "hilightGlossiness_tex", 15).slot(u"hilight_glossiness_texture"),
+    GlossyRow(&P::reflectionGlossiness_tex, 4, "reflectionGlossiness_tex", 16)
+        .slot(u"reflection_glossiness_texture"),
+    GlossyRow(&P::transparency_tex, 6, "transparency_tex", 17).slot(u"transparency_texture"),
+    GlossyRow(&P::anisotropy, 3, "anisotropy", 12),
+    GlossyRow(&P::anisotropy_rotation, 3, "anisotropy_rotation", 13),
+    GlossyRow(kBase, 5),
+    GlossyRow(kFresnelRule, 1, 5),
+};
+
+// ---- Mirror_BRDF -----------------------------------------------------------------------
+
+typedef Mirror_BRDF M;
+typedef RecordRow<M> MirrorRow;
+// Up to version 4 the Fresnel pair stands inside the head of the record.
+const MirrorRow kMirrorRows[] = {
+    MirrorRow(&M::color, "color", 1).byDefault(kWhite),
+    MirrorRow(&M::reflection, "transparency", 2).byDefault(kWhite).shownBy(kFromReflection),
+    MirrorRow(&M::transparency_tex_mult, "transparency_tex_mult", 4).byDefault(1),
+    MirrorRow(kFresnelIor, 1, 4),
+    MirrorRow(&M::cutoff, "cutoff", 5).byDefault(0.01),
+    MirrorRow(kFresnelSwitch, 1, 4),
+    MirrorRow(&M::mirror_value).byDefault(1),
+    path(&M::transparency_tex, 1, 2),
+    MirrorRow(&M::color_tex_mult, 2, "color_tex_mult", 3).byDefault(1),
+    path(&M::color_tex, 2, 2),
+    MirrorRow(&M::transparency_tex, 3, "transparency_tex", 6).slot(u"transparency_texture"),
+    MirrorRow(&M::color_tex, 3, "color_tex", 7).slot(u"color_texture"),
+    MirrorRow(kFresnelRule, 1, 4),
+    MirrorRow(kBase, 4),
+};
+
+// ---- Diffuse_BRDF ----------------------------------------------------------------------
+
+typedef Diffuse_BRDF D;
+typedef RecordRow<D> DiffuseRow;
+const DiffuseRow kDiffuseRows[] = {
+    DiffuseRow(&D::color, "color").byDefault(Color(0.5f, 0.5f, 0.5f)),
+    DiffuseRow(&D::transparency, "transparency"),
+    DiffuseRow(&D::color_tex_mult, "color_tex_mult").byDefault(1),
+    DiffuseRow(&D::transparency_tex_mult, "transparency_tex_mult").byDefault(1),
+    path(&D::color_tex, 1, 1),
+    path(&D::transparency_tex, 1, 1),
+    DiffuseRow(&D::color_tex, 2, "color_tex").slot(u"color_texture"),
+    DiffuseRow(&D::transparency_tex, 2, "transparency_tex").slot(u"transparency_texture"),
+    DiffuseRow(kBase, 3),
+    DiffuseRow(&D::use_color_tex_alpha_as_transparency, 4, "use_color_tex_alpha_as_transparency"),
+};
+
+// ---- Light_BRDF ------------------------------------------------------------------------
+
+typedef Light_BRDF E;
+typedef RecordRow<E> EmissiveRow;
+const EmissiveRow kEmissiveRows[] = {
+    EmissiveRow(&E::color, "color", 1).byDefault(kWhite),
+    EmissiveRow(&E::transparency, 2, "transparency", 2),
+    EmissiveRow(&E::intensity, "intensity", 3).byDefault(1),
+    EmissiveRow(&E::light_value, 2).byDefault(1),
+    EmissiveRow(&E::color_tex_mult, 2, "color_tex_mult", 5).byDefault(1),
+    EmissiveRow(&E::transparency_tex_mult, "transparency_tex_mult", 4).byDefault(1),
+    path(&E::color_tex, 2, 2),
+    path(&E::transparency_tex, 1, 2),
+    EmissiveRow(&E::color_tex, 3, "color_tex", 7).slot(u"color_texture"),
+    EmissiveRow(&E::transparency_tex, 3, "transparency_tex", 8).slot(u"transp_texture"),
+    EmissiveRow(kBase, 4),
+    EmissiveRow(&E::doubleSided, 5, "doubleSided", 6).asFlag().byDefault(1),
+};
+
+// The table of each class.
+LayerTable<G> tableOf(const G&) {
+    return {6, rowSpan(kGlassRows), &G::transparency_tex, false, LoadResets::BaseRecordOnly};
 }
-
-// ---- XML parameters --------------------------------------------------------------
-//
-// Plain fields in the form of their type; a texture is referred to by its slot
-// url; an integer flag is a bool (asFlag); one parameter is derived from a
-// field:
-
-enum ParamHook {
-    kFromReflection = 1,  // colour: 1 - reflection per component, 0 where negative
-};
-
-template <class L>
-ParamRow<L> fromReflection(const char* name, Color L::*p) { return {name, p, "", false, kFromReflection}; }
-
-// A texture slot: the field and the word of its url.
-template <class L>
-struct Slot {
-    TexturePtr L::*texture;
-    const char16_t* word;
-};
-
-// What a layer class describes: its records by version, its slots and its
-// parameters.
-template <class L>
-struct LayerLayout {
-    int currentVersion;
-    std::vector<Rows<L>> records;     // by version; entry 0 unused
-    std::vector<Slot<L>> slots;       // in the order their Assets are written
-    std::vector<ParamRow<L>> params;  // in XML order
-    TexturePtr L::*fresnelTarget;     // what the Fresnel rule fills
-};
+LayerTable<P> tableOf(const P&) { return {6, rowSpan(kGlossyRows), &P::transparency_tex, true, LoadResets::Layer}; }
+LayerTable<M> tableOf(const M&) { return {5, rowSpan(kMirrorRows), &M::transparency_tex, true, LoadResets::Layer}; }
+LayerTable<D> tableOf(const D&) { return {4, rowSpan(kDiffuseRows), &D::transparency_tex, false, LoadResets::Layer}; }
+LayerTable<E> tableOf(const E&) { return {5, rowSpan(kEmissiveRows), &E::transparency_tex, false, LoadResets::Layer}; }
 
 // ---- the walks -----------------------------------------------------------------------
 
@@ -106,45 +224,69 @@ TexturePtr makeFresnelTexture(float ior) {
     return fresnel;
 }
 
-// The texture field of a row or parameter.
-template <class L, class Row>
-TexturePtr& textureOf(L& layer, const Row& row) {
-    return row.field.template get<TexturePtr>(layer);
-}
-template <class L, class Row>
-const TexturePtr& textureOf(const L& layer, const Row& row) {
-    return row.field.template get<TexturePtr>(layer);
+// A texture of the layer's current record: a row of the newest version that
+// holds a texture member.
+template <class L>
+bool isTextureRow(const RecordRow<L>& row, int newest) {
+    return row.inVersion(newest) && row.field.kind() == FieldRef<L>::Kind::Texture;
 }
 
-template <class L>
-bool saveRows(const L& layer, QuickArchive& ar, const LayerLayout<L>& table) {
-    writeVersion(ar, table.currentVersion);
-    return writeFields(ar, layer, table.records[table.currentVersion], table.currentVersion,
-                       [&](const RecordRow<L>& row) {
-                           switch (row.hook) {
-                           case kTextureMember: return saveOptionalMember(ar, textureOf(layer, row));
-                           case kBaseCode: return layer.Base_BRDF::save(ar);
-                           default: return false;  // old forms are never written
-                           }
-                       });
+Color colorFromReflection(const Color& reflection) {
+    return Color(std::max(0.0f, 1.0f - reflection.r), std::max(0.0f, 1.0f - reflection.g),
+                 std::max(0.0f, 1.0f - reflection.b));
 }
 
-// Reads the rows of the version that the tag names. The caller has reset
-// the layer as its class requires.
-template <class L>
-bool loadRows(L& layer, QuickArchive& ar, const LayerLayout<L>& table, bool emptyFresnelTarget) {
-    const int version = readVersion(ar, 1, table.currentVersion);
-    if (version < 0) return false;
-    // The default Fresnel texture of a new layer survives in no loaded one.
-    if (emptyFresnelTarget) (layer.*table.fresnelTarget).reset();
-    FresnelPair fresnel;
-    return readFields(ar, layer, table.records[version], version, [&](const RecordRow<L>& row) {
+const int kBaseRecordVersion = 4;
+
+}  // namespace
+
+// ---- the operations of every layer -----------------------------------------------------
+
+template <class T>
+void LayerRecordOf<T>::resetLayer() {
+    T& layer = static_cast<T&>(*this);
+    const LayerTable<T> table = tableOf(layer);
+    Base_BRDF::reset();
+    resetFields(layer, table.rows, table.newest);
+    for (const RecordRow<T>& row : table.rows)
+        if (isTextureRow(row, table.newest)) row.field.template get<TexturePtr>(layer).reset();
+    if (table.newHoldsFresnel) layer.*table.fresnelTarget = createTexture(1);
+}
+
+template <class T>
+bool LayerRecordOf<T>::save(QuickArchive& ar) const {
+    const T& layer = static_cast<const T&>(*this);
+    const LayerTable<T> table = tableOf(layer);
+    writeVersion(ar, table.newest);
+    return writeFields(ar, layer, table.rows, table.newest, [&](const RecordRow<T>& row) {
         switch (row.hook) {
-        case kTextureMember: return loadOptionalMember(ar, textureOf(layer, row), &createTexture);
+        case kTextureMember: return saveOptionalMember(ar, row.field.template get<TexturePtr>(layer));
+        case kBaseCode: return layer.Base_BRDF::save(ar);
+        default: return false;  // old forms are never written
+        }
+    });
+}
+
+template <class T>
+bool LayerRecordOf<T>::load(QuickArchive& ar) {
+    T& layer = static_cast<T&>(*this);
+    const LayerTable<T> table = tableOf(layer);
+    if (table.loadResets == LoadResets::Layer)
+        layer.reset();
+    else
+        Base_BRDF::reset();
+    const int version = readVersion(ar, 1, table.newest);
+    if (version < 0) return false;
+    if (table.newHoldsFresnel) (layer.*table.fresnelTarget).reset();
+    FresnelPair fresnel;
+    return readFields(ar, layer, table.rows, version, [&](const RecordRow<T>& row) {
+        switch (row.hook) {
+        case kTextureMember:
+            return loadOptionalMember(ar, row.field.template get<TexturePtr>(layer), &createTexture);
         case kPathCode: {
             std::u16string file;
             ar.readWString(file);
-            textureOf(layer, row) = makeBitmapTextureFromPath(file);
+            row.field.template get<TexturePtr>(layer) = makeBitmapTextureFromPath(file);
             return true;
         }
         case kFresnelIorCode: ar.readFloat(fresnel.ior); return true;
@@ -158,325 +300,61 @@ bool loadRows(L& layer, QuickArchive& ar, const LayerLayout<L>& table, bool empt
     });
 }
 
+template <class T>
+void LayerRecordOf<T>::finishClone() {
+    T& copy = static_cast<T&>(*this);
+    const LayerTable<T> table = tableOf(copy);
+    for (const RecordRow<T>& row : table.rows) {
+        if (!isTextureRow(row, table.newest)) continue;
+        TexturePtr& texture = row.field.template get<TexturePtr>(copy);
+        texture = cloneChild(texture);
+    }
+}
+
 // Every field of the current record but the base record: textures through
 // their own isEqual, colours per component, numbers exactly.
-template <class L>
-bool fieldsEqual(const L& a, const L& b, const LayerLayout<L>& table) {
-    const Rows<L>& rows = table.records[table.currentVersion];
-    for (const RecordRow<L>& row : rows) {
-        const bool isTexture = row.field.kind() == FieldRef<L>::Kind::Texture;
-        if (isTexture && !childrenEqual(textureOf(a, row), textureOf(b, row))) return false;
+template <class T>
+bool LayerRecordOf<T>::sameContent(const T& o) const {
+    const T& layer = static_cast<const T&>(*this);
+    const LayerTable<T> table = tableOf(layer);
+    for (const RecordRow<T>& row : table.rows) {
+        if (isTextureRow(row, table.newest) &&
+            !childrenEqual(row.field.template get<TexturePtr>(layer), row.field.template get<TexturePtr>(o)))
+            return false;
     }
-    return fieldsEqual(a, b, rows);
+    return fieldsEqual(layer, o, table.rows, table.newest);
 }
 
-template <class L>
-void cloneSlots(L& copy, const LayerLayout<L>& table) {
-    for (const Slot<L>& slot : table.slots) copy.*slot.texture = cloneChild(copy.*slot.texture);
-}
-
-template <class L>
-const char16_t* slotWord(const L& layer, const TexturePtr& texture, const LayerLayout<L>& table) {
-    for (const Slot<L>& slot : table.slots) {
-        if (&(layer.*slot.texture) == &texture) return slot.word;
-    }
-    return u"";
-}
-
-Color colorFromReflection(const Color& reflection) {
-    return Color(std::max(0.0f, 1.0f - reflection.r), std::max(0.0f, 1.0f - reflection.g),
-                 std::max(0.0f, 1.0f - reflection.b));
-}
-
-template <class L>
-void writeLayer(const L& layer, AssetXmlWriter& writer, std::u16string url,
-                const LayerLayout<L>& table) {
+template <class T>
+void LayerRecordOf<T>::writeXml(AssetXmlWriter& writer, std::u16string url) {
+    const T& layer = static_cast<const T&>(*this);
+    const LayerTable<T> table = tableOf(layer);
     url += u'/';
     url += layer.name;
     const std::u16string slotPrefix = url + u'/';
-    for (const Slot<L>& slot : table.slots) {
-        const TexturePtr& texture = layer.*slot.texture;
-        if (texture) texture->writeXml(writer, slotPrefix + slot.word);
-    }
+    // The textures' Assets first, in the order of the parameters that refer to them.
+    forEachShown<T>(table.rows, [&](const RecordRow<T>& row) {
+        if (!isTextureRow(row, table.newest)) return;
+        const TexturePtr& texture = row.field.template get<TexturePtr>(layer);
+        if (texture) texture->writeXml(writer, slotPrefix + row.xml.slot);
+    });
     openPluginAsset(writer, url, layer.getAssetType(), layer.getPluginName(), "");
-    writeParams(writer, layer, table.params, [&](const ParamRow<L>& p) {
-        switch (p.hook) {
-        case kFromReflection:
-            writer.writeColor(p.name, colorFromReflection(p.field.template get<Color>(layer)));
-            break;
-        default: {
-            const TexturePtr& texture = textureOf(layer, p);
-            writer.writeTextureRef(p.name, texture.get(), slotPrefix, slotWord(layer, texture, table));
-        }
+    writeShownFields(writer, layer, table.rows, [&](const RecordRow<T>& row) {
+        if (row.xml.form == kFromReflection) {
+            writer.writeColor(row.xml.name, colorFromReflection(row.field.template get<Color>(layer)));
+        } else {
+            const TexturePtr& texture = row.field.template get<TexturePtr>(layer);
+            writer.writeTextureRef(row.xml.name, texture.get(), slotPrefix, row.xml.slot);
         }
     });
     closePluginAsset(writer);
 }
 
-// ---- Glass_BRDF ------------------------------------------------------------------------
-
-const LayerLayout<Glass_BRDF>& glassTable() {
-    typedef Glass_BRDF G;
-    static const LayerLayout<G> table = [] {
-        // The rows of the current record, numbered as old versions name them.
-        const Rows<G> r1 = {&G::color, &G::fog_color};
-        const Rows<G> r2 = {&G::ior, &G::ior_second, &G::cutoff, &G::fog_color_mult, &G::glossiness};
-        const Rows<G> r3 = {&G::depth_value, &G::subdivs, &G::affect_shadows, &G::affect_alpha};
-        const Rows<G> r4 = {&G::color_tex_mult, &G::glossiness_tex_mult, &G::ior_tex_mult};
-        const Rows<G> r5 = {&G::translucency_on};
-        const Rows<G> r6 = {&G::thickness, &G::scatter_coeff, &G::scatter_direction,
-                            &G::translucency_tex_mult};
-        const Rows<G> r7 = {&G::translucency};
-        const Rows<G> r8 = {&G::color_tex, &G::glossiness_tex, &G::ior_tex, &G::translucency_tex};
-        const Rows<G> r9 = {&G::transparency};
-        const Rows<G> r10 = {&G::transparency_tex_mult};
-        const Rows<G> r11 = {&G::transparency_tex};
-        const Rows<G> r12 = {kBase};
-        // The three multipliers that old records hold in this order.
-        const Rows<G> oldMults = {&G::transparency_tex_mult, &G::glossiness_tex_mult,
-                                  &G::ior_tex_mult};
-        const Rows<G> v2Paths = {path(&G::transparency_tex), path(&G::glossiness_tex),
-                                 path(&G::ior_tex)};
-
-        LayerLayout<G> s;
-        s.currentVersion = 6;
-        s.records = {
-            {},
-            join<G>({r1, r2, r3}),
-            join<G>({r1, r2, r3, oldMults, v2Paths}),
-            join<G>({r1, r2, r3, oldMults, v2Paths, r5, r6, r7, {path(&G::translucency_tex)}}),
-            join<G>({r1, r2, r3, oldMults, r5, r6, r7,
-                     {&G::transparency_tex, &G::glossiness_tex, &G::ior_tex, &G::translucency_tex}}),
-            join<G>({r1, r2, r3, r4, r5, r6, r7, r8, r9, r10, r11}),
-            join<G>({r1, r2, r3, r4, r5, r6, r7, r8, r9, r10, r11, r12}),
-        };
-        s.slots = {
-            {&G::transparency_tex, u"transparency_texture"},
-            {&G::color_tex, u"color_texture"},
-            {&G::glossiness_tex, u"glossy_texture"},
-            {&G::ior_tex, u"ior_texture"},
-            {&G::translucency_tex, u"translucency_texture"},
-        };
-        s.params = {
-            {"color", &G::color},
-            {"transparency", &G::transparency},
-            {"fog_color", &G::fog_color},
-            {"translucency", &G::translucency},
-            {"affect_shadows", asFlag(&G::affect_shadows)},
-            {"affect_alpha", asFlag(&G::affect_alpha)},
-            {"translucency_on", asFlag(&G::translucency_on)},
-            {"ior", &G::ior},
-            {"fog_color_mult", &G::fog_color_mult},
-            {"glossiness", &G::glossiness},
-            {"glossiness_tex_mult", &G::glossiness_tex_mult},
-            {"ior_tex_mult", &G::ior_tex_mult},
-            {"translucency_tex_mult", &G::translucency_tex_mult},
-            {"scatter_coeff", &G::scatter_coeff},
-            {"scatter_direction", &G::scatter_direction},
-            {"thickness", &G::thickness},
-            {"transparency_tex_mult", &G::transparency_tex_mult},
-            {"cutoff", &G::cutoff},
-            {"color_tex_mult", &G::color_tex_mult},
-            {"subdivs", &G::subdivs},
-            {"transparency_tex", &G::transparency_tex},
-            {"color_tex", &G::color_tex},
-            {"glossiness_tex", &G::glossiness_tex},
-            {"ior_texture", &G::ior_tex},
-            {"translucency_tex", &G::translucency_tex},
-        };
-        s.fresnelTarget = &G::transparency_tex;
-        return s;
-    }();
-    return table;
-}
-
-// ---- Phong_BRDF, Blinn_BRDF ------------------------------------------------------------
-
-const LayerLayout<BaseGlossy_BRDF>& glossyTable() {
-    typedef BaseGlossy_BRDF P;
-    static const LayerLayout<P> table = [] {
-        // The head that all old records share, with the Fresnel pair inside.
-        const Rows<P> head = {&P::color, &P::reflection, &P::hilightGlossiness,
-                              &P::reflectionGlossiness, kFresnelIor, &P::cutoff, &P::subdivs,
-                              kFresnelSwitch, &P::back_side, &P::depth_value};
-        const Rows<P> oldMults = {&P::color_tex_mult, &P::hilightGlossiness_tex_mult,
-                                  &P::reflectionGlossiness_tex_mult};
-        const Rows<P> paths = {path(&P::color_tex), path(&P::hilightGlossiness_tex),
-                               path(&P::reflectionGlossiness_tex)};
-        const Rows<P> members = {&P::color_tex, &P::hilightGlossiness_tex,
-                                 &P::reflectionGlossiness_tex};
-        const Rows<P> anisotropy = {&P::anisotropy, &P::anisotropy_rotation};
-
-        LayerLayout<P> s;
-        s.currentVersion = 6;
-        s.records = {
-            {},
-            join<P>({head, {kFresnelRule}}),
-            join<P>({head, oldMults, paths, {kFresnelRule}}),
-            join<P>({head, oldMults, paths, anisotropy, {kFresnelRule}}),
-            join<P>({head, oldMults, members, anisotropy, {kFresnelRule}}),
-            join<P>({head, oldMults, members, anisotropy, {kBase}, {kFresnelRule}}),
-            {&P::color, &P::reflection,
-             &P::hilightGlossiness, &P::reflectionGlossiness, &P::cutoff,
-             &P::subdivs, &P::back_side, &P::depth_value,
-             &P::color_tex_mult, &P::hilightGlossiness_tex_mult,
-             &P::reflectionGlossiness_tex_mult, &P::transparency_tex_mult,
-             &P::color_tex, &P::hilightGlossiness_tex, &P::reflectionGlossiness_tex,
-             &P::transparency_tex,
-             &P::anisotropy, &P::anisotropy_rotation,
-             kBase},
-        };
-        s.slots = {
-            {&P::color_tex, u"color_texture"},
-            {&P::hilightGlossiness_tex, u"hilight_glossiness_texture"},
-            {&P::reflectionGlossiness_tex, u"reflection_glossiness_texture"},
-            {&P::transparency_tex, u"transparency_texture"},
-        };
-        s.params = {
-            {"color", &P::color},
-            fromReflection("transparency", &P::reflection),
-            {"hilightGlossiness", &P::hilightGlossiness},
-            {"reflectionGlossiness", &P::reflectionGlossiness},
-            {"cutoff", &P::cutoff},
-            {"subdivs", &P::subdivs},
-            {"back_side", &P::back_side},
-            {"color_tex_mult", &P::color_tex_mult},
-            {"hilightGlossiness_tex_mult", &P::hilightGlossiness_tex_mult},
-            {"reflectionGlossiness_tex_mult", &P::reflectionGlossiness_tex_mult},
-            {"transparency_tex_mult", &P::transparency_tex_mult},
-            {"anisotropy", &P::anisotropy},
-            {"anisotropy_rotation", &P::anisotropy_rotation},
-            {"color_tex", &P::color_tex},
-            {"hilightGlossiness_tex", &P::hilightGlossiness_tex},
-            {"reflectionGlossiness_tex", &P::reflectionGlossiness_tex},
-            {"transparency_tex", &P::transparency_tex},
-        };
-        s.fresnelTarget = &P::transparency_tex;
-        return s;
-    }();
-    return table;
-}
-
-// ---- Mirror_BRDF -----------------------------------------------------------------------
-
-const LayerLayout<Mirror_BRDF>& mirrorTable() {
-    typedef Mirror_BRDF M;
-    static const LayerLayout<M> table = [] {
-        // Version 1 up to `mirror_value`, with the Fresnel pair inside.
-        const Rows<M> head = {&M::color, &M::reflection, &M::transparency_tex_mult, kFresnelIor,
-                              &M::cutoff, kFresnelSwitch, &M::mirror_value};
-        const Rows<M> members = {&M::color_tex_mult, &M::transparency_tex, &M::color_tex};
-
-        LayerLayout<M> s;
-        s.currentVersion = 5;
-        s.records = {
-            {},
-            join<M>({head, {path(&M::transparency_tex)}, {kFresnelRule}}),
-            join<M>({head, {path(&M::transparency_tex), &M::color_tex_mult, path(&M::color_tex)},
-                     {kFresnelRule}}),
-            join<M>({head, members, {kFresnelRule}}),
-            join<M>({head, members, {kFresnelRule}, {kBase}}),
-            {&M::color, &M::reflection, &M::transparency_tex_mult, &M::cutoff, &M::mirror_value,
-             &M::color_tex_mult, &M::transparency_tex, &M::color_tex, kBase},
-        };
-        s.slots = {
-            {&M::transparency_tex, u"transparency_texture"},
-            {&M::color_tex, u"color_texture"},
-        };
-        s.params = {
-            {"color", &M::color},
-            fromReflection("transparency", &M::reflection),
-            {"color_tex_mult", &M::color_tex_mult},
-            {"transparency_tex_mult", &M::transparency_tex_mult},
-            {"cutoff", &M::cutoff},
-            {"transparency_tex", &M::transparency_tex},
-            {"color_tex", &M::color_tex},
-        };
-        s.fresnelTarget = &M::transparency_tex;
-        return s;
-    }();
-    return table;
-}
-
-// ---- Diffuse_BRDF ----------------------------------------------------------------------
-
-const LayerLayout<Diffuse_BRDF>& diffuseTable() {
-    typedef Diffuse_BRDF D;
-    static const LayerLayout<D> table = [] {
-        const Rows<D> head = {&D::color, &D::transparency, &D::color_tex_mult,
-                              &D::transparency_tex_mult};
-        const Rows<D> members = {&D::color_tex, &D::transparency_tex};
-
-        LayerLayout<D> s;
-        s.currentVersion = 4;
-        s.records = {
-            {},
-            join<D>({head, {path(&D::color_tex), path(&D::transparency_tex)}}),
-            join<D>({head, members}),
-            join<D>({head, members, {kBase}}),
-            join<D>({head, members, {kBase}, {&D::use_color_tex_alpha_as_transparency}}),
-        };
-        s.slots = {
-            {&D::color_tex, u"color_texture"},
-            {&D::transparency_tex, u"transparency_texture"},
-        };
-        s.params = {
-            {"color", &D::color},
-            {"transparency", &D::transparency},
-            {"color_tex_mult", &D::color_tex_mult},
-            {"transparency_tex_mult", &D::transparency_tex_mult},
-            {"color_tex", &D::color_tex},
-            {"transparency_tex", &D::transparency_tex},
-            {"use_color_tex_alpha_as_transparency", &D::use_color_tex_alpha_as_transparency},
-        };
-        s.fresnelTarget = &D::transparency_tex;
-        return s;
-    }();
-    return table;
-}
-
-// ---- Light_BRDF ------------------------------------------------------------------------
-
-const LayerLayout<Light_BRDF>& lightTable() {
-    typedef Light_BRDF E;
-    static const LayerLayout<E> table = [] {
-        const Rows<E> head = {&E::color, &E::transparency, &E::intensity, &E::light_value,
-                              &E::color_tex_mult, &E::transparency_tex_mult};
-        const Rows<E> members = {&E::color_tex, &E::transparency_tex};
-
-        LayerLayout<E> s;
-        s.currentVersion = 5;
-        s.records = {
-            {},
-            {&E::color, &E::intensity, &E::transparency_tex_mult, path(&E::transparency_tex)},
-            join<E>({head, {path(&E::color_tex), path(&E::transparency_tex)}}),
-            join<E>({head, members}),
-            join<E>({head, members, {kBase}}),
-            join<E>({head, members, {kBase}, {&E::doubleSided}}),
-        };
-        s.slots = {
-            {&E::color_tex, u"color_texture"},
-            {&E::transparency_tex, u"transp_texture"},
-        };
-        s.params = {
-            {"color", &E::color},
-            {"transparency", &E::transparency},
-            {"intensity", &E::intensity},
-            {"transparency_tex_mult", &E::transparency_tex_mult},
-            {"color_tex_mult", &E::color_tex_mult},
-            {"doubleSided", asFlag(&E::doubleSided)},
-            {"color_tex", &E::color_tex},
-            {"transparency_tex", &E::transparency_tex},
-        };
-        s.fresnelTarget = &E::transparency_tex;
-        return s;
-    }();
-    return table;
-}
-
-const int kBaseRecordVersion = 4;
-
-}  // namespace
+template class LayerRecordOf<Glass_BRDF>;
+template class LayerRecordOf<BaseGlossy_BRDF>;
+template class LayerRecordOf<Mirror_BRDF>;
+template class LayerRecordOf<Diffuse_BRDF>;
+template class LayerRecordOf<Light_BRDF>;
 
 // ---- Base_BRDF -------------------------------------------------------------------------
 
@@ -521,190 +399,18 @@ std::u16string getBrdfGroupName(std::int32_t group) {
     }
 }
 
-// ---- Glass_BRDF ------------------------------------------------------------------------
+// ---- the classes -----------------------------------------------------------------------
 
-Glass_BRDF::Glass_BRDF() { reset(); }
+Glass_BRDF::Glass_BRDF() { resetLayer(); }
 
-void Glass_BRDF::reset() {
-    Base_BRDF::reset();
-    color = Color(1, 1, 1);
-    transparency = Color(0, 0, 0);
-    fog_color = Color(1, 1, 1);
-    translucency = Color(1, 1, 1);
-    ior = 1.55f;
-    ior_second = 1.55f;
-    cutoff = 0.001f;
-    fog_color_mult = 1;
-    glossiness = 1;
-    color_tex_mult = 1;
-    transparency_tex_mult = 1;
-    glossiness_tex_mult = 1;
-    ior_tex_mult = 1;
-    translucency_tex_mult = 1;
-    thickness = 1000;
-    scatter_coeff = 0;
-    scatter_direction = 1;
-    subdivs = 8;
-    depth_value = 5;
-    affect_shadows = 0;
-    affect_alpha = 0;
-    translucency_on = 0;
-    color_tex.reset();
-    transparency_tex.reset();
-    glossiness_tex.reset();
-    ior_tex.reset();
-    translucency_tex.reset();
-}
+Phong_BRDF::Phong_BRDF() { resetLayer(); }
 
-bool Glass_BRDF::save(QuickArchive& ar) const { return saveRows(*this, ar, glassTable()); }
+Blinn_BRDF::Blinn_BRDF() { resetLayer(); }
 
-bool Glass_BRDF::load(QuickArchive& ar) {
-    Base_BRDF::reset();
-    return loadRows(*this, ar, glassTable(), false);
-}
+Mirror_BRDF::Mirror_BRDF() { resetLayer(); }
 
-void Glass_BRDF::finishClone() { cloneSlots(*this, glassTable()); }
+Diffuse_BRDF::Diffuse_BRDF() { resetLayer(); }
 
-bool Glass_BRDF::sameContent(const Glass_BRDF& o) const { return fieldsEqual(*this, o, glassTable()); }
-
-void Glass_BRDF::writeXml(AssetXmlWriter& writer, std::u16string url) {
-    writeLayer(*this, writer, url, glassTable());
-}
-
-// ---- Phong_BRDF, Blinn_BRDF ------------------------------------------------------------
-
-void BaseGlossy_BRDF::reset() {
-    Base_BRDF::reset();
-    color = Color(1, 1, 1);
-    reflection = Color(1, 1, 1);
-    hilightGlossiness = 1;
-    reflectionGlossiness = 1;
-    cutoff = 0.01f;
-    hilightGlossiness_tex_mult = 1;
-    reflectionGlossiness_tex_mult = 1;
-    color_tex_mult = 1;
-    transparency_tex_mult = 1;
-    anisotropy = 0;
-    anisotropy_rotation = 0;
-    subdivs = 8;
-    depth_value = 5;
-    back_side = 0;
-    hilightGlossiness_tex.reset();
-    reflectionGlossiness_tex.reset();
-    color_tex.reset();
-    transparency_tex = createTexture(1);
-}
-
-bool BaseGlossy_BRDF::save(QuickArchive& ar) const { return saveRows(*this, ar, glossyTable()); }
-
-bool BaseGlossy_BRDF::load(QuickArchive& ar) {
-    reset();
-    return loadRows(*this, ar, glossyTable(), true);
-}
-
-void BaseGlossy_BRDF::finishClone() { cloneSlots(*this, glossyTable()); }
-
-bool BaseGlossy_BRDF::sameContent(const BaseGlossy_BRDF& o) const { return fieldsEqual(*this, o, glossyTable()); }
-
-void BaseGlossy_BRDF::writeXml(AssetXmlWriter& writer, std::u16string url) {
-    writeLayer(*this, writer, url, glossyTable());
-}
-
-Phong_BRDF::Phong_BRDF() { BaseGlossy_BRDF::reset(); }
-
-Blinn_BRDF::Blinn_BRDF() { BaseGlossy_BRDF::reset(); }
-
-// ---- Mirror_BRDF -----------------------------------------------------------------------
-
-Mirror_BRDF::Mirror_BRDF() { reset(); }
-
-void Mirror_BRDF::reset() {
-    Base_BRDF::reset();
-    color = Color(1, 1, 1);
-    reflection = Color(1, 1, 1);
-    transparency_tex_mult = 1;
-    color_tex_mult = 1;
-    cutoff = 0.01f;
-    mirror_value = 1;
-    transparency_tex = createTexture(1);
-    color_tex.reset();
-}
-
-bool Mirror_BRDF::save(QuickArchive& ar) const { return saveRows(*this, ar, mirrorTable()); }
-
-bool Mirror_BRDF::load(QuickArchive& ar) {
-    reset();
-    return loadRows(*this, ar, mirrorTable(), true);
-}
-
-void Mirror_BRDF::finishClone() { cloneSlots(*this, mirrorTable()); }
-
-bool Mirror_BRDF::sameContent(const Mirror_BRDF& o) const { return fieldsEqual(*this, o, mirrorTable()); }
-
-void Mirror_BRDF::writeXml(AssetXmlWriter& writer, std::u16string url) {
-    writeLayer(*this, writer, url, mirrorTable());
-}
-
-// ---- Diffuse_BRDF ----------------------------------------------------------------------
-
-Diffuse_BRDF::Diffuse_BRDF() { reset(); }
-
-void Diffuse_BRDF::reset() {
-    Base_BRDF::reset();
-    color = Color(0.5f, 0.5f, 0.5f);
-    transparency = Color(0, 0, 0);
-    color_tex_mult = 1;
-    transparency_tex_mult = 1;
-    color_tex.reset();
-    transparency_tex.reset();
-    use_color_tex_alpha_as_transparency = false;
-}
-
-bool Diffuse_BRDF::save(QuickArchive& ar) const { return saveRows(*this, ar, diffuseTable()); }
-
-bool Diffuse_BRDF::load(QuickArchive& ar) {
-    reset();
-    return loadRows(*this, ar, diffuseTable(), false);
-}
-
-void Diffuse_BRDF::finishClone() { cloneSlots(*this, diffuseTable()); }
-
-bool Diffuse_BRDF::sameContent(const Diffuse_BRDF& o) const { return fieldsEqual(*this, o, diffuseTable()); }
-
-void Diffuse_BRDF::writeXml(AssetXmlWriter& writer, std::u16string url) {
-    writeLayer(*this, writer, url, diffuseTable());
-}
-
-// ---- Light_BRDF ------------------------------------------------------------------------
-
-Light_BRDF::Light_BRDF() { reset(); }
-
-void Light_BRDF::reset() {
-    Base_BRDF::reset();
-    color = Color(1, 1, 1);
-    transparency = Color(0, 0, 0);
-    intensity = 1;
-    light_value = 1;
-    transparency_tex_mult = 1;
-    color_tex_mult = 1;
-    transparency_tex.reset();
-    color_tex.reset();
-    doubleSided = 1;
-}
-
-bool Light_BRDF::save(QuickArchive& ar) const { return saveRows(*this, ar, lightTable()); }
-
-bool Light_BRDF::load(QuickArchive& ar) {
-    reset();
-    return loadRows(*this, ar, lightTable(), false);
-}
-
-void Light_BRDF::finishClone() { cloneSlots(*this, lightTable()); }
-
-bool Light_BRDF::sameContent(const Light_BRDF& o) const { return fieldsEqual(*this, o, lightTable()); }
-
-void Light_BRDF::writeXml(AssetXmlWriter& writer, std::u16string url) {
-    writeLayer(*this, writer, url, lightTable());
-}
+Light_BRDF::Light_BRDF() { resetLayer(); }
 
 }  // namespace OrvaneLumoCore

@@ -2,6 +2,12 @@
 // The six BRDF layers. Each holds colours, numbers and up to five textures,
 // saves itself as a record of its class (old versions are still read) and
 // writes itself as an Asset of type "BRDF" under its material's url.
+//
+// A layer class is one table (Brdf.cpp): a row per field with the versions
+// that hold it, its default, the XML parameter that shows it and, for a
+// texture, the word of its slot; rows of old versions that held a field at
+// another place or as a bare path stand beside them. LayerRecordOf walks the
+// table for every operation, so a class declares only its fields.
 #include <cstdint>
 #include <string>
 
@@ -12,18 +18,30 @@
 
 namespace OrvaneLumoCore {
 
+// The operations of a layer whose fields are held by T, from T's table.
+template <class T>
+class LayerRecordOf : public Base_BRDF {
+public:
+    bool save(QuickArchive& ar) const override;
+    // Resets the whole layer or only its base part, as T's table says, then
+    // reads the record.
+    bool load(QuickArchive& ar) override;
+    void finishClone();
+    bool sameContent(const T& o) const;
+    void writeXml(AssetXmlWriter& writer, std::u16string url) override;
+
+protected:
+    // The table's defaults, the base part reset, every texture null but the
+    // Fresnel texture of a new layer where the table gives one. Constructors
+    // call it; reset() makes a new object.
+    void resetLayer();
+};
+
 // Refraction layer, plugin "BRDFRefraction".
-class Glass_BRDF : public FamilyOf<Glass_BRDF, kGlassBrdf, Base_BRDF> {
+class Glass_BRDF : public FamilyOf<Glass_BRDF, kGlassBrdf, LayerRecordOf<Glass_BRDF>> {
 public:
     Glass_BRDF();
 
-    bool save(QuickArchive& ar) const override;
-    // Resets only the base part before reading.
-    bool load(QuickArchive& ar) override;
-    void reset() override;
-    void finishClone();
-    bool sameContent(const Glass_BRDF& o) const;
-    void writeXml(AssetXmlWriter& writer, std::u16string url) override;
     std::u16string getPluginName() const override { return u"BRDFRefraction"; }
 
     Color color;
@@ -58,14 +76,8 @@ public:
 // The fields, record and XML that Phong_BRDF and Blinn_BRDF share; the two
 // differ in tag and class only. Plugin "BRDFReflection". The XML colour
 // "transparency" is derived from `reflection`.
-class BaseGlossy_BRDF : public Base_BRDF {
+class BaseGlossy_BRDF : public LayerRecordOf<BaseGlossy_BRDF> {
 public:
-    bool save(QuickArchive& ar) const override;
-    bool load(QuickArchive& ar) override;
-    void reset() override;
-    void finishClone();
-    bool sameContent(const BaseGlossy_BRDF& o) const;
-    void writeXml(AssetXmlWriter& writer, std::u16string url) override;
     std::u16string getPluginName() const override { return u"BRDFReflection"; }
 
     Color color;
@@ -104,16 +116,10 @@ public:
 };
 
 // Mirror layer, plugin "BRDFReflection".
-class Mirror_BRDF : public FamilyOf<Mirror_BRDF, kMirrorBrdf, Base_BRDF> {
+class Mirror_BRDF : public FamilyOf<Mirror_BRDF, kMirrorBrdf, LayerRecordOf<Mirror_BRDF>> {
 public:
     Mirror_BRDF();
 
-    bool save(QuickArchive& ar) const override;
-    bool load(QuickArchive& ar) override;
-    void reset() override;
-    void finishClone();
-    bool sameContent(const Mirror_BRDF& o) const;
-    void writeXml(AssetXmlWriter& writer, std::u16string url) override;
     std::u16string getPluginName() const override { return u"BRDFReflection"; }
 
     Color color;
@@ -127,16 +133,10 @@ public:
 };
 
 // Diffuse layer, plugin "BRDFDiffuse".
-class Diffuse_BRDF : public FamilyOf<Diffuse_BRDF, kDiffuseBrdf, Base_BRDF> {
+class Diffuse_BRDF : public FamilyOf<Diffuse_BRDF, kDiffuseBrdf, LayerRecordOf<Diffuse_BRDF>> {
 public:
     Diffuse_BRDF();
 
-    bool save(QuickArchive& ar) const override;
-    bool load(QuickArchive& ar) override;
-    void reset() override;
-    void finishClone();
-    bool sameContent(const Diffuse_BRDF& o) const;
-    void writeXml(AssetXmlWriter& writer, std::u16string url) override;
     std::u16string getPluginName() const override { return u"BRDFDiffuse"; }
 
     Color color;
@@ -149,16 +149,10 @@ public:
 };
 
 // Emissive layer, plugin "BRDFLight".
-class Light_BRDF : public FamilyOf<Light_BRDF, kLightBrdf, Base_BRDF> {
+class Light_BRDF : public FamilyOf<Light_BRDF, kLightBrdf, LayerRecordOf<Light_BRDF>> {
 public:
     Light_BRDF();
 
-    bool save(QuickArchive& ar) const override;
-    bool load(QuickArchive& ar) override;
-    void reset() override;
-    void finishClone();
-    bool sameContent(const Light_BRDF& o) const;
-    void writeXml(AssetXmlWriter& writer, std::u16string url) override;
     std::u16string getPluginName() const override { return u"BRDFLight"; }
 
     Color color;

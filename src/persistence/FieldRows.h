@@ -382,7 +382,8 @@ struct RecordRow {
         xml.name = name;
         xml.at = at;
     }
-    constexpr RecordRow(RowHook h) : use(RowUse::Hook), hook(h.code) {}
+    constexpr RecordRow(RowHook h, int first = 1, int last = kLastVersion)
+        : since(first), until(last), use(RowUse::Hook), hook(h.code) {}
 
     // The field shown once more, as parameter `name` at place `at`.
     template <class M>
@@ -406,6 +407,17 @@ struct RecordRow {
     constexpr RecordRow slot(const char16_t* word) const {
         RecordRow row = *this;
         row.xml.slot = word;
+        return row;
+    }
+    // The field's default, for tables that give their class its defaults.
+    constexpr RecordRow byDefault(double value) const {
+        RecordRow row = *this;
+        row.number = value;
+        return row;
+    }
+    constexpr RecordRow byDefault(const Color& value) const {
+        RecordRow row = *this;
+        row.color = value;
         return row;
     }
     // The field shown in a form of the class's own: the XML walk hands the
@@ -586,11 +598,21 @@ void resetFields(C& obj, const Rows& rows) {
         if (row.use == RowUse::Field || row.use == RowUse::Forced) row.field.reset(obj, row.number, row.color);
 }
 
-// True if every field of the table is equal in both objects; hook rows are
-// the caller's.
+// The same for the rows of `version` only: a table that also lists a field at
+// its place in old versions gives the default on the row of `version`.
 template <class C, class Rows>
-bool fieldsEqual(const C& x, const C& y, const Rows& rows) {
+void resetFields(C& obj, const Rows& rows, int version) {
+    for (const RecordRow<C>& row : rows)
+        if (row.inVersion(version) && (row.use == RowUse::Field || row.use == RowUse::Forced))
+            row.field.reset(obj, row.number, row.color);
+}
+
+// True if every field of the table (of the rows of `version`, where given)
+// is equal in both objects; hook rows are the caller's.
+template <class C, class Rows>
+bool fieldsEqual(const C& x, const C& y, const Rows& rows, int version = -1) {
     for (const RecordRow<C>& row : rows) {
+        if (version >= 0 && !row.inVersion(version)) continue;
         const bool hasField = row.use == RowUse::Field || row.use == RowUse::Kept || row.use == RowUse::Forced;
         if (hasField && !row.field.equal(x, y)) return false;
     }

@@ -44,21 +44,17 @@ const RecordRow<Fr> kFresnelRecord[] = {
     {&Fr::refract_ior_tex, 2, "refract_ior_tex"},
 };
 
-bool FresnelTexture::save(QuickArchive& ar) const { return saveTextureRecord(*this, ar, kFresnelRecord, 2); }
+TextureTable<Fr> textureTable(const Fr&) { return {2, rowSpan(kFresnelRecord)}; }
 
-bool FresnelTexture::load(QuickArchive& ar) { return loadTextureRecord(*this, ar, kFresnelRecord, 2); }
-
-void FresnelTexture::finishClone() { cloneTextureRows(*this, kFresnelRecord); }
-
-bool FresnelTexture::sameContent(const FresnelTexture& o) const { return rowsEqual(*this, o, kFresnelRecord); }
-
-void FresnelTexture::writeXml(AssetXmlWriter& w, std::u16string url) {
-    writeTextureRows(w, *this, url, kFresnelRecord, [&](const RecordRow<Fr>& row) {
-        w.writeColor(row.xml.name, complement(row.field.get<Color>(*this)));
-    });
+void FresnelTexture::writeOwnForm(AssetXmlWriter& w, const RecordRow<Fr>& row) const {
+    w.writeColor(row.xml.name, complement(row.field.get<Color>(*this)));
 }
 
+template class TableTextureOf<FresnelTexture, 1>;
+
 // ---- BlendTexture --------------------------------------------------------------
+//
+// Written by hand: a multiplier is in the record only behind a present texture.
 
 void BlendTexture::reset() {
     color_a.reset();
@@ -114,55 +110,22 @@ void BlendTexture::writeXml(AssetXmlWriter& w, std::u16string url) {
 
 // ---- InvertTexture -------------------------------------------------------------
 
-void InvertTexture::reset() {
-    texture.reset();
-    invert_alpha = false;
-}
+// The child's slot is "base_texture", the parameter that refers to it "texture".
+const RecordRow<InvertTexture> kInvertRecord[] = {
+    required(RecordRow<InvertTexture>(&InvertTexture::texture, "texture").slot(u"base_texture")),
+    {&InvertTexture::invert_alpha, "invert_alpha"},
+};
 
-bool InvertTexture::save(QuickArchive& ar) const {
-    if (!texture) return false;
-    writeVersion(ar, 1);
-    if (!saveRequiredMember(ar, texture)) return false;
-    ar.writeByte(invert_alpha);
-    return true;
-}
+TextureTable<InvertTexture> textureTable(const InvertTexture&) { return {1, rowSpan(kInvertRecord)}; }
 
-bool InvertTexture::load(QuickArchive& ar) {
-    reset();
-    if (readVersion(ar, 1, 1) < 0) return false;
-    if (!loadRequiredMember(ar, texture, createTexture)) return false;
-    ar.readByte(invert_alpha);
-    return true;
-}
-
-void InvertTexture::finishClone() {
-    texture = cloneChild(texture);
-}
-
-bool InvertTexture::sameContent(const InvertTexture& o) const {
-    return childrenEqual(texture, o.texture) && invert_alpha == o.invert_alpha;
-}
-
-void InvertTexture::writeXml(AssetXmlWriter& w, std::u16string url) {
-    TextureFrame frame(w, *this, url);
-    const SlotRef base = frame.slot(texture, u"base_texture");
-    frame.open();
-    frame.writeRef("texture", base);
-    w.writeBool("invert_alpha", invert_alpha);
-    frame.close();
-}
+template class TableTextureOf<InvertTexture, 9>;
 
 // ---- AColorTexture -------------------------------------------------------------
 
-const RecordRow<AColorTexture> kAColorRecord[] = {&AColorTexture::color};
+const RecordRow<AColorTexture> kAColorRecord[] = {{&AColorTexture::color, "texture"}};
 
-RowSpan<RecordRow<AColorTexture>> AColorTexture::record() { return rowSpan(kAColorRecord); }
+TextureTable<AColorTexture> textureTable(const AColorTexture&) { return {1, rowSpan(kAColorRecord)}; }
 
-void AColorTexture::writeXml(AssetXmlWriter& w, std::u16string url) {
-    TextureFrame frame(w, *this, url);
-    frame.open();
-    w.writeAColor("texture", color);
-    frame.close();
-}
+template class TableTextureOf<AColorTexture, 5>;
 
 }  // namespace OrvaneLumoCore

@@ -5,19 +5,16 @@
 
 #include "persistence/FamilyOf.h"
 #include "textures/BaseTexture.h"
+#include "textures/TableTextureOf.h"
 #include "values/Types.h"
 
 namespace OrvaneLumoCore {
 
 // Mixes two colours or textures by the angle of view. The colours are kept
 // as their complements; XML writes them back as max(0, 1 - c).
-class FresnelTexture : public FamilyOf<FresnelTexture, 1, BaseTexture> {
+class FresnelTexture : public TableTextureOf<FresnelTexture, 1> {
 public:
-    bool save(QuickArchive& ar) const override;
-    bool load(QuickArchive& ar) override;
-    void finishClone();
-    bool sameContent(const FresnelTexture& o) const;
-    void writeXml(AssetXmlWriter& writer, std::u16string url) override;
+    void writeOwnForm(AssetXmlWriter& w, const RecordRow<FresnelTexture>& row) const;
     std::u16string getPluginName() const override { return u"TexFresnel"; }
 
     TexturePtr reflection_tex;
@@ -55,35 +52,27 @@ public:
 };
 
 // Inverts one texture.
-class InvertTexture : public FamilyOf<InvertTexture, 9, BaseTexture> {
+class InvertTexture : public TableTextureOf<InvertTexture, 9> {
 public:
-    InvertTexture() { reset(); }
-
-    bool save(QuickArchive& ar) const override;  // false without `texture`
-    bool load(QuickArchive& ar) override;
-    void reset() override;
-    void finishClone();
-    bool sameContent(const InvertTexture& o) const;
-    void writeXml(AssetXmlWriter& writer, std::u16string url) override;
     std::u16string getPluginName() const override { return u"TexInvert"; }
 
-    TexturePtr texture;
-    bool invert_alpha;
+    TexturePtr texture;  // required: save fails without it
+    bool invert_alpha = false;
 };
 
 // A constant colour with alpha.
-class AColorTexture : public FlatFamilyOf<AColorTexture, 5, BaseTexture> {
+class AColorTexture : public TableTextureOf<AColorTexture, 5> {
 public:
-    static constexpr int kRecordVersion = 1;
-    static RowSpan<RecordRow<AColorTexture>> record();
-
     AColorTexture() = default;
     explicit AColorTexture(const AColor& c) : color(c) {}
 
-    void writeXml(AssetXmlWriter& writer, std::u16string url) override;
     std::u16string getPluginName() const override { return u"TexAColor"; }
 
     AColor color{1, 1, 1, 1};
 };
+
+extern template class TableTextureOf<FresnelTexture, 1>;
+extern template class TableTextureOf<InvertTexture, 9>;
+extern template class TableTextureOf<AColorTexture, 5>;
 
 }  // namespace OrvaneLumoCore

@@ -11,16 +11,6 @@
 
 namespace OrvaneLumoCore {
 
-// A class's table: the version save writes (load reads 1 to it) and the
-// rows, children first. A generator and the textures marked required are
-// required members, the rest optional; a child's url word is also the name
-// of the parameter that refers to it.
-template <class C>
-struct ProceduralLayout {
-    int newest;
-    RowSpan<RecordRow<C>> rows;
-};
-
 namespace {
 
 template <class C>
@@ -110,13 +100,6 @@ const RecordRow<CheckerTexture> kChecker[] = {
     {&CheckerTexture::blackColorMult, 2},
 };
 
-// The description of each class.
-ProceduralLayout<RampTexture> layoutOf(const RampTexture&) { return {1, rowSpan(kRamp)}; }
-ProceduralLayout<BulgeTexture> layoutOf(const BulgeTexture&) { return {1, rowSpan(kBulge)}; }
-ProceduralLayout<GridTexture> layoutOf(const GridTexture&) { return {2, rowSpan(kGrid)}; }
-ProceduralLayout<ClothTexture> layoutOf(const ClothTexture&) { return {2, rowSpan(kCloth)}; }
-ProceduralLayout<NoiseTexture> layoutOf(const NoiseTexture&) { return {1, rowSpan(kNoise)}; }
-ProceduralLayout<CheckerTexture> layoutOf(const CheckerTexture&) { return {2, rowSpan(kChecker)}; }
 }  // namespace
 
 CheckerTexture::CheckerTexture()
@@ -124,40 +107,20 @@ CheckerTexture::CheckerTexture()
       white_color(new AColorTexture(AColor(1, 1, 1, 1))),
       black_color(new AColorTexture(AColor(0, 0, 0, 1))) {}
 
-// ---- the shared operations ----
+// ---- the tables: the version save writes and the rows ----
 
-template <class D, std::uint32_t Tag>
-bool ProceduralTexture<D, Tag>::save(QuickArchive& ar) const {
-    const ProceduralLayout<D> l = layoutOf(self());
-    return saveTextureRecord(self(), ar, l.rows, l.newest);
-}
+TextureTable<RampTexture> textureTable(const RampTexture&) { return {1, rowSpan(kRamp)}; }
+TextureTable<BulgeTexture> textureTable(const BulgeTexture&) { return {1, rowSpan(kBulge)}; }
+TextureTable<GridTexture> textureTable(const GridTexture&) { return {2, rowSpan(kGrid)}; }
+TextureTable<ClothTexture> textureTable(const ClothTexture&) { return {2, rowSpan(kCloth)}; }
+TextureTable<NoiseTexture> textureTable(const NoiseTexture&) { return {1, rowSpan(kNoise)}; }
+TextureTable<CheckerTexture> textureTable(const CheckerTexture&) { return {2, rowSpan(kChecker)}; }
 
-template <class D, std::uint32_t Tag>
-bool ProceduralTexture<D, Tag>::load(QuickArchive& ar) {
-    const ProceduralLayout<D> l = layoutOf(self());
-    return loadTextureRecord(self(), ar, l.rows, l.newest);
-}
-
-template <class D, std::uint32_t Tag>
-void ProceduralTexture<D, Tag>::finishClone() {
-    cloneTextureRows(self(), layoutOf(self()).rows);
-}
-
-template <class D, std::uint32_t Tag>
-bool ProceduralTexture<D, Tag>::sameContent(const D& o) const {
-    return rowsEqual(self(), o, layoutOf(self()).rows);
-}
-
-template <class D, std::uint32_t Tag>
-void ProceduralTexture<D, Tag>::writeXml(AssetXmlWriter& w, std::u16string url) {
-    writeTextureRows(w, self(), url, layoutOf(self()).rows);
-}
-
-template class ProceduralTexture<RampTexture, 11>;
-template class ProceduralTexture<BulgeTexture, 8>;
-template class ProceduralTexture<GridTexture, 6>;
-template class ProceduralTexture<ClothTexture, 7>;
-template class ProceduralTexture<NoiseTexture, 3>;
-template class ProceduralTexture<CheckerTexture, 4>;
+template class TableTextureOf<RampTexture, 11>;
+template class TableTextureOf<BulgeTexture, 8>;
+template class TableTextureOf<GridTexture, 6>;
+template class TableTextureOf<ClothTexture, 7>;
+template class TableTextureOf<NoiseTexture, 3>;
+template class TableTextureOf<CheckerTexture, 4>;
 
 }  // namespace OrvaneLumoCore

@@ -7,33 +7,21 @@
 // parameter per slot in slot order (the slot's word is also the parameter's
 // name), then the plain parameters. A class therefore only describes its
 // record table, one row per child or field with the XML parameter that shows
-// it (ProceduralLayout, in ProceduralTextures.cpp); the texture family's
+// it (in ProceduralTextures.cpp); TableTextureOf and the texture family's
 // walkers (textures/TextureRows.h) do the rest. A required child that is
 // missing makes `save` fail before anything is written.
 #include <cstdint>
 #include <string>
 
-#include "persistence/FamilyOf.h"
-#include "persistence/FieldRows.h"
 #include "textures/BaseTexture.h"
 #include "textures/BaseUVW.h"
+#include "textures/TableTextureOf.h"
 #include "values/Types.h"
 
 namespace OrvaneLumoCore {
 
 template <class Derived, std::uint32_t Tag>
-class ProceduralTexture : public FamilyOf<Derived, Tag, BaseTexture> {
-public:
-    bool save(QuickArchive& ar) const override;
-    bool load(QuickArchive& ar) override;
-    void writeXml(AssetXmlWriter& writer, std::u16string url) override;
-    void finishClone();
-    bool sameContent(const Derived& o) const;
-
-private:
-    const Derived& self() const { return static_cast<const Derived&>(*this); }
-    Derived& self() { return static_cast<Derived&>(*this); }
-};
+using ProceduralTexture = TableTextureOf<Derived, Tag>;
 
 class RampTexture : public ProceduralTexture<RampTexture, 11> {
 public:
@@ -123,11 +111,11 @@ public:
     bool tile_v = true;
 };
 
-extern template class ProceduralTexture<RampTexture, 11>;
-extern template class ProceduralTexture<BulgeTexture, 8>;
-extern template class ProceduralTexture<GridTexture, 6>;
-extern template class ProceduralTexture<ClothTexture, 7>;
-extern template class ProceduralTexture<NoiseTexture, 3>;
-extern template class ProceduralTexture<CheckerTexture, 4>;
+extern template class TableTextureOf<RampTexture, 11>;
+extern template class TableTextureOf<BulgeTexture, 8>;
+extern template class TableTextureOf<GridTexture, 6>;
+extern template class TableTextureOf<ClothTexture, 7>;
+extern template class TableTextureOf<NoiseTexture, 3>;
+extern template class TableTextureOf<CheckerTexture, 4>;
 
 }  // namespace OrvaneLumoCore

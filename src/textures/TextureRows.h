@@ -23,6 +23,7 @@
 #include "platform/Text.h"
 #include "textures/BaseTexture.h"
 #include "textures/BaseUVW.h"
+#include "textures/TableTextureOf.h"
 #include "textures/TextureFrame.h"
 #include "xml/ParamRows.h"
 
@@ -114,20 +115,20 @@ void cloneTextureRows(C& copy, const Rows& rows) {
 }
 
 // The Asset of a texture whose table names its parameters: a slot per child
-// row in table order, then the parameters in their order, a child referred
-// to from its slot. Hook rows that aren't children go to `hook(row)`.
+// in the order of the parameters that refer to them, then the parameters, a
+// child referred to from its slot. Hook rows that aren't children go to `hook(row)`.
 template <class C, class Rows, class Hook>
 void writeTextureRows(AssetXmlWriter& w, const C& obj, const std::u16string& url, const Rows& rows, Hook hook) {
     TextureFrame frame(w, obj, url);
     std::vector<std::pair<const RecordRow<C>*, SlotRef>> slots;
-    for (const RecordRow<C>& row : rows) {
-        if (!isGeneratorChild(row) && !isTextureChild(row)) continue;
+    forEachShown<C>(rows, [&](const RecordRow<C>& row) {
+        if (!isGeneratorChild(row) && !isTextureChild(row)) return;
         const std::u16string word = row.xml.slot ? std::u16string(row.xml.slot)
                                     : row.xml.name ? utf8ToWide(row.xml.name)
                                                    : std::u16string();
         slots.emplace_back(&row, isGeneratorChild(row) ? frame.slot(row.field.template get<UVWPtr>(obj), word.c_str())
                                                        : frame.slot(row.field.template get<TexturePtr>(obj), word.c_str()));
-    }
+    });
     frame.open();
     writeShownFields(w, obj, rows, [&](const RecordRow<C>& row) {
         for (const auto& slot : slots)
@@ -140,6 +141,39 @@ void writeTextureRows(AssetXmlWriter& w, const C& obj, const std::u16string& url
 template <class C, class Rows>
 void writeTextureRows(AssetXmlWriter& w, const C& obj, const std::u16string& url, const Rows& rows) {
     writeTextureRows(w, obj, url, rows, [](const RecordRow<C>&) {});
+}
+
+// ---- TableTextureOf ----
+
+template <class D, std::uint32_t Tag>
+bool TableTextureOf<D, Tag>::save(QuickArchive& ar) const {
+    const TextureTable<D> t = textureTable(this->self());
+    return saveTextureRecord(this->self(), ar, t.rows, t.newest);
+}
+
+template <class D, std::uint32_t Tag>
+bool TableTextureOf<D, Tag>::load(QuickArchive& ar) {
+    D& texture = static_cast<D&>(*this);
+    const TextureTable<D> t = textureTable(texture);
+    return loadTextureRecord(texture, ar, t.rows, t.newest);
+}
+
+template <class D, std::uint32_t Tag>
+void TableTextureOf<D, Tag>::finishClone() {
+    D& copy = static_cast<D&>(*this);
+    cloneTextureRows(copy, textureTable(copy).rows);
+}
+
+template <class D, std::uint32_t Tag>
+bool TableTextureOf<D, Tag>::sameContent(const D& o) const {
+    return rowsEqual(this->self(), o, textureTable(this->self()).rows);
+}
+
+template <class D, std::uint32_t Tag>
+void TableTextureOf<D, Tag>::writeXml(AssetXmlWriter& w, std::u16string url) {
+    const D& texture = this->self();
+    writeTextureRows(w, texture, url, textureTable(texture).rows,
+                     [&](const RecordRow<D>& row) { texture.writeOwnForm(w, row); });
 }
 
 }  // namespace OrvaneLumoCore

@@ -6,6 +6,7 @@
 #include "persistence/QuickArchive.h"
 #include "persistence/Record.h"
 #include "textures/TextureFrame.h"
+#include "textures/TextureRows.h"
 #include "xml/AssetXmlWriter.h"
 
 namespace OrvaneLumoCore {
@@ -219,34 +220,12 @@ void GenPlacementUVW::writeXml(AssetXmlWriter& w, std::u16string url) {
 
 // ---- UVWTexture --------------------------------------------------------------------
 
-void UVWTexture::reset() { uvw.reset(); }
+namespace {
+const RecordRow<UVWTexture> kUVWTextureRecord[] = {{&UVWTexture::uvw, "uvwgen"}};
+}  // namespace
 
-bool UVWTexture::save(QuickArchive& ar) const {
-    if (!uvw) return false;
-    writeVersion(ar, 1);
-    return saveRequiredMember(ar, uvw);
-}
+TextureTable<UVWTexture> textureTable(const UVWTexture&) { return {1, rowSpan(kUVWTextureRecord)}; }
 
-bool UVWTexture::load(QuickArchive& ar) {
-    reset();
-    if (readVersion(ar, 1, 1) < 0) return false;
-    return loadRequiredMember(ar, uvw, createUVW);
-}
-
-void UVWTexture::finishClone() {
-    uvw = cloneChild(uvw);
-}
-
-bool UVWTexture::sameContent(const UVWTexture& o) const {
-    return childrenEqual(uvw, o.uvw);
-}
-
-void UVWTexture::writeXml(AssetXmlWriter& w, std::u16string url) {
-    TextureFrame frame(w, *this, url);
-    const SlotRef uvwSlot = frame.slot(uvw, u"uvwgen");
-    frame.open();
-    frame.writeRef("uvwgen", uvwSlot);
-    frame.close();
-}
+template class TableTextureOf<UVWTexture, 2>;
 
 }  // namespace OrvaneLumoCore

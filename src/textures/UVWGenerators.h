@@ -11,6 +11,7 @@
 #include "persistence/FamilyOf.h"
 #include "textures/BaseTexture.h"
 #include "textures/BaseUVW.h"
+#include "textures/TableTextureOf.h"
 #include "values/Types.h"
 
 namespace OrvaneLumoCore {
@@ -103,19 +104,13 @@ public:
 };
 
 // A texture that only shows its generator.
-class UVWTexture : public FamilyOf<UVWTexture, 2, BaseTexture> {
+class UVWTexture : public TableTextureOf<UVWTexture, 2> {
 public:
-    UVWTexture() { reset(); }
-
-    bool save(QuickArchive& ar) const override;  // false, writing nothing, without `uvw`
-    bool load(QuickArchive& ar) override;
-    void reset() override;
-    void finishClone();
-    bool sameContent(const UVWTexture& o) const;
-    void writeXml(AssetXmlWriter& writer, std::u16string url) override;
     std::u16string getPluginName() const override { return u"TexUVW"; }
 
-    UVWPtr uvw;
+    UVWPtr uvw;  // required: save fails without it
 };
+
+extern template class TableTextureOf<UVWTexture, 2>;
 
 }  // namespace OrvaneLumoCore

@@ -143,28 +143,34 @@ ParamRow<C> shownParam(const RecordRow<C>& row) {
     return p;
 }
 
-// Writes the parameters that the rows of a record table show (the rows with
-// a name): in the order of their places where the rows give places, those
-// without a place behind them in table order; otherwise in table order. A
-// child's row, a hook row and a row shown in a form of the class's own go to
-// `hook(row)`.
-template <class C, class Rows, class Hook>
-void writeShownFields(AssetXmlWriter& w, const C& obj, const Rows& rows, Hook hook) {
-    auto writeRow = [&](const RecordRow<C>& row) {
-        if (row.field.isChild() || row.use == RowUse::Hook || row.xml.form != 0)
-            hook(row);
-        else
-            writeParam(w, shownParam(row), obj);
-    };
+// Calls `visit(row)` for each row of a record table that a parameter shows
+// (the rows with a name): in the order of their places where the rows give
+// places, those without a place behind them in table order; otherwise in
+// table order.
+template <class C, class Rows, class Visit>
+void forEachShown(const Rows& rows, Visit visit) {
     int places = 0;
     for (const RecordRow<C>& row : rows)
         if (row.xml.name && row.xml.at > places) places = row.xml.at;
     // Tables are a few dozen rows, so a scan per place costs less than sorting.
     for (int place = 1; place <= places; ++place)
         for (const RecordRow<C>& row : rows)
-            if (row.xml.name && row.xml.at == place) writeRow(row);
+            if (row.xml.name && row.xml.at == place) visit(row);
     for (const RecordRow<C>& row : rows)
-        if (row.xml.name && row.xml.at == 0) writeRow(row);
+        if (row.xml.name && row.xml.at == 0) visit(row);
+}
+
+// Writes the parameters that the rows of a record table show, in the order
+// of forEachShown. A child's row, a hook row and a row shown in a form of
+// the class's own go to `hook(row)`.
+template <class C, class Rows, class Hook>
+void writeShownFields(AssetXmlWriter& w, const C& obj, const Rows& rows, Hook hook) {
+    forEachShown<C>(rows, [&](const RecordRow<C>& row) {
+        if (row.field.isChild() || row.use == RowUse::Hook || row.xml.form != 0)
+            hook(row);
+        else
+            writeParam(w, shownParam(row), obj);
+    });
 }
 
 template <class C, class Rows>
