@@ -79,31 +79,49 @@ std::size_t entityAt(const char16_t* p, const char16_t* end) {
     return 0;
 }
 
+// What stands in the text for the unit at p: `size` units of `text` in place
+// of `units` units; with no text the units stay in the run.
+struct Escape {
+    const char16_t* text = nullptr;
+    std::size_t size = 0;
+    std::size_t units = 1;
+};
+
+// Calls put(text, size) for the text with each unit that `plain` refuses
+// replaced as escapeAt(p, end) says: each run of units at once, then an escape.
+template <class Plain, class EscapeAt, class Put>
+void putRuns(const char16_t* text, std::size_t size, Plain plain, EscapeAt escapeAt, Put put) {
+    const char16_t* const end = text + size;
+    const char16_t* run = text;
+    for (const char16_t* p = text; p != end;) {
+        if (plain(*p)) {
+            ++p;
+            continue;
+        }
+        const Escape e = escapeAt(p, end);
+        if (e.text) {
+            put(run, static_cast<std::size_t>(p - run));
+            put(e.text, e.size);
+            run = p + e.units;
+        }
+        p += e.units;
+    }
+    put(run, static_cast<std::size_t>(end - run));
+}
+
 // Calls put(text, size) for the escaped text: each run of plain units at
 // once, then an escape. Undoing the three escapes and escaping again, as
 // `normalize` asks, leaves an escape that is there unchanged, so such an
 // escape is copied as it stands and only a bare "&" becomes "&amp;".
 template <class Put>
 void escapeRuns(const char16_t* text, std::size_t size, bool normalize, Put put) {
-    const char16_t* const end = text + size;
-    const char16_t* run = text;
-    for (const char16_t* p = text; p != end; ++p) {
-        const char16_t c = *p;
-        if (c > u'>' || (c != u'&' && c != u'<' && c != u'>')) continue;
-        put(run, static_cast<std::size_t>(p - run));
-        if (c == u'<') {
-            put(u"&lt;", 4);
-        } else if (c == u'>') {
-            put(u"&gt;", 4);
-        } else if (const std::size_t entity = normalize ? entityAt(p, end) : 0) {
-            put(p, entity);
-            p += entity - 1;
-        } else {
-            put(u"&amp;", 5);
-        }
-        run = p + 1;
-    }
-    put(run, static_cast<std::size_t>(end - run));
+    const auto plain = [](char16_t c) { return c > u'>' || (c != u'&' && c != u'<' && c != u'>'); };
+    putRuns(text, size, plain, [normalize](const char16_t* p, const char16_t* end) -> Escape {
+        if (*p == u'<') return {u"&lt;", 4};
+        if (*p == u'>') return {u"&gt;", 4};
+        if (const std::size_t entity = normalize ? entityAt(p, end) : 0) return {p, entity, entity};
+        return {u"&amp;", 5};
+    }, put);
 }
 
 }  // namespace
@@ -130,43 +148,26 @@ bool isLowSurrogate(char16_t c) { return c >= 0xDC00 && c <= 0xDFFF; }
 // control, U+FFFE, U+FFFF, a surrogate without its other half) as U+FFFD.
 template <class Put>
 void escapeWellFormedRuns(const char16_t* text, std::size_t size, bool attribute, Put put) {
-    const char16_t* const end = text + size;
-    const char16_t* run = text;
-    for (const char16_t* p = text; p != end; ++p) {
+    // The bulk of any text: blank to U+D7FF, other than the four marks.
+    const auto plain = [](char16_t c) {
+        return c >= u' ' && c < 0xD800 && c != u'&' && c != u'<' && c != u'>' && c != u'"';
+    };
+    putRuns(text, size, plain, [attribute](const char16_t* p, const char16_t* end) -> Escape {
         const char16_t c = *p;
-        // The bulk of any text: blank to U+D7FF, other than the four marks.
-        if (c >= u' ' && c < 0xD800 && c != u'&' && c != u'<' && c != u'>' && c != u'"') continue;
-        // The unit at p goes out as `escape`, behind the run before it.
-        const auto replace = [&](const char16_t* escape, std::size_t n) {
-            put(run, static_cast<std::size_t>(p - run));
-            put(escape, n);
-            run = p + 1;
-        };
         switch (c) {
-        case u'&': replace(u"&amp;", 5); break;
-        case u'<': replace(u"&lt;", 4); break;
-        case u'>': replace(u"&gt;", 4); break;
-        case u'"':
-            if (attribute) replace(u"&quot;", 6);
-            break;
-        case u'\t':
-            if (attribute) replace(u"&#9;", 4);
-            break;
-        case u'\n':
-            if (attribute) replace(u"&#10;", 5);
-            break;
-        case u'\r': replace(u"&#13;", 5); break;
-        default:
-            if (c >= 0xE000 && c < 0xFFFE) break;
-            if (isHighSurrogate(c) && p + 1 != end && isLowSurrogate(p[1])) {
-                ++p;  // a pair, part of the run
-                break;
-            }
-            replace(u"\uFFFD", 1);
-            break;
+        case u'&': return {u"&amp;", 5};
+        case u'<': return {u"&lt;", 4};
+        case u'>': return {u"&gt;", 4};
+        case u'"': return attribute ? Escape{u"&quot;", 6} : Escape{};
+        case u'\t': return attribute ? Escape{u"&#9;", 4} : Escape{};
+        case u'\n': return attribute ? Escape{u"&#10;", 5} : Escape{};
+        case u'\r': return {u"&#13;", 5};
+        default: break;
         }
-    }
-    put(run, static_cast<std::size_t>(end - run));
+        if (c >= 0xE000 && c < 0xFFFE) return {};
+        if (isHighSurrogate(c) && p + 1 != end && isLowSurrogate(p[1])) return {nullptr, 0, 2};  // a pair
+        return {u"\uFFFD", 1};
+    }, put);
 }
 
 }  // namespace
@@ -292,8 +293,7 @@ void AssetXmlWriter::closeRoot() {
 
 void AssetXmlWriter::openAssets() {
     ++indent_;
-    line(u"<Assets>\n");
-    done();
+    lastLine(u"<Assets>\n");
 }
 
 void AssetXmlWriter::closeAssets() {
@@ -304,10 +304,9 @@ void AssetXmlWriter::closeAssets() {
 
 void AssetXmlWriter::openAsset(const WriterText& url, const WriterText& type, const WriterText& layout) {
     ++indent_;
-    line(u"<Asset layout=\"");
-    putPlain(layout, Place::Attribute);
-    put(u"\" renderer=\"lumo\" type=\"");
-    putPlain(type, Place::Attribute);
+    indentation();
+    attribute(u"<Asset layout=\"", layout);
+    attribute(u"\" renderer=\"lumo\" type=\"", type);
     put(u"\" url=\"");
     putEscaped(url, Place::Attribute);
     put(u"\" >\n");
@@ -324,10 +323,9 @@ void AssetXmlWriter::openPlugin(const WriterText& name, const WriterText& type) 
     ++indent_;
     line(u"<plugin>\n");
     ++indent_;
-    line(u"<lumoplugin name=\"");
-    putPlain(name, Place::Attribute);
-    put(u"\" type=\"");
-    putPlain(type, Place::Attribute);
+    indentation();
+    attribute(u"<lumoplugin name=\"", name);
+    attribute(u"\" type=\"", type);
     put(u"\">\n");
     done();
 }
@@ -360,12 +358,17 @@ void AssetXmlWriter::closeParameters() {
 // name, `middle` the handler and list type.
 void AssetXmlWriter::head(Word open, const WriterText& name, Word middle, bool isUserData,
                           const WriterText& label) {
-    line(open);
-    putPlain(name, Place::Attribute);
+    indentation();
+    attribute(open, name);
     put(middle);
+    headEnd(isUserData, name, label);
+}
+
+// The end of a parameter's head: the user-data mark, the label (the name
+// when there is none) and the ">"; the parameter's content is indented.
+void AssetXmlWriter::headEnd(bool isUserData, const WriterText& name, const WriterText& label) {
     if (isUserData) put(u" isUserData=\"1\"");
-    put(u" label=\"");
-    putPlain(label.empty() ? name : label, Place::Attribute);
+    attribute(u" label=\"", label.empty() ? name : label);
     put(u"\">\n");
     ++indent_;
 }
@@ -373,43 +376,26 @@ void AssetXmlWriter::head(Word open, const WriterText& name, Word middle, bool i
 void AssetXmlWriter::openParameter(const WriterText& name, const WriterText& type,
                                    const WriterText& label, const WriterText& listType,
                                    bool isUserData, const WriterText& handler) {
-    line(u"<parameter type=\"");
-    putPlain(type, Place::Attribute);
-    put(u"\" name=\"");
-    putPlain(name, Place::Attribute);
-    put(u"\" handler=\"");
-    putPlain(handler, Place::Attribute);
-    put(u"\" listType=\"");
-    putPlain(listType, Place::Attribute);
+    indentation();
+    attribute(u"<parameter type=\"", type);
+    attribute(u"\" name=\"", name);
+    attribute(u"\" handler=\"", handler);
+    attribute(u"\" listType=\"", listType);
     put(u'"');
-    if (isUserData) put(u" isUserData=\"1\"");
-    put(u" label=\"");
-    putPlain(label.empty() ? name : label, Place::Attribute);
-    put(u"\">\n");
-    ++indent_;
+    headEnd(isUserData, name, label);
     done();
 }
 
 void AssetXmlWriter::closeParameter() {
     --indent_;
-    line(u"</parameter>\n");
-    done();
+    lastLine(u"</parameter>\n");
 }
 
-void AssetXmlWriter::openValue() {
-    line(u"<value>\n");
-    done();
-}
+void AssetXmlWriter::openValue() { lastLine(u"<value>\n"); }
 
-void AssetXmlWriter::closeValue() {
-    line(u"</value>\n");
-    done();
-}
+void AssetXmlWriter::closeValue() { lastLine(u"</value>\n"); }
 
-void AssetXmlWriter::openInlineValue() {
-    line(u"<value>");
-    done();
-}
+void AssetXmlWriter::openInlineValue() { lastLine(u"<value>"); }
 
 void AssetXmlWriter::closeInlineValue() {
     put(u"</value>\n");
@@ -424,9 +410,7 @@ void AssetXmlWriter::writeRaw(const WriterText& text) {
 // "</value>", the end of the parameter.
 void AssetXmlWriter::inlineEnd() {
     put(u"</value>\n");
-    --indent_;
-    line(u"</parameter>\n");
-    done();
+    closeParameter();
 }
 
 // "<value>" on a line of its own, the content a level deeper.
@@ -438,9 +422,7 @@ void AssetXmlWriter::blockStart() {
 void AssetXmlWriter::blockEnd() {
     --indent_;
     line(u"</value>\n");
-    --indent_;
-    line(u"</parameter>\n");
-    done();
+    closeParameter();
 }
 
 // ---- parameters ------------------------------------------------------------------
@@ -513,23 +495,23 @@ void AssetXmlWriter::writeVector(const WriterText& name, const Vector& value, co
     blockEnd();
 }
 
-void AssetXmlWriter::writeColor(const WriterText& name, const Color& value, const WriterText& label) {
-    head(u"<parameter type=\"color\" name=\"", name, kPlainMiddle, false, label);
+void AssetXmlWriter::colorParameter(Word open, const WriterText& name, const AColor& value, bool alpha,
+                                    const WriterText& label) {
+    head(open, name, kPlainMiddle, false, label);
     blockStart();
     numberLine(u"<r>", value.r, u"</r>\n");
     numberLine(u"<g>", value.g, u"</g>\n");
     numberLine(u"<b>", value.b, u"</b>\n");
+    if (alpha) numberLine(u"<a>", value.a, u"</a>\n");
     blockEnd();
 }
 
+void AssetXmlWriter::writeColor(const WriterText& name, const Color& value, const WriterText& label) {
+    colorParameter(u"<parameter type=\"color\" name=\"", name, AColor(value.r, value.g, value.b, 1), false, label);
+}
+
 void AssetXmlWriter::writeAColor(const WriterText& name, const AColor& value, const WriterText& label) {
-    head(u"<parameter type=\"acolor\" name=\"", name, kPlainMiddle, false, label);
-    blockStart();
-    numberLine(u"<r>", value.r, u"</r>\n");
-    numberLine(u"<g>", value.g, u"</g>\n");
-    numberLine(u"<b>", value.b, u"</b>\n");
-    numberLine(u"<a>", value.a, u"</a>\n");
-    blockEnd();
+    colorParameter(u"<parameter type=\"acolor\" name=\"", name, value, true, label);
 }
 
 void AssetXmlWriter::writeMatrix(const WriterText& name, const Matrix& value, const WriterText& label) {
@@ -617,9 +599,7 @@ void AssetXmlWriter::pluginRef(const WriterText& name, const WriterText& label,
         }
         put(u"</value>\n");
     }
-    --indent_;
-    line(u"</parameter>\n");
-    done();
+    closeParameter();
 }
 
 void AssetXmlWriter::writePluginRef(const WriterText& name, const OrvaneXMLSerializable* reference,
@@ -658,7 +638,5 @@ void AssetXmlWriter::closeList() {
     --indent_;
     line(u"</list>\n");
     line(u"</value>\n");
-    --indent_;
-    line(u"</parameter>\n");
-    done();
+    closeParameter();
 }

@@ -192,6 +192,11 @@ private:
     // mode escaped for its place, every "&" included.
     void putEscaped(const char16_t* text, std::size_t size, Place place);
     void putEscaped(const WriterText& text, Place place);
+    // `lead` (the text up to an attribute value), then the value as plain text.
+    void attribute(Word lead, const WriterText& value) {
+        put(lead);
+        putPlain(value, Place::Attribute);
+    }
     // Room for `size` (at most kBufferUnits) units at pos_.
     char16_t* room(std::size_t size) {
         if (static_cast<std::size_t>(end_ - pos_) < size) flushBuffer();
@@ -209,16 +214,25 @@ private:
         indentation();
         put(w);
     }
+    // The line that ends a public call.
+    void lastLine(Word w) {
+        line(w);
+        done();
+    }
     void writeNumber(double value);
     void writeInt(std::int64_t value);
     void numberLine(Word open, double value, Word close);
     void head(Word open, const WriterText& name, Word middle, bool isUserData, const WriterText& label);
+    void headEnd(bool isUserData, const WriterText& name, const WriterText& label);
     void inlineEnd();
     void pluginRef(const WriterText& name, const WriterText& label, const OrvaneXMLSerializable* reference,
                    const std::u16string& url, const WriterText& urlTail);
     void blockStart();
     void blockEnd();
     void vectorBlock(const OrvaneLumoCore::Vector& v);
+    // A color parameter (r, g, b) or, with `alpha`, an acolor one (and a).
+    void colorParameter(Word open, const WriterText& name, const OrvaneLumoCore::AColor& value, bool alpha,
+                        const WriterText& label);
     void componentParameter(Word open, const WriterText& name,
                             const OrvaneLumoCore::TransformParts& components, const WriterText& label);
 
