@@ -9,6 +9,8 @@
 #include "materials/MaterialOf.h"
 #include "persistence/FieldRows.h"
 #include "persistence/Record.h"
+#include "platform/Text.h"
+#include "xml/ParamRows.h"
 
 namespace OrvaneLumoCore {
 
@@ -82,6 +84,38 @@ void copyChildRows(M& copy, const Rows& rows, bool newName) {
             texture = cloneChild(texture);
         }
     }
+}
+
+// ---- XML ----
+//
+// A texture row shown in the XML has its slot under the Asset's url, the
+// row's url word or else its parameter name.
+
+template <class M>
+std::u16string slotUrlOf(const std::u16string& url, const RecordRow<M>& row) {
+    return childUrl(url, row.xml.slot ? std::u16string(row.xml.slot) : utf8ToWide(row.xml.name));
+}
+
+// The Assets of the table's textures, in the order of their parameters.
+template <class M, class Rows>
+void writeTextureRowAssets(AssetXmlWriter& w, const M& m, const Rows& rows, const std::u16string& url) {
+    forEachShown<M>(rows, [&](const RecordRow<M>& row) {
+        if (row.field.kind() == FieldRef<M>::Kind::Texture)
+            writeTextureAssets(w, row.field.template get<TexturePtr>(m), slotUrlOf(url, row));
+    });
+}
+
+// The table's parameters: fields in their form, textures referred to in
+// their slots; a child material's row goes to `material(row)`.
+template <class M, class Rows, class MaterialRef>
+void writeMaterialParams(AssetXmlWriter& w, const M& m, const Rows& rows, const std::u16string& url,
+                         MaterialRef material) {
+    writeShownFields(w, m, rows, [&](const RecordRow<M>& row) {
+        if (row.field.kind() == FieldRef<M>::Kind::Texture)
+            writeTextureRef(w, row.xml.name, row.field.template get<TexturePtr>(m), slotUrlOf(url, row));
+        else if (row.field.kind() == FieldRef<M>::Kind::Material)
+            material(row);
+    });
 }
 
 // Base of a material whose record is one table. The class gives

@@ -2,6 +2,7 @@
 
 #include "materials/MaterialAssets.h"
 #include "materials/MaterialMembers.h"
+#include "materials/MaterialRows.h"
 #include "materials/MaterialTree.h"
 #include "materials/ReferenceMaterials.h"
 #include "materials/SceneMaterials.h"
@@ -31,50 +32,21 @@ void bumpParameters(AssetXmlWriter& w, const MaterialBump& bump, const std::u16s
     writeTextureRef(w, "bump_tex", bump.bump_tex, childUrl(url, u"bump_tex"));
 }
 
-void displacedTextures(AssetXmlWriter& w, const MaterialDisplaced& d, const std::u16string& url) {
-    writeTextureAssets(w, d.displace_tex, childUrl(url, u"displace_tex"));
+// A wrapper whose record is a table folds its table's textures and
+// parameters in; its child material goes out elsewhere.
+template <class M>
+void tableTextures(AssetXmlWriter& w, const M& m, const std::u16string& url) {
+    writeTextureRowAssets(w, m, M::record(), url);
+}
+
+template <class M>
+void tableParameters(AssetXmlWriter& w, const M& m, const std::u16string& url) {
+    writeMaterialParams(w, m, M::record(), url, [](const RecordRow<M>&) {});
 }
 
 void displacedParameters(AssetXmlWriter& w, const MaterialDisplaced& d, const std::u16string& url) {
     w.writeBool("displace_on", true);
-    w.writeFloat("displace_shift", d.displace_shift);
-    w.writeFloat("displace_edge_length", d.displace_edge_length);
-    w.writeFloat("displace_tex_mult", d.displace_tex_mult);
-    // Integers, also those that hold yes or no.
-    w.writeInteger("displace_max_subdivs", d.displace_max_subdivs);
-    w.writeInteger("displace_continuity", d.displace_continuity);
-    w.writeInteger("displace_view_dependent", d.displace_view_dependent);
-    w.writeInteger("displace_use_globals", d.displace_use_globals);
-    writeTextureRef(w, "displace_tex", d.displace_tex, childUrl(url, u"displace_tex"));
-}
-
-// Textures and colours go out with the GI group first, the multipliers and
-// switches with the background group first.
-void environmentTextures(AssetXmlWriter& w, const MaterialOverrideEnvironment& e, const std::u16string& url) {
-    writeTextureAssets(w, e.gi_tex, childUrl(url, u"gi_tex"));
-    writeTextureAssets(w, e.bg_tex, childUrl(url, u"bg_tex"));
-    writeTextureAssets(w, e.reflect_tex, childUrl(url, u"reflect_tex"));
-    writeTextureAssets(w, e.refract_tex, childUrl(url, u"refract_tex"));
-}
-
-void environmentParameters(AssetXmlWriter& w, const MaterialOverrideEnvironment& e,
-                           const std::u16string& url) {
-    writeTextureRef(w, "gi_tex", e.gi_tex, childUrl(url, u"gi_tex"));
-    writeTextureRef(w, "bg_tex", e.bg_tex, childUrl(url, u"bg_tex"));
-    writeTextureRef(w, "reflect_tex", e.reflect_tex, childUrl(url, u"reflect_tex"));
-    writeTextureRef(w, "refract_tex", e.refract_tex, childUrl(url, u"refract_tex"));
-    w.writeColor("gi_color", e.gi_color);
-    w.writeColor("bg_color", e.bg_color);
-    w.writeColor("reflect_color", e.reflect_color);
-    w.writeColor("refract_color", e.refract_color);
-    w.writeFloat("bg_tex_mult", e.bg_tex_mult);
-    w.writeFloat("gi_tex_mult", e.gi_tex_mult);
-    w.writeFloat("reflect_tex_mult", e.reflect_tex_mult);
-    w.writeFloat("refract_tex_mult", e.refract_tex_mult);
-    w.writeBool("override_bg", e.override_bg);
-    w.writeBool("override_gi", e.override_gi);
-    w.writeBool("override_reflect", e.override_reflect);
-    w.writeBool("override_refract", e.override_refract);
+    tableParameters(w, d, url);
 }
 
 // The list of object names doesn't go out here.
@@ -83,15 +55,6 @@ void exclusionParameters(AssetXmlWriter& w, const MaterialObjectExclusion& x, co
     w.writeBool("short_circuit", x.short_circuit);
 }
 
-void alphaTextures(AssetXmlWriter& w, const MaterialAlphaContribution& a, const std::u16string& url) {
-    writeTextureAssets(w, a.alpha_tex, childUrl(url, u"alpha_tex"));
-}
-
-void alphaParameters(AssetXmlWriter& w, const MaterialAlphaContribution& a, const std::u16string& url) {
-    w.writeFloat("alpha", a.alpha);
-    w.writeFloat("alpha_tex_mult", a.alpha_tex_mult);
-    writeTextureRef(w, "alpha_tex", a.alpha_tex, childUrl(url, u"alpha_tex"));
-}
 
 // ---- two-child branch ----------------------------------------------------------------
 
@@ -119,8 +82,7 @@ bool twoChildForm(const BaseMaterial& m, TwoChildForm& form) {
 // Of a Material2Sided only translucency and force_1sided go out here.
 void twoChildParameters(AssetXmlWriter& w, const BaseMaterial& m) {
     if (const MaterialAngleBlend* blend = as<MaterialAngleBlend>(m)) {
-        w.writeFloat("start_angle", blend->start_angle);
-        w.writeFloat("stop_angle", blend->stop_angle);
+        tableParameters(w, *blend, u"");
     } else if (const Material2Sided* twoSided = as<Material2Sided>(m)) {
         w.writeColor("translucency", twoSided->translucency);
         w.writeBool("force_1sided", twoSided->force_1sided);
@@ -150,11 +112,11 @@ void writeFoldedTextures(AssetXmlWriter& writer, const BaseMaterial& wrapper, co
     if (const MaterialBump* bump = as<MaterialBump>(wrapper))
         bumpTextures(writer, *bump, url);
     else if (const MaterialDisplaced* displaced = as<MaterialDisplaced>(wrapper))
-        displacedTextures(writer, *displaced, url);
+        tableTextures(writer, *displaced, url);
     else if (const MaterialOverrideEnvironment* env = as<MaterialOverrideEnvironment>(wrapper))
-        environmentTextures(writer, *env, url);
+        tableTextures(writer, *env, url);
     else if (const MaterialAlphaContribution* alpha = as<MaterialAlphaContribution>(wrapper))
-        alphaTextures(writer, *alpha, url);
+        tableTextures(writer, *alpha, url);
 }
 
 void writeFoldedParameters(AssetXmlWriter& writer, const BaseMaterial& wrapper, const std::u16string& url) {
@@ -163,11 +125,11 @@ void writeFoldedParameters(AssetXmlWriter& writer, const BaseMaterial& wrapper, 
     else if (const MaterialDisplaced* displaced = as<MaterialDisplaced>(wrapper))
         displacedParameters(writer, *displaced, url);
     else if (const MaterialOverrideEnvironment* env = as<MaterialOverrideEnvironment>(wrapper))
-        environmentParameters(writer, *env, url);
+        tableParameters(writer, *env, url);
     else if (const MaterialObjectExclusion* exclusion = as<MaterialObjectExclusion>(wrapper))
         exclusionParameters(writer, *exclusion, url);
     else if (const MaterialAlphaContribution* alpha = as<MaterialAlphaContribution>(wrapper))
-        alphaParameters(writer, *alpha, url);
+        tableParameters(writer, *alpha, url);
 }
 
 void writeTwoChildAssets(AssetXmlWriter& writer, const MaterialPtr& material) {

@@ -1,6 +1,7 @@
 #include "materials/WrappingMaterials.h"
 
 #include "materials/MaterialMembers.h"
+#include "materials/MaterialRows.h"
 #include "persistence/QuickArchive.h"
 #include "persistence/Record.h"
 #include "platform/WideChar.h"
@@ -20,26 +21,28 @@ typedef MaterialOverrideEnvironment Env;
 typedef RowsOf<Env> EnvRow;
 
 // The four environment groups (background, GI, reflection, refraction), each
-// row of the record walking them in this order.
+// row of the record walking them in this order. In the XML the textures and
+// colours go out with the GI group first, the multipliers and switches with
+// the background group first.
 const RecordRow<Env> kOverrideEnvironmentRecord[] = {
     kBaseRecord,
     &Env::base_mtl,
-    &Env::bg_tex,
-    &Env::gi_tex,
-    &Env::reflect_tex,
-    &Env::refract_tex,
-    EnvRow::color(&Env::bg_color, Color(0, 0, 0), 1),
-    EnvRow::color(&Env::gi_color, Color(0, 0, 0), 1),
-    EnvRow::color(&Env::reflect_color, Color(0, 0, 0), 1),
-    EnvRow::color(&Env::refract_color, Color(0, 0, 0), 1),
-    EnvRow::f32(&Env::bg_tex_mult, 1, 1),
-    EnvRow::f32(&Env::gi_tex_mult, 1, 1),
-    EnvRow::f32(&Env::reflect_tex_mult, 1, 1),
-    EnvRow::f32(&Env::refract_tex_mult, 1, 1),
-    EnvRow::b8(&Env::override_bg, false, 1),
-    EnvRow::b8(&Env::override_gi, false, 1),
-    EnvRow::b8(&Env::override_reflect, false, 1),
-    EnvRow::b8(&Env::override_refract, false, 1),
+    RecordRow<Env>(&Env::bg_tex, "bg_tex", 2),
+    RecordRow<Env>(&Env::gi_tex, "gi_tex", 1),
+    RecordRow<Env>(&Env::reflect_tex, "reflect_tex", 3),
+    RecordRow<Env>(&Env::refract_tex, "refract_tex", 4),
+    EnvRow::color(&Env::bg_color, Color(0, 0, 0), 1).shownAs("bg_color", 6),
+    EnvRow::color(&Env::gi_color, Color(0, 0, 0), 1).shownAs("gi_color", 5),
+    EnvRow::color(&Env::reflect_color, Color(0, 0, 0), 1).shownAs("reflect_color", 7),
+    EnvRow::color(&Env::refract_color, Color(0, 0, 0), 1).shownAs("refract_color", 8),
+    EnvRow::f32(&Env::bg_tex_mult, 1, 1).shownAs("bg_tex_mult", 9),
+    EnvRow::f32(&Env::gi_tex_mult, 1, 1).shownAs("gi_tex_mult", 10),
+    EnvRow::f32(&Env::reflect_tex_mult, 1, 1).shownAs("reflect_tex_mult", 11),
+    EnvRow::f32(&Env::refract_tex_mult, 1, 1).shownAs("refract_tex_mult", 12),
+    EnvRow::b8(&Env::override_bg, false, 1).shownAs("override_bg", 13),
+    EnvRow::b8(&Env::override_gi, false, 1).shownAs("override_gi", 14),
+    EnvRow::b8(&Env::override_reflect, false, 1).shownAs("override_reflect", 15),
+    EnvRow::b8(&Env::override_refract, false, 1).shownAs("override_refract", 16),
 };
 
 RowSpan<RecordRow<Env>> MaterialOverrideEnvironment::record() { return rowSpan(kOverrideEnvironmentRecord); }
@@ -56,18 +59,19 @@ typedef MaterialDisplaced Disp;
 typedef RowsOf<Disp> DispRow;
 
 // Version 1: base record, base_mtl, displace_tex, displace_tex_mult.
-// Version 2: as 1, then the shift, the edge length and the four integers.
+// Version 2: as 1, then the shift, the edge length and the four integers,
+// which the XML shows as integers, also those that hold yes or no.
 const RecordRow<Disp> kDisplacedRecord[] = {
     kBaseRecord,
     &Disp::base_mtl,
-    &Disp::displace_tex,
-    DispRow::f32(&Disp::displace_tex_mult, 1, 1),
-    DispRow::f32(&Disp::displace_shift, 0, 2),
-    DispRow::f32(&Disp::displace_edge_length, 4, 2),
-    DispRow::i32(&Disp::displace_max_subdivs, 256, 2),
-    DispRow::i32(&Disp::displace_continuity, 1, 2),
-    DispRow::i32(&Disp::displace_view_dependent, 1, 2),
-    DispRow::i32(&Disp::displace_use_globals, 1, 2),
+    RecordRow<Disp>(&Disp::displace_tex, "displace_tex", 8),
+    DispRow::f32(&Disp::displace_tex_mult, 1, 1).shownAs("displace_tex_mult", 3),
+    DispRow::f32(&Disp::displace_shift, 0, 2).shownAs("displace_shift", 1),
+    DispRow::f32(&Disp::displace_edge_length, 4, 2).shownAs("displace_edge_length", 2),
+    DispRow::i32(&Disp::displace_max_subdivs, 256, 2).shownAs("displace_max_subdivs", 4),
+    DispRow::i32(&Disp::displace_continuity, 1, 2).shownAs("displace_continuity", 5),
+    DispRow::i32(&Disp::displace_view_dependent, 1, 2).shownAs("displace_view_dependent", 6),
+    DispRow::i32(&Disp::displace_use_globals, 1, 2).shownAs("displace_use_globals", 7),
 };
 
 RowSpan<RecordRow<MaterialDisplaced>> MaterialDisplaced::record() { return rowSpan(kDisplacedRecord); }
@@ -151,10 +155,10 @@ typedef MaterialAngleBlend Blend;
 
 const RecordRow<Blend> kAngleBlendRecord[] = {
     kBaseRecord,
-    &Blend::mtl_one,
-    &Blend::mtl_two,
-    RowsOf<Blend>::f32(&Blend::start_angle, 75, 1),
-    RowsOf<Blend>::f32(&Blend::stop_angle, 150, 1),
+    RecordRow<Blend>(&Blend::mtl_one, "mtl_one"),
+    RecordRow<Blend>(&Blend::mtl_two, "mtl_two"),
+    RowsOf<Blend>::f32(&Blend::start_angle, 75, 1).shownAs("start_angle"),
+    RowsOf<Blend>::f32(&Blend::stop_angle, 150, 1).shownAs("stop_angle"),
 };
 
 RowSpan<RecordRow<MaterialAngleBlend>> MaterialAngleBlend::record() { return rowSpan(kAngleBlendRecord); }
@@ -164,10 +168,9 @@ void MaterialAngleBlend::writeXml(AssetXmlWriter& writer, std::u16string url) {
     if (mtl_one) mtl_one->writeXml(writer, url);
     if (mtl_two) mtl_two->writeXml(writer, url);
     openMaterialAsset(writer, *this, url, "");
-    writeMaterialRef(writer, "mtl_one", mtl_one, url);
-    writeMaterialRef(writer, "mtl_two", mtl_two, url);
-    writer.writeFloat("start_angle", start_angle);
-    writer.writeFloat("stop_angle", stop_angle);
+    writeMaterialParams(writer, *this, record(), url, [&](const RecordRow<Blend>& row) {
+        writeMaterialRef(writer, row.xml.name, row.field.get<MaterialPtr>(*this), url);
+    });
     closeMaterialAsset(writer);
 }
 
@@ -179,10 +182,10 @@ typedef MaterialAlphaContribution Alpha;
 
 const RecordRow<Alpha> kAlphaContributionRecord[] = {
     kBaseRecord,
-    &Alpha::base_mtl,
-    &Alpha::alpha_tex,
-    RowsOf<Alpha>::f32(&Alpha::alpha_tex_mult, 1, 1),
-    RowsOf<Alpha>::f32(&Alpha::alpha, 1, 1),
+    RecordRow<Alpha>(&Alpha::base_mtl, "base_mtl", 3),
+    RecordRow<Alpha>(&Alpha::alpha_tex, "alpha_tex", 4),
+    RowsOf<Alpha>::f32(&Alpha::alpha_tex_mult, 1, 1).shownAs("alpha_tex_mult", 2),
+    RowsOf<Alpha>::f32(&Alpha::alpha, 1, 1).shownAs("alpha", 1),
 };
 
 RowSpan<RecordRow<MaterialAlphaContribution>> MaterialAlphaContribution::record() { return rowSpan(kAlphaContributionRecord); }
@@ -190,13 +193,11 @@ RowSpan<RecordRow<MaterialAlphaContribution>> MaterialAlphaContribution::record(
 void MaterialAlphaContribution::writeXml(AssetXmlWriter& writer, std::u16string url) {
     url = childUrl(url, name);
     if (base_mtl) base_mtl->writeXml(writer, url);
-    const std::u16string alphaUrl = childUrl(url, u"alpha_tex");
-    writeTextureAssets(writer, alpha_tex, alphaUrl);
+    writeTextureRowAssets(writer, *this, record(), url);
     openMaterialAsset(writer, *this, url, "");
-    writer.writeFloat("alpha", alpha);
-    writer.writeFloat("alpha_tex_mult", alpha_tex_mult);
-    writeMaterialRef(writer, "base_mtl", base_mtl, url);
-    writeTextureRef(writer, "alpha_tex", alpha_tex, alphaUrl);
+    writeMaterialParams(writer, *this, record(), url, [&](const RecordRow<Alpha>&) {
+        writeMaterialRef(writer, "base_mtl", base_mtl, url);
+    });
     closeMaterialAsset(writer);
 }
 

@@ -409,6 +409,13 @@ struct RecordRow {
         row.xml.slot = word;
         return row;
     }
+    // The field shown as parameter `name`, at place `at` (0: table order).
+    constexpr RecordRow shownAs(const char* name, int at = 0) const {
+        RecordRow row = *this;
+        row.xml.name = name;
+        row.xml.at = at;
+        return row;
+    }
     // The field's default, for tables that give their class its defaults.
     constexpr RecordRow byDefault(double value) const {
         RecordRow row = *this;
