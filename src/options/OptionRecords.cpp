@@ -286,23 +286,51 @@ const ParamRow<F> kFrameParams[] = {
     {"firstField", &F::firstField},
 };
 
+// The table of each table group and the versions its load reads.
+template <class Fields>
+struct TableOf;
+
+template <>
+struct TableOf<LumoParams> {
+    static constexpr const auto& rows = kParamsRows;
+    static constexpr int oldest = 1, newest = OrvaneParams::kVersion;
+};
+
+template <>
+struct TableOf<LumoFrameData> {
+    static constexpr const auto& rows = kFrameRows;
+    static constexpr int oldest = OrvaneFrameData::kVersion, newest = OrvaneFrameData::kVersion;
+};
+
 }  // namespace
 
-// ---- OrvaneParams ----------------------------------------------------------------------
+// ---- the table groups ------------------------------------------------------------------
 
-bool OrvaneParams::save(QuickArchive& ar) const {
-    writeVersion(ar, kVersion);
-    writeFields(ar, static_cast<const LumoParams&>(*this), kParamsRows, kVersion);
+template <class Fields>
+bool TableOptions<Fields>::save(QuickArchive& ar) const {
+    writeVersion(ar, TableOf<Fields>::newest);
+    writeFields(ar, static_cast<const Fields&>(*this), TableOf<Fields>::rows, TableOf<Fields>::newest);
     return true;
 }
 
-bool OrvaneParams::load(QuickArchive& ar) {
+template <class Fields>
+bool TableOptions<Fields>::load(QuickArchive& ar) {
     reset();
-    const int version = readVersion(ar, 1, kVersion);
+    const int version = readVersion(ar, TableOf<Fields>::oldest, TableOf<Fields>::newest);
     if (version < 0) return false;
-    readFields(ar, static_cast<LumoParams&>(*this), kParamsRows, version);
+    readFields(ar, static_cast<Fields&>(*this), TableOf<Fields>::rows, version);
     return true;
 }
+
+template <class Fields>
+void TableOptions<Fields>::reset() {
+    resetFields(static_cast<Fields&>(*this), TableOf<Fields>::rows);
+}
+
+template class TableOptions<LumoParams>;
+template class TableOptions<LumoFrameData>;
+
+// ---- OrvaneParams ----------------------------------------------------------------------
 
 void OrvaneParams::reset() {
     resetFields(static_cast<LumoParams&>(*this), kParamsRows);
@@ -328,25 +356,7 @@ void OrvaneParams::reset() {
     options_geom_backfaceCull = 0;
 }
 
-void OrvaneParams::writeXml(AssetXmlWriter&, std::u16string) {}
-
 // ---- OrvaneFrameData -------------------------------------------------------------------
-
-bool OrvaneFrameData::save(QuickArchive& ar) const {
-    writeVersion(ar, kVersion);
-    writeFields(ar, static_cast<const LumoFrameData&>(*this), kFrameRows, kVersion);
-    return true;
-}
-
-bool OrvaneFrameData::load(QuickArchive& ar) {
-    reset();
-    const int version = readVersion(ar, kVersion, kVersion);
-    if (version < 0) return false;
-    readFields(ar, static_cast<LumoFrameData&>(*this), kFrameRows, version);
-    return true;
-}
-
-void OrvaneFrameData::reset() { resetFields(static_cast<LumoFrameData&>(*this), kFrameRows); }
 
 void OrvaneFrameData::writeXml(AssetXmlWriter& writer, std::u16string url) {
     writeAsset(writer, url + u"/" + getPluginName(), getAssetType(), getPluginName(),
@@ -395,7 +405,5 @@ void OrvaneLFBStampInfo::reset() {
     text = kDefaultText;
     std::memset(fontDescription, 0, sizeof fontDescription);
 }
-
-void OrvaneLFBStampInfo::writeXml(AssetXmlWriter&, std::u16string) {}
 
 }  // namespace OrvaneLumoCore

@@ -10,35 +10,42 @@
 
 namespace OrvaneLumoCore {
 
+// An option group whose record is its version and then the fields of one
+// table (in OptionRecords.cpp, with the versions it reads): save, load and
+// reset walk that table. Defined for the two groups below.
+template <class Fields>
+class TableOptions : public OrvaneOptionsBase, public Fields {
+public:
+    bool save(QuickArchive& ar) const override;
+    bool load(QuickArchive& ar) override;
+    void reset() override;
+};
+
+extern template class TableOptions<LumoUtils::LumoParams>;
+extern template class TableOptions<LumoUtils::LumoFrameData>;
+
 // Nearly all numbers of the render settings. Writes no XML of its own: the
 // document's blocks read its fields.
-class OrvaneParams : public OrvaneOptionsBase, public LumoUtils::LumoParams {
+class OrvaneParams : public TableOptions<LumoUtils::LumoParams> {
 public:
     static constexpr int kVersion = 5;
 
     OrvaneParams() { reset(); }
 
-    bool save(QuickArchive& ar) const override;
-    bool load(QuickArchive& ar) override;
     // The defaults of a bare parameter set. A document differs in four of
     // them; see AllOptions::reset.
     void reset() override;
 
-    void writeXml(AssetXmlWriter& writer, std::u16string url) override;
     std::u16string getPluginName() const override { return u"OrvaneParams"; }
 };
 
 // The frame and view of a render. The document shows only its settings
 // fields; its own XML is that of a stand-alone FrameData asset.
-class OrvaneFrameData : public OrvaneOptionsBase, public LumoUtils::LumoFrameData {
+class OrvaneFrameData : public TableOptions<LumoUtils::LumoFrameData> {
 public:
     static constexpr int kVersion = 1;
 
     OrvaneFrameData() { reset(); }
-
-    bool save(QuickArchive& ar) const override;
-    bool load(QuickArchive& ar) override;
-    void reset() override;
 
     // One Asset (without an Assets element) of the fields that are no settings.
     void writeXml(AssetXmlWriter& writer, std::u16string url) override;
@@ -59,7 +66,6 @@ public:
     // text; font size and name keep what the constructor gave them.
     void reset() override;
 
-    void writeXml(AssetXmlWriter& writer, std::u16string url) override;
     std::u16string getPluginName() const override { return u"LFBStampInfo"; }
 };
 
