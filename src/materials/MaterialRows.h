@@ -17,6 +17,9 @@ namespace OrvaneLumoCore {
 // The base record (name, uuid) at its place in a material's record.
 const RowHook kBaseRecord{1};
 
+// The code of a texture row whose texture a copy of the material shares.
+constexpr int kSharedOnCopy = 2;
+
 // The defaults of the table's fields, children null; name and uuid stay.
 template <class M, class Rows>
 void resetMaterialRows(M& m, const Rows& rows) {
@@ -25,12 +28,12 @@ void resetMaterialRows(M& m, const Rows& rows) {
         if (row.field.isChild()) row.field.reset(m, 0, Color());
 }
 
-// Reads a version tag of 1 to `newest` and resets `m` (also when the tag is
-// refused), then reads the rows that the version holds.
+// Reads a version tag of 1 to `newest` and, if `resets`, resets `m` (also
+// when the tag is refused), then reads the rows that the version holds.
 template <class M, class Rows>
-bool loadMaterialRecord(M& m, QuickArchive& ar, const Rows& rows, int newest) {
+bool loadMaterialRecord(M& m, QuickArchive& ar, const Rows& rows, int newest, bool resets = true) {
     const int v = readVersion(ar, 1, newest);
-    m.reset();
+    if (resets) m.reset();
     if (v < 0) return false;
     return readFields(ar, m, rows, v, [&](const RecordRow<M>& row) {
         switch (row.field.kind()) {
@@ -71,7 +74,7 @@ bool materialRowsEqual(const M& a, const M& b, const Rows& rows) {
 }
 
 // On a fresh copy: child materials by their duplicate() or clone(), textures
-// by their clone().
+// by their clone() but those the copy shares.
 template <class M, class Rows>
 void copyChildRows(M& copy, const Rows& rows, bool newName) {
     for (const RecordRow<M>& row : rows) {
@@ -79,7 +82,7 @@ void copyChildRows(M& copy, const Rows& rows, bool newName) {
         if (f.kind() == FieldRef<M>::Kind::Material) {
             MaterialPtr& child = f.template get<MaterialPtr>(copy);
             child = copyChild(child, newName);
-        } else if (f.kind() == FieldRef<M>::Kind::Texture) {
+        } else if (f.kind() == FieldRef<M>::Kind::Texture && row.hook != kSharedOnCopy) {
             TexturePtr& texture = f.template get<TexturePtr>(copy);
             texture = cloneChild(texture);
         }
@@ -105,6 +108,17 @@ void writeTextureRowAssets(AssetXmlWriter& w, const M& m, const Rows& rows, cons
     });
 }
 
+// The Assets of the table's child materials, in the order of their
+// parameters, under `url`.
+template <class M, class Rows>
+void writeChildMaterialAssets(AssetXmlWriter& w, const M& m, const Rows& rows, const std::u16string& url) {
+    forEachShown<M>(rows, [&](const RecordRow<M>& row) {
+        if (row.field.kind() != FieldRef<M>::Kind::Material) return;
+        const MaterialPtr& child = row.field.template get<MaterialPtr>(m);
+        if (child) child->writeXml(w, url);
+    });
+}
+
 // The table's parameters: fields in their form, textures referred to in
 // their slots; a child material's row goes to `material(row)`.
 template <class M, class Rows, class MaterialRef>
@@ -124,8 +138,10 @@ void writeMaterialParams(AssetXmlWriter& w, const M& m, const Rows& rows, const 
 //   static constexpr int kRecordVersion = N;    // the version that save writes
 //
 // and gets reset (the table's defaults; name and uuid stay), save, load
-// (which resets right behind the version tag, also when the tag is refused),
-// the comparison and the copies from it.
+// (which resets right behind the version tag, also when the tag is refused,
+// unless the class says `static constexpr bool kLoadResets = false;`), the
+// comparison and the copies from it. A class whose XML is its table's
+// parameters under its own Asset also gets writeXml from writeTableAsset.
 template <class Derived, std::uint32_t Tag>
 class TableMaterialOf : public MaterialOf<Derived, Tag> {
 public:
@@ -134,10 +150,27 @@ public:
         return saveMaterialRecord(self(), ar, Derived::record(), Derived::kRecordVersion);
     }
     bool load(QuickArchive& ar) override {
-        return loadMaterialRecord(self(), ar, Derived::record(), Derived::kRecordVersion);
+        return loadMaterialRecord(self(), ar, Derived::record(), Derived::kRecordVersion, Derived::kLoadResets);
     }
     bool sameContent(const Derived& o) const { return materialRowsEqual(self(), o, Derived::record()); }
     void copyChildren(bool newName) { copyChildRows(self(), Derived::record(), newName); }
+
+    static constexpr bool kLoadResets = true;
+
+protected:
+    // The children's Assets, the textures', then the material's own Asset
+    // under `url`/its name with the table's parameters.
+    void writeTableAsset(AssetXmlWriter& writer, std::u16string url) {
+        const Derived& m = self();
+        url = childUrl(url, m.name);
+        writeChildMaterialAssets(writer, m, Derived::record(), url);
+        writeTextureRowAssets(writer, m, Derived::record(), url);
+        openMaterialAsset(writer, m, url, "");
+        writeMaterialParams(writer, m, Derived::record(), url, [&](const RecordRow<Derived>& row) {
+            writeMaterialRef(writer, row.xml.name, row.field.template get<MaterialPtr>(m), url);
+        });
+        closeMaterialAsset(writer);
+    }
 
 private:
     Derived& self() { return static_cast<Derived&>(*this); }

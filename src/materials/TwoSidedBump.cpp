@@ -1,6 +1,7 @@
 #include "materials/TwoSidedBump.h"
 
 #include "materials/MaterialMembers.h"
+#include "materials/MaterialRows.h"
 #include "persistence/QuickArchive.h"
 #include "persistence/Record.h"
 #include "textures/Bitmaps.h"
@@ -9,8 +10,6 @@
 namespace OrvaneLumoCore {
 
 namespace {
-const int k2SidedVersion = 3;
-const int kSkp2SidedVersion = 1;
 const int kBumpVersion = 3;
 }  // namespace
 
@@ -18,136 +17,37 @@ const int kBumpVersion = 3;
 
 Material2Sided::Material2Sided() { Material2Sided::reset(); }
 
-void Material2Sided::reset() {
-    front.reset();
-    back.reset();
-    translucency_tex.reset();
-    transparency_tex.reset();
-    translucency = Color(0, 0, 0);
-    transparency = Color(0, 0, 0);
-    translucency_tex_mult = 1;
-    transparency_tex_mult = 1;
-    force_1sided = false;
-}
+typedef Material2Sided TS;
 
-bool Material2Sided::save(QuickArchive& ar) const {
-    writeVersion(ar, k2SidedVersion);
-    if (!saveOptionalMember(ar, front) || !saveOptionalMember(ar, back) ||
-        !saveOptionalMember(ar, translucency_tex))
-        return false;
-    ar.writeColor(translucency);
-    ar.writeFloat(translucency_tex_mult);
-    ar.writeByte(force_1sided);
-    if (!saveOptionalMember(ar, transparency_tex)) return false;
-    ar.writeColor(transparency);
-    ar.writeFloat(transparency_tex_mult);
-    return BaseMaterial::save(ar);
-}
+const RecordRow<TS> k2SidedRecord[] = {
+    {&TS::front, "front", 1},
+    {&TS::back, "back", 2},
+    RecordRow<TS>(&TS::translucency_tex, "translucency_tex", 3).coded(kSharedOnCopy),
+    {&TS::translucency, "translucency", 5},
+    RowsOf<TS>::f32(&TS::translucency_tex_mult, 1, 1).shownAs("translucency_tex_mult", 7),
+    {&TS::force_1sided, "force_1sided", 9},
+    RecordRow<TS>(&TS::transparency_tex, 2, "transparency_tex", 4).coded(kSharedOnCopy),
+    {&TS::transparency, 2, "transparency", 6},
+    RowsOf<TS>::f32(&TS::transparency_tex_mult, 1, 2).shownAs("transparency_tex_mult", 8),
+    RecordRow<TS>(kBaseRecord, 3),
+};
 
-// Version 1: front, back, translucency_tex, translucency,
-//            translucency_tex_mult, force_1sided.
-// Version 2: as 1, then transparency_tex, transparency, transparency_tex_mult.
-// Version 3: as 2, then the base record.
-bool Material2Sided::load(QuickArchive& ar) {
-    const int v = readVersion(ar, 1, k2SidedVersion);
-    if (v < 0) return false;
-    if (!loadMaterialMember(ar, front) || !loadMaterialMember(ar, back) ||
-        !loadTextureMember(ar, translucency_tex))
-        return false;
-    ar.readColor(translucency);
-    ar.readFloat(translucency_tex_mult);
-    ar.readByte(force_1sided);
-    if (v >= 2) {
-        if (!loadTextureMember(ar, transparency_tex)) return false;
-        ar.readColor(transparency);
-        ar.readFloat(transparency_tex_mult);
-    }
-    if (v >= 3) return BaseMaterial::load(ar);
-    return true;
-}
-
-// The textures stay shared with the source.
-void Material2Sided::copyChildren(bool newName) {
-    front = copyChild(front, newName);
-    back = copyChild(back, newName);
-}
-
-bool Material2Sided::sameContent(const Material2Sided& o) const {
-    return childrenEqual(front, o.front) && childrenEqual(back, o.back) &&
-           childrenEqual(translucency_tex, o.translucency_tex) &&
-           childrenEqual(transparency_tex, o.transparency_tex) && translucency == o.translucency &&
-           transparency == o.transparency && translucency_tex_mult == o.translucency_tex_mult &&
-           transparency_tex_mult == o.transparency_tex_mult && force_1sided == o.force_1sided;
-}
-
-void Material2Sided::writeXml(AssetXmlWriter& writer, std::u16string url) {
-    url = childUrl(url, name);
-    if (front) front->writeXml(writer, url);
-    if (back) back->writeXml(writer, url);
-    const std::u16string translucencyUrl = childUrl(url, u"translucency_tex");
-    const std::u16string transparencyUrl = childUrl(url, u"transparency_tex");
-    writeTextureAssets(writer, translucency_tex, translucencyUrl);
-    writeTextureAssets(writer, transparency_tex, transparencyUrl);
-
-    openMaterialAsset(writer, *this, url, "");
-    writeMaterialRef(writer, "front", front, url);
-    writeMaterialRef(writer, "back", back, url);
-    writeTextureRef(writer, "translucency_tex", translucency_tex, translucencyUrl);
-    writeTextureRef(writer, "transparency_tex", transparency_tex, transparencyUrl);
-    writer.writeColor("translucency", translucency);
-    writer.writeColor("transparency", transparency);
-    writer.writeFloat("translucency_tex_mult", translucency_tex_mult);
-    writer.writeFloat("transparency_tex_mult", transparency_tex_mult);
-    writer.writeBool("force_1sided", force_1sided);
-    closeMaterialAsset(writer);
-}
+RowSpan<RecordRow<TS>> Material2Sided::record() { return rowSpan(k2SidedRecord); }
 
 // ---- MaterialSkp2Sided -------------------------------------------------------------
 
 MaterialSkp2Sided::MaterialSkp2Sided() { MaterialSkp2Sided::reset(); }
 
-void MaterialSkp2Sided::reset() {
-    front.reset();
-    back.reset();
-    force_1sided = false;
-}
+typedef MaterialSkp2Sided Skp;
 
-bool MaterialSkp2Sided::save(QuickArchive& ar) const {
-    writeVersion(ar, kSkp2SidedVersion);
-    if (!BaseMaterial::save(ar) || !saveOptionalMember(ar, front) || !saveOptionalMember(ar, back))
-        return false;
-    ar.writeByte(force_1sided);
-    return true;
-}
+const RecordRow<Skp> kSkp2SidedRecord[] = {
+    kBaseRecord,
+    {&Skp::front, "front"},
+    {&Skp::back, "back"},
+    {&Skp::force_1sided, "force_1sided"},
+};
 
-bool MaterialSkp2Sided::load(QuickArchive& ar) {
-    if (readVersion(ar, 1, kSkp2SidedVersion) < 0) return false;
-    if (!BaseMaterial::load(ar) || !loadMaterialMember(ar, front) || !loadMaterialMember(ar, back))
-        return false;
-    ar.readByte(force_1sided);
-    return true;
-}
-
-void MaterialSkp2Sided::copyChildren(bool newName) {
-    front = copyChild(front, newName);
-    back = copyChild(back, newName);
-}
-
-bool MaterialSkp2Sided::sameContent(const MaterialSkp2Sided& o) const {
-    return childrenEqual(front, o.front) && childrenEqual(back, o.back) &&
-           force_1sided == o.force_1sided;
-}
-
-void MaterialSkp2Sided::writeXml(AssetXmlWriter& writer, std::u16string url) {
-    url = childUrl(url, name);
-    if (front) front->writeXml(writer, url);
-    if (back) back->writeXml(writer, url);
-    openMaterialAsset(writer, *this, url, "");
-    writeMaterialRef(writer, "front", front, url);
-    writeMaterialRef(writer, "back", back, url);
-    writer.writeBool("force_1sided", force_1sided);
-    closeMaterialAsset(writer);
-}
+RowSpan<RecordRow<Skp>> MaterialSkp2Sided::record() { return rowSpan(kSkp2SidedRecord); }
 
 // ---- MaterialBump ----------------------------------------------------------------
 

@@ -7,61 +7,55 @@
 #include <string>
 
 #include "materials/MaterialOf.h"
+#include "materials/MaterialRows.h"
 #include "textures/BaseTexture.h"
 #include "values/Types.h"
 
 namespace OrvaneLumoCore {
 
-class Material2Sided : public MaterialOf<Material2Sided, kMaterial2Sided> {
+// Version 1: front, back, translucency_tex, translucency,
+//            translucency_tex_mult, force_1sided.
+// Version 2: as 1, then transparency_tex, transparency, transparency_tex_mult.
+// Version 3: as 2, then the base record.
+class Material2Sided : public TableMaterialOf<Material2Sided, kMaterial2Sided> {
 public:
+    static constexpr int kRecordVersion = 3;
+    // Versions 1 and 2 leave the name as it was.
+    static constexpr bool kLoadResets = false;
+    static RowSpan<RecordRow<Material2Sided>> record();
+
     Material2Sided();
 
-    bool save(QuickArchive& ar) const override;
-    // Does not reset first. Versions 1 and 2 leave the name as it was.
-    bool load(QuickArchive& ar) override;
-    // The defaults of the fields below; name and uuid stay.
-    void reset() override;
-    bool sameContent(const Material2Sided& o) const;
-
     // The children's Assets, the textures', then the material's own.
-    void writeXml(AssetXmlWriter& writer, std::u16string url) override;
+    void writeXml(AssetXmlWriter& writer, std::u16string url) override { writeTableAsset(writer, url); }
     std::u16string getPluginName() const override { return u"Mtl2Sided"; }
 
     MaterialPtr front;
     MaterialPtr back;
-    TexturePtr translucency_tex;
+    TexturePtr translucency_tex;  // a copy shares the textures
     TexturePtr transparency_tex;
     Color translucency;
     Color transparency;
     float translucency_tex_mult;
     float transparency_tex_mult;
     bool force_1sided;
-
-    // front and back by their own duplicate()/clone(); the textures are shared.
-    void copyChildren(bool newName);
 };
 
-class MaterialSkp2Sided : public MaterialOf<MaterialSkp2Sided, kMaterialSkp2Sided> {
+// The base record stands first in this record.
+class MaterialSkp2Sided : public TableMaterialOf<MaterialSkp2Sided, kMaterialSkp2Sided> {
 public:
+    static constexpr int kRecordVersion = 1;
+    static constexpr bool kLoadResets = false;
+    static RowSpan<RecordRow<MaterialSkp2Sided>> record();
+
     MaterialSkp2Sided();
 
-    // The base record stands first in this record.
-    bool save(QuickArchive& ar) const override;
-    // Does not reset first.
-    bool load(QuickArchive& ar) override;
-    // The defaults of the fields below; name and uuid stay.
-    void reset() override;
-    bool sameContent(const MaterialSkp2Sided& o) const;
-
-    void writeXml(AssetXmlWriter& writer, std::u16string url) override;
+    void writeXml(AssetXmlWriter& writer, std::u16string url) override { writeTableAsset(writer, url); }
     std::u16string getPluginName() const override { return u"MtlSkp2Sided"; }
 
     MaterialPtr front;
     MaterialPtr back;
     bool force_1sided;
-
-    // On a fresh copy: the children that are not to be shared.
-    void copyChildren(bool newName);
 };
 
 class MaterialBump : public MaterialOf<MaterialBump, kMaterialBump> {

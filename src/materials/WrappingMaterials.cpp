@@ -163,16 +163,7 @@ const RecordRow<Blend> kAngleBlendRecord[] = {
 
 RowSpan<RecordRow<MaterialAngleBlend>> MaterialAngleBlend::record() { return rowSpan(kAngleBlendRecord); }
 
-void MaterialAngleBlend::writeXml(AssetXmlWriter& writer, std::u16string url) {
-    url = childUrl(url, name);
-    if (mtl_one) mtl_one->writeXml(writer, url);
-    if (mtl_two) mtl_two->writeXml(writer, url);
-    openMaterialAsset(writer, *this, url, "");
-    writeMaterialParams(writer, *this, record(), url, [&](const RecordRow<Blend>& row) {
-        writeMaterialRef(writer, row.xml.name, row.field.get<MaterialPtr>(*this), url);
-    });
-    closeMaterialAsset(writer);
-}
+void MaterialAngleBlend::writeXml(AssetXmlWriter& writer, std::u16string url) { writeTableAsset(writer, url); }
 
 // ---- MaterialAlphaContribution --------------------------------------------------------------------
 
@@ -190,15 +181,6 @@ const RecordRow<Alpha> kAlphaContributionRecord[] = {
 
 RowSpan<RecordRow<MaterialAlphaContribution>> MaterialAlphaContribution::record() { return rowSpan(kAlphaContributionRecord); }
 
-void MaterialAlphaContribution::writeXml(AssetXmlWriter& writer, std::u16string url) {
-    url = childUrl(url, name);
-    if (base_mtl) base_mtl->writeXml(writer, url);
-    writeTextureRowAssets(writer, *this, record(), url);
-    openMaterialAsset(writer, *this, url, "");
-    writeMaterialParams(writer, *this, record(), url, [&](const RecordRow<Alpha>&) {
-        writeMaterialRef(writer, "base_mtl", base_mtl, url);
-    });
-    closeMaterialAsset(writer);
-}
+void MaterialAlphaContribution::writeXml(AssetXmlWriter& writer, std::u16string url) { writeTableAsset(writer, url); }
 
 }  // namespace OrvaneLumoCore

@@ -16,17 +16,10 @@ const char16_t* const kFilterLabels[3] = {u"No filter", u"Mip-map", u"Summed-are
 typedef BitmapBuffer B;
 
 const RecordRow<B> kBufferRecord[] = {
-    &B::filter_type,
-    &B::filter_blur,
-    &B::gamma,
-    FieldRef<B>::path(&B::file),
-};
-
-const ParamRow<B> kBufferParams[] = {
-    {"filter_type", &B::filter_type},
-    {"filter_blur", &B::filter_blur},
-    {"gamma", &B::gamma},
-    {"file", FieldRef<B>::path(&B::file)},
+    {&B::filter_type, "filter_type"},
+    {&B::filter_blur, "filter_blur"},
+    {&B::gamma, "gamma"},
+    {FieldRef<B>::path(&B::file), "file"},
 };
 
 RowSpan<RecordRow<BitmapBuffer>> BitmapBuffer::record() { return rowSpan(kBufferRecord); }
@@ -34,11 +27,14 @@ RowSpan<RecordRow<BitmapBuffer>> BitmapBuffer::record() { return rowSpan(kBuffer
 void BitmapBuffer::writeXml(AssetXmlWriter& w, std::u16string url) {
     TextureFrame frame(w, *this, url);
     frame.open();
-    writeParams(w, *this, kBufferParams);
+    writeShownFields(w, *this, kBufferRecord);
     frame.close();
 }
 
 // ---- BitmapTexture -------------------------------------------------------------
+//
+// Written by hand: the record holds the generator's and the buffer's tags
+// together, ahead of both records.
 
 void BitmapTexture::reset() {
     uvw.reset();
