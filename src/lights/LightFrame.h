@@ -30,4 +30,23 @@ void writeLightAsset(AssetXmlWriter& w, const std::u16string& url, const std::u1
     writeAsset(w, url, "light", plugin, writeParams);
 }
 
+// Base of a light whose record is one flat table that also names the XML
+// parameters (FlatFamilyOf gives save, load and the comparison): its Asset
+// stands under the owner's url, "/" and the plugin name and shows the table's
+// parameters, then those of writeConstantParams.
+template <class Derived, std::uint32_t Tag>
+class TableLightOf : public FlatFamilyOf<Derived, Tag, BaseLight> {
+public:
+    void writeXml(AssetXmlWriter& w, std::u16string url) override {
+        const Derived& light = this->self();
+        const std::u16string plugin = light.getPluginName();
+        writeLightAsset(w, url + u"/" + plugin, plugin, [&] {
+            writeShownFields(w, light, Derived::record());
+            light.writeConstantParams(w);
+        });
+    }
+    // Parameters that no field holds: none, unless the class says otherwise.
+    void writeConstantParams(AssetXmlWriter&) const {}
+};
+
 }  // namespace OrvaneLumoCore

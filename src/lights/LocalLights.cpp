@@ -148,29 +148,19 @@ void MayaDirectLight::writeXml(AssetXmlWriter& writer, std::u16string url) {
 
 RowSpan<RecordRow<OmniLight>> OmniLight::record() { return rowSpan(kOmniRecord); }
 
-void OmniLight::writeXml(AssetXmlWriter& writer, std::u16string url) {
-    writeParamAsset(writer, url, *this, kOmniRecord);
-}
 
 // ---- SpotLight ----
 
 RowSpan<RecordRow<SpotLight>> SpotLight::record() { return rowSpan(kSpotRecord); }
 
-void SpotLight::writeXml(AssetXmlWriter& writer, std::u16string url) {
-    writeLightAsset(writer, url + u"/" + getPluginName(), getPluginName(), [&] {
-        writeShownFields(writer, *this, kSpotRecord);
-        // Always on; the consumer reads it as a setting of its own.
-        writer.writeBool("legacyMode", true, "Legacy Mode", true);
-    });
+void SpotLight::writeConstantParams(AssetXmlWriter& writer) const {
+    writer.writeBool("legacyMode", true, "Legacy Mode", true);
 }
 
 // ---- RectangleLight ----
 
 RowSpan<RecordRow<RectangleLight>> RectangleLight::record() { return rowSpan(kRectangleRecord); }
 
-void RectangleLight::writeXml(AssetXmlWriter& writer, std::u16string url) {
-    writeParamAsset(writer, url, *this, kRectangleRecord);
-}
 
 // ---- SphereLight ----
 //

@@ -60,23 +60,23 @@ struct PointLightFields : PlacedLightFields {
     std::int32_t shadowSubdivs = 8;
 };
 
-class OmniLight : public FlatFamilyOf<OmniLight, 2, BaseLight>, public PointLightFields {
+class OmniLight : public TableLightOf<OmniLight, 2>, public PointLightFields {
 public:
     static constexpr int kRecordVersion = 4;
     static RowSpan<RecordRow<OmniLight>> record();
 
-    void writeXml(AssetXmlWriter& writer, std::u16string url) override;
     std::u16string getPluginName() const override { return u"LightOmni"; }
 
     float intensity = 30.0f;
 };
 
-class SpotLight : public FlatFamilyOf<SpotLight, 4, BaseLight>, public PointLightFields {
+class SpotLight : public TableLightOf<SpotLight, 4>, public PointLightFields {
 public:
     static constexpr int kRecordVersion = 4;
     static RowSpan<RecordRow<SpotLight>> record();
 
-    void writeXml(AssetXmlWriter& writer, std::u16string url) override;
+    // Always on; the consumer reads it as a setting of its own.
+    void writeConstantParams(AssetXmlWriter& writer) const;
     std::u16string getPluginName() const override { return u"LightSpot"; }
 
     float intensity = 50.0f;
@@ -89,12 +89,11 @@ public:
     bool barnDoor = false;
 };
 
-class RectangleLight : public FlatFamilyOf<RectangleLight, 3, BaseLight>, public PlacedLightFields {
+class RectangleLight : public TableLightOf<RectangleLight, 3>, public PlacedLightFields {
 public:
     static constexpr int kRecordVersion = 4;
     static RowSpan<RecordRow<RectangleLight>> record();
 
-    void writeXml(AssetXmlWriter& writer, std::u16string url) override;
     std::u16string getPluginName() const override { return u"LightRectangle"; }
 
     float intensity = 30.0f;

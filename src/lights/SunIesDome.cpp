@@ -168,10 +168,6 @@ namespace {
 
 RowSpan<RecordRow<IESLight>> IESLight::record() { return rowSpan(kIesRecord); }
 
-void IESLight::writeXml(AssetXmlWriter& writer, std::u16string url) {
-    writeLightAsset(writer, url + u"/" + getPluginName(), getPluginName(),
-                    [&] { writeShownFields(writer, *this, kIesRecord); });
-}
 
 // ---- DomeLight ----
 

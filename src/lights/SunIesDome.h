@@ -79,12 +79,11 @@ void resetDocumentSun();
 // True if `id` is the document sun's id, ignoring case.
 bool isDocumentSunId(const std::u16string& id);
 
-class IESLight : public FlatFamilyOf<IESLight, 6, BaseLight> {
+class IESLight : public TableLightOf<IESLight, 6> {
 public:
     static constexpr int kRecordVersion = 3;
     static RowSpan<RecordRow<IESLight>> record();  // the file path compares without regard to case
 
-    void writeXml(AssetXmlWriter& writer, std::u16string url) override;
     std::u16string getPluginName() const override { return u"LightIES"; }
 
     Transform transform;

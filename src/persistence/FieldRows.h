@@ -559,19 +559,26 @@ void writeRow(QuickArchive& ar, const C& obj, const RecordRow<C>& row) {
     }
 }
 
-// Reads the rows that `version` holds, in table order; a hook row goes to
-// `hook(row)`, which returns false to end the load. `rows` is an array or a
-// RowSpan of RecordRow<C>.
-template <class C, class Rows, class Hook>
-bool readFields(QuickArchive& ar, C& obj, const Rows& rows, int version, Hook hook) {
+// Walks the rows that `version` holds and that have bytes, in table order:
+// a hook row goes to `hook(row)`, which returns false to end the walk, every
+// other row to `plain(row)`. `rows` is an array or a RowSpan of RecordRow<C>.
+template <class C, class Rows, class Plain, class Hook>
+bool walkRecord(const Rows& rows, int version, Plain plain, Hook hook) {
     for (const RecordRow<C>& row : rows) {
         if (!row.inVersion(version) || !row.hasBytes()) continue;
         if (row.use != RowUse::Hook)
-            readRow(ar, obj, row);
+            plain(row);
         else if (!hook(row))
             return false;
     }
     return true;
+}
+
+// Reads the rows that `version` holds; a hook row goes to `hook(row)`, which
+// returns false to end the load.
+template <class C, class Rows, class Hook>
+bool readFields(QuickArchive& ar, C& obj, const Rows& rows, int version, Hook hook) {
+    return walkRecord<C>(rows, version, [&](const RecordRow<C>& row) { readRow(ar, obj, row); }, hook);
 }
 
 template <class C, class Rows>
@@ -579,18 +586,11 @@ void readFields(QuickArchive& ar, C& obj, const Rows& rows, int version) {
     readFields(ar, obj, rows, version, [](const RecordRow<C>&) { return true; });
 }
 
-// Writes the rows that `version` holds, in table order; a hook row goes to
-// `hook(row)`, which returns false to end the save.
+// Writes the rows that `version` holds; a hook row goes to `hook(row)`,
+// which returns false to end the save.
 template <class C, class Rows, class Hook>
 bool writeFields(QuickArchive& ar, const C& obj, const Rows& rows, int version, Hook hook) {
-    for (const RecordRow<C>& row : rows) {
-        if (!row.inVersion(version) || !row.hasBytes()) continue;
-        if (row.use != RowUse::Hook)
-            writeRow(ar, obj, row);
-        else if (!hook(row))
-            return false;
-    }
-    return true;
+    return walkRecord<C>(rows, version, [&](const RecordRow<C>& row) { writeRow(ar, obj, row); }, hook);
 }
 
 template <class C, class Rows>
