@@ -11,7 +11,21 @@
 
 namespace OrvaneLumoCore {
 
-class MayaDirectLight : public LightOf<MayaDirectLight, 0> {
+// Fields that every light of this file but the sphere has, with the same
+// defaults in all.
+struct SceneLightFields {
+    Color color{1, 1, 1};
+    Color shadowColor{0, 0, 0};
+    float shadowBias = 0.0f;
+    float storedFactor = 1.0f;
+    std::int32_t photonSubdivs = 500;
+    std::int32_t causticSubdivs = 1000;
+    std::int32_t storedMode = 3;
+    bool enabled = true;
+    bool shadows = true;
+};
+
+class MayaDirectLight : public LightOf<MayaDirectLight, 0>, public SceneLightFields {
 public:
     bool save(QuickArchive& ar) const override;
     bool load(QuickArchive& ar) override;
@@ -19,36 +33,17 @@ public:
     void writeXml(AssetXmlWriter& writer, std::u16string url) override;
     std::u16string getPluginName() const override { return u"MayaLightDirect"; }
 
-    Color color{1, 1, 1};
-    Color shadowColor{0, 0, 0};
     AnimatedTransform transform;  // identity at time 0
     float intensity = 1.0f;
-    float shadowBias = 0.0f;
     float shadowRadius = 0.0f;
-    float storedFactor = 1.0f;
-    std::int32_t photonSubdivs = 500;
-    std::int32_t causticSubdivs = 1000;
     std::int32_t shadowSubdivs = 8;
-    std::int32_t storedMode = 3;
-    bool enabled = true;
-    bool shadows = true;
 };
 
-// Fields that the omni, spot and rectangle lights share, with the same
-// defaults in all three.
-struct PlacedLightFields {
-    Color color{1, 1, 1};
-    Color shadowColor{0, 0, 0};
+// The further fields that the omni, spot and rectangle lights share.
+struct PlacedLightFields : SceneLightFields {
     Transform transform;
-    float shadowBias = 0.0f;
     float cutoffThreshold = 0.005f;
-    float storedFactor = 1.0f;
     std::int32_t units = 0;
-    std::int32_t photonSubdivs = 500;
-    std::int32_t causticSubdivs = 1000;
-    std::int32_t storedMode = 3;
-    bool enabled = true;
-    bool shadows = true;
     bool affectDiffuse = true;
     bool affectSpecular = true;
 };

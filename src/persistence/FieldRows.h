@@ -393,53 +393,37 @@ struct RecordRow {
         return row;
     }
 
+    // A copy of the row with one column set.
+    template <class T, class V>
+    constexpr RecordRow with(T RecordRow::*column, V value) const {
+        RecordRow row = *this;
+        row.*column = value;
+        return row;
+    }
+    template <class T, class V>
+    constexpr RecordRow withXml(T RowXml::*column, V value) const {
+        RecordRow row = *this;
+        row.xml.*column = value;
+        return row;
+    }
+
     constexpr RecordRow labelled(const char* text, bool userData = false) const {
-        RecordRow row = *this;
-        row.xml.label = text;
-        row.xml.userData = userData;
-        return row;
+        return withXml(&RowXml::label, text).withXml(&RowXml::userData, userData);
     }
-    constexpr RecordRow asFlag() const {
-        RecordRow row = *this;
-        row.xml.asFlag = true;
-        return row;
-    }
-    constexpr RecordRow slot(const char16_t* word) const {
-        RecordRow row = *this;
-        row.xml.slot = word;
-        return row;
-    }
+    constexpr RecordRow asFlag() const { return withXml(&RowXml::asFlag, true); }
+    constexpr RecordRow slot(const char16_t* word) const { return withXml(&RowXml::slot, word); }
     // The field shown as parameter `name`, at place `at` (0: table order).
     constexpr RecordRow shownAs(const char* name, int at = 0) const {
-        RecordRow row = *this;
-        row.xml.name = name;
-        row.xml.at = at;
-        return row;
+        return withXml(&RowXml::name, name).withXml(&RowXml::at, at);
     }
     // The field's default, for tables that give their class its defaults.
-    constexpr RecordRow byDefault(double value) const {
-        RecordRow row = *this;
-        row.number = value;
-        return row;
-    }
-    constexpr RecordRow byDefault(const Color& value) const {
-        RecordRow row = *this;
-        row.color = value;
-        return row;
-    }
+    constexpr RecordRow byDefault(double value) const { return with(&RecordRow::number, value); }
+    constexpr RecordRow byDefault(const Color& value) const { return with(&RecordRow::color, value); }
     // The field shown in a form of the class's own: the XML walk hands the
     // row to the class's hook with `xml.form` set to `code`.
-    constexpr RecordRow shownBy(int code) const {
-        RecordRow row = *this;
-        row.xml.form = code;
-        return row;
-    }
+    constexpr RecordRow shownBy(int code) const { return withXml(&RowXml::form, code); }
     // The code that a hook row hands to the class's hook.
-    constexpr RecordRow coded(int code) const {
-        RecordRow row = *this;
-        row.hook = code;
-        return row;
-    }
+    constexpr RecordRow coded(int code) const { return with(&RecordRow::hook, code); }
 
     FieldRef<C> field;
     int since = 1;
