@@ -56,14 +56,6 @@ template class TableTextureOf<FresnelTexture, 1>;
 //
 // Written by hand: a multiplier is in the record only behind a present texture.
 
-void BlendTexture::reset() {
-    color_a.reset();
-    color_b.reset();
-    colorAMult = 1.0f;
-    colorBMult = 1.0f;
-    blend_amount = 0.5f;
-}
-
 bool BlendTexture::save(QuickArchive& ar) const {
     writeVersion(ar, 2);
     if (!saveOptionalMember(ar, color_a)) return false;

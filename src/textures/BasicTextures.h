@@ -34,11 +34,8 @@ public:
 // Mixes two textures by a fixed amount.
 class BlendTexture : public FamilyOf<BlendTexture, 10, BaseTexture> {
 public:
-    BlendTexture() { reset(); }
-
     bool save(QuickArchive& ar) const override;
     bool load(QuickArchive& ar) override;
-    void reset() override;
     void finishClone();
     bool sameContent(const BlendTexture& o) const;
     void writeXml(AssetXmlWriter& writer, std::u16string url) override;
@@ -46,9 +43,9 @@ public:
 
     TexturePtr color_a;
     TexturePtr color_b;
-    float colorAMult;  // stored behind color_a, only while it is present
-    float colorBMult;
-    float blend_amount;
+    float colorAMult = 1.0f;  // stored behind color_a, only while it is present
+    float colorBMult = 1.0f;
+    float blend_amount = 0.5f;
 };
 
 // Inverts one texture.

@@ -66,16 +66,6 @@ Transform composeTransform(const TransformComponents& c) {
 
 // ---- GenChannelUVW -----------------------------------------------------------------
 
-void GenChannelUVW::reset() {
-    uvwTransform = Transform();
-    texTransform = Transform();
-    uvwComponents.setDefaults();
-    texComponents.setDefaults();
-    wrap_u = 0;
-    wrap_v = 0;
-    uvw_channel = 1;
-}
-
 bool GenChannelUVW::save(QuickArchive& ar) const {
     writeVersion(ar, 2);
     ar.writeTransform(uvwTransform);
@@ -140,12 +130,6 @@ std::u16string mappingTypeLabel(std::int32_t mappingType) {
     return kMappingTypeLabels[mappingType];
 }
 
-void GenEnvironmentUVW::reset() {
-    mapping_type = 2;
-    uvw_matrix = Matrix();
-    uvwComponents.setDefaults();
-}
-
 bool GenEnvironmentUVW::save(QuickArchive& ar) const {
     writeVersion(ar, 2);
     ar.writeMatrix(uvw_matrix);
@@ -185,11 +169,6 @@ void GenEnvironmentUVW::writeXml(AssetXmlWriter& w, std::u16string url) {
 }
 
 // ---- GenPlanarWorldUVW, GenObjectUVW ----------------------------------------------
-
-void GenPlacementUVW::reset() {
-    uvwTransform = Transform();
-    uvwComponents.setDefaults();
-}
 
 bool GenPlacementUVW::save(QuickArchive& ar) const {
     writeVersion(ar, 1);

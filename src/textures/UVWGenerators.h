@@ -1,5 +1,7 @@
 #pragma once
-// The UVW generators and the texture that shows one. A generator keeps each
+// The UVW generators and the texture that shows one. Their defaults are their
+// member initialisers; the records are written by hand, since old versions
+// hold parts of the components inside the record. A generator keeps each
 // placement twice: as a stored transform and as its components. The
 // components are the source; syncTransforms recomputes the transforms from
 // them before XML is written, so a transform read from a file never reaches
@@ -30,11 +32,8 @@ Transform composeTransform(const TransformComponents& c);
 // Channel mapping: a transform of the uvw channel and one of the texture.
 class GenChannelUVW : public FamilyOf<GenChannelUVW, 4, BaseUVW> {
 public:
-    GenChannelUVW() { reset(); }
-
     bool save(QuickArchive& ar) const override;
     bool load(QuickArchive& ar) override;
-    void reset() override;
     void syncTransforms() override;
     bool sameContent(const GenChannelUVW& o) const;
     void writeXml(AssetXmlWriter& writer, std::u16string url) override;
@@ -44,25 +43,22 @@ public:
     Transform texTransform;
     TransformComponents uvwComponents;
     TransformComponents texComponents;
-    std::int32_t wrap_u;
-    std::int32_t wrap_v;
-    std::int32_t uvw_channel;
+    std::int32_t wrap_u = 0;
+    std::int32_t wrap_v = 0;
+    std::int32_t uvw_channel = 1;
 };
 
 // Environment mapping; `mapping_type` indexes kMappingTypeLabels.
 class GenEnvironmentUVW : public FamilyOf<GenEnvironmentUVW, 3, BaseUVW> {
 public:
-    GenEnvironmentUVW() { reset(); }
-
     bool save(QuickArchive& ar) const override;
     bool load(QuickArchive& ar) override;
-    void reset() override;
     void syncTransforms() override;
     bool sameContent(const GenEnvironmentUVW& o) const;
     void writeXml(AssetXmlWriter& writer, std::u16string url) override;
     std::u16string getPluginName() const override { return u"UVWGenEnvironment"; }
 
-    std::int32_t mapping_type;
+    std::int32_t mapping_type = 2;
     Matrix uvw_matrix;
     TransformComponents uvwComponents;
 };
@@ -79,7 +75,6 @@ class GenPlacementUVW : public BaseUVW {
 public:
     bool save(QuickArchive& ar) const override;
     bool load(QuickArchive& ar) override;
-    void reset() override;
     void syncTransforms() override;
     bool sameContent(const GenPlacementUVW& o) const;
     void writeXml(AssetXmlWriter& writer, std::u16string url) override;
@@ -93,13 +88,11 @@ protected:
 
 class GenPlanarWorldUVW : public FamilyOf<GenPlanarWorldUVW, 0, GenPlacementUVW> {
 public:
-    GenPlanarWorldUVW() { GenPlacementUVW::reset(); }
     std::u16string getPluginName() const override { return u"UVWGenPlanarWorld"; }
 };
 
 class GenObjectUVW : public FamilyOf<GenObjectUVW, 1, GenPlacementUVW> {
 public:
-    GenObjectUVW() { GenPlacementUVW::reset(); }
     std::u16string getPluginName() const override { return u"UVWGenObject"; }
 };
 
