@@ -121,26 +121,6 @@ TEST(LightRecords, NewestVersionsGoBackByteForByte) {
     EXPECT_FALSE(dome.isEqual(createLight(7)));
 }
 
-TEST(LightRecords, RefusedRecords) {
-    std::vector<Newest> records = newest();
-    records.push_back({7, RecordBytes{savedBytes(SphereLight())}, ""});
-    for (const Newest& n : records) {
-        const std::uint32_t tag = std::uint32_t(n.bytes.data[2]) << 16;
-        for (std::uint32_t bad : {0u, tag | 1, tag + 0x10000})
-            EXPECT_FALSE(loads(*createLight(n.tag), n.bytes.with(0, bad))) << n.tag << " " << bad;
-        auto make = [&] { return createLight(n.tag); };
-        expectDamageHandled(loadedInto(make(), n.bytes), n.bytes, make);
-    }
-    DomeLight dome;
-    EXPECT_FALSE(loads(dome, RecordBytes()));
-    // Transform records that don't load: a direct light's whose tag is of a
-    // version 2, one that announces more keys than the archive holds, and a
-    // sun's of version 2.
-    EXPECT_FALSE(loads(MayaDirectLight(), cut(directV4(), 124, 4).u32(0x20000)));
-    EXPECT_FALSE(loads(MayaDirectLight(), cut(directV4(), 124, 4).u32(0x10000).u32(0x7FFFFFFF).u32(8)));
-    EXPECT_FALSE(loads(SunLight(), sunV4().with(sunV4().data.size() - 124, 0x20000)));
-}
-
 // Old records, read over a light that held the newest one, save as the newest
 // version with the defaults of the fields they lack; the golden list holds the
 // records saved.

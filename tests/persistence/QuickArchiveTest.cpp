@@ -6,7 +6,6 @@
 
 #include "persistence/QuickArchive.h"
 #include "persistence/Record.h"
-#include "persistence/Serializable.h"
 
 using namespace OrvaneLumoCore;
 
@@ -178,40 +177,6 @@ TEST(RecordHead, VersionTagsAndCounts) {
     std::uint64_t n = 0;
     EXPECT_TRUE(readCount(ar, n));   // 100 fits in the bytes of the block
     EXPECT_FALSE(readCount(ar, n));  // 5000 can't
-}
-
-// A member that nests itself as deep as the data says.
-struct Chain : OrvaneSerializable {
-    std::uint32_t getType() const { return 0; }
-    bool save(QuickArchive& ar) const override { return true; }
-    bool load(QuickArchive& ar) override {
-        bool more = false;
-        ar.readByte(more);
-        if (!more) return true;
-        return loadRequiredMember(ar, child, &make);
-    }
-    static boost::shared_ptr<Chain> make(std::int32_t tag) {
-        return tag == 0 ? boost::shared_ptr<Chain>(new Chain) : boost::shared_ptr<Chain>();
-    }
-    boost::shared_ptr<Chain> child;
-};
-
-TEST(RecordHead, NestingDeeperThanTheLimitFails) {
-    auto chain = [](int depth) {
-        QuickArchive ar(static_cast<std::size_t>(1));
-        for (int i = 0; i < depth; ++i) {
-            ar.writeByte(true);
-            ar.writeInt(0);
-        }
-        ar.writeByte(false);
-        return ar;
-    };
-    Chain shallow, deep;
-    QuickArchive ok = chain(kMaxNestingDepth);
-    QuickArchive bad = chain(100000);
-    EXPECT_TRUE(shallow.load(ok));
-    EXPECT_FALSE(deep.load(bad));
-    EXPECT_EQ(bad.nestingDepth, 0);
 }
 
 }  // namespace

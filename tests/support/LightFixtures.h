@@ -8,12 +8,6 @@ namespace lighttest {
 
 using namespace testsupport;
 
-// A transform whose twelve numbers are base, base + 1, ... base + 11.
-inline Transform countingTransform(float base) {
-    return Transform(Matrix(Vector(base, base + 1, base + 2), Vector(base + 3, base + 4, base + 5),
-                            Vector(base + 6, base + 7, base + 8)), Vector(base + 9, base + 10, base + 11));
-}
-
 // MayaDirectLight 4: color, shadowColor, shadowBias, intensity, storedFactor,
 // causticSubdivs, photonSubdivs, storedMode, enabled, shadows,
 // shadowSubdivs, shadowRadius, AnimatedTransform.
