@@ -26,6 +26,10 @@ bool kindOfPath(const std::u16string& path, FileKind& kind) {
     return false;
 }
 
+const char* statusWord(FileStatus status) {
+    if (status == FileStatus::Document) return "document";
+    return status == FileStatus::Text ? "text" : "unreadable";
+}
 
 namespace {
 

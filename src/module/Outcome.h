@@ -24,6 +24,10 @@ enum class FileStatus {
     Unreadable,  // not a regular file, or it can't be opened
 };
 
+// "document", "text" or "unreadable": the status as the command's report
+// and the Python module's outcome name it.
+const char* statusWord(FileStatus status);
+
 struct ConversionOutcome {
     FileStatus status = FileStatus::Unreadable;
     std::u16string text;        // what the module returns for the path

@@ -51,10 +51,10 @@ void Listing::record(const std::string& json) {
 void Listing::failed(const Job& job, FileStatus status, const std::string& reason) {
     const bool text = status == FileStatus::Text;
     tally_.count(status);
-    say(job, (text ? "text: " : "unreadable: ") + reason);
+    say(job, OrvaneLumoCore::statusWord(status) + (": " + reason));
     if (!text) Tally::unreadableFile(job.source, reason);
     record((job.hasKind ? jsonHead(job) : "{\"path\": " + jsonString(job.source) + ", \"kind\": null, ") +
-           "\"status\": \"" + (text ? "text" : "unreadable") + "\", \"reason\": " + jsonString(reason) + "}");
+           "\"status\": \"" + OrvaneLumoCore::statusWord(status) + "\", \"reason\": " + jsonString(reason) + "}");
 }
 
 void Listing::list(const Job& job) {

@@ -14,15 +14,6 @@ std::string jsonString(const std::string& bytes) { return OrvaneLumoCore::jsonTe
 
 namespace {
 
-const char* statusWord(FileStatus status) {
-    switch (status) {
-    case FileStatus::Document: return "document";
-    case FileStatus::Text: return "text";
-    case FileStatus::Unreadable: break;
-    }
-    return "unreadable";
-}
-
 // [{"from": stored, "to": written}, ...]
 std::string remappedJson(const FileResult& r) {
     std::string out = "[";
@@ -41,7 +32,7 @@ std::string jsonLine(const Job& job, const FileResult& r) {
     std::snprintf(ms, sizeof ms, "%.3f", r.milliseconds);
     return "{\"path\": " + jsonString(job.source) + ", \"kind\": " +
            (job.hasKind ? (job.kind == FileKind::Materials ? "\"materials\"" : "\"options\"") : "null") +
-           ", \"status\": \"" + (r.upToDate ? "up to date" : statusWord(r.status)) + "\", \"reason\": " +
+           ", \"status\": \"" + (r.upToDate ? "up to date" : OrvaneLumoCore::statusWord(r.status)) + "\", \"reason\": " +
            (reason.empty() ? std::string("null") : jsonString(reason)) +
            ", \"characters\": " + std::to_string(r.characters) + ", \"milliseconds\": " + ms +
            (job.xml && !job.xml->pathRules.empty() ? ", \"remapped\": " + remappedJson(r) : std::string()) + "}";

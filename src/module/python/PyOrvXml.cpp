@@ -218,15 +218,6 @@ PyStructSequence_Desc kOutcomeDesc = {
 
 PyTypeObject g_outcomeType;
 
-const char* statusName(OrvaneLumoCore::FileStatus status) {
-    switch (status) {
-    case OrvaneLumoCore::FileStatus::Document: return "document";
-    case OrvaneLumoCore::FileStatus::Text: return "text";
-    case OrvaneLumoCore::FileStatus::Unreadable: break;
-    }
-    return "unreadable";
-}
-
 PyObject* none() {
     Py_INCREF(Py_None);
     return Py_None;
@@ -271,7 +262,7 @@ PyObject* getXmlWithOutcome(PyObject*, PyObject* args, PyObject* keywords) {
         PyObject* result = PyStructSequence_New(&g_outcomeType);
         if (result == NULL) return NULL;
         if (!setItem(result, 0, sink.release()) ||
-            !setItem(result, 1, text(statusName(outcome.status))) ||
+            !setItem(result, 1, text(OrvaneLumoCore::statusWord(outcome.status))) ||
             !setItem(result, 2, document ? none() : text(reason)) ||
             !setItem(result, 3, text(kind == FileKind::Materials ? "materials" : "options")) ||
             !setItem(result, 4, number(outcome.items))) {
