@@ -40,8 +40,9 @@ public:
     void writeXml(AssetXmlWriter& w, std::u16string url) override {
         const Derived& light = this->self();
         const std::u16string plugin = light.getPluginName();
+        static const ShownRows<Derived> shown = shownRows<Derived>(Derived::record());
         writeLightAsset(w, url + u"/" + plugin, plugin, [&] {
-            writeShownFields(w, light, Derived::record());
+            writeShownFields(w, light, shown, [](const RecordRow<Derived>&) {});
             light.writeConstantParams(w);
         });
     }

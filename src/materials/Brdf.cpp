@@ -332,14 +332,15 @@ void LayerRecordOf<T>::writeXml(AssetXmlWriter& writer, std::u16string url) {
     url += u'/';
     url += layer.name;
     const std::u16string slotPrefix = url + u'/';
+    static const ShownRows<T> shown = shownRows<T>(table.rows);
     // The textures' Assets first, in the order of the parameters that refer to them.
-    forEachShown<T>(table.rows, [&](const RecordRow<T>& row) {
-        if (!isTextureRow(row, table.newest)) return;
-        const TexturePtr& texture = row.field.template get<TexturePtr>(layer);
-        if (texture) texture->writeXml(writer, slotPrefix + row.xml.slot);
-    });
+    for (const RecordRow<T>* row : shown) {
+        if (!isTextureRow(*row, table.newest)) continue;
+        const TexturePtr& texture = row->field.template get<TexturePtr>(layer);
+        if (texture) texture->writeXml(writer, slotPrefix + row->xml.slot);
+    }
     openPluginAsset(writer, url, layer.getAssetType(), layer.getPluginName(), "");
-    writeShownFields(writer, layer, table.rows, [&](const RecordRow<T>& row) {
+    writeShownFields(writer, layer, shown, [&](const RecordRow<T>& row) {
         if (row.xml.form == kFromReflection) {
             writer.writeColor(row.xml.name, colorFromReflection(row.field.template get<Color>(layer)));
         } else {

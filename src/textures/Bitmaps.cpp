@@ -27,7 +27,8 @@ RowSpan<RecordRow<BitmapBuffer>> BitmapBuffer::record() { return rowSpan(kBuffer
 void BitmapBuffer::writeXml(AssetXmlWriter& w, std::u16string url) {
     TextureFrame frame(w, *this, url);
     frame.open();
-    writeShownFields(w, *this, kBufferRecord);
+    static const ShownRows<B> shown = shownRows<B>(kBufferRecord);
+    writeShownFields(w, *this, shown, [](const RecordRow<B>&) {});
     frame.close();
 }
 

@@ -14,13 +14,14 @@
 // among the parameters puts it. With these a texture whose record is flat
 // names each field and child once, in its table; rows that need code of
 // their own are hook rows with codes from kFirstClassCode on.
+#include <cstring>
 #include <string>
 #include <utility>
-#include <vector>
+
+#include <boost/container/small_vector.hpp>
 
 #include "persistence/FieldRows.h"
 #include "persistence/Record.h"
-#include "platform/Text.h"
 #include "textures/BaseTexture.h"
 #include "textures/BaseUVW.h"
 #include "textures/TableTextureOf.h"
@@ -114,33 +115,32 @@ void cloneTextureRows(C& copy, const Rows& rows) {
     }
 }
 
-// The Asset of a texture whose table names its parameters: a slot per child
-// in the order of the parameters that refer to them, then the parameters, a
-// child referred to from its slot. Hook rows that aren't children go to `hook(row)`.
-template <class C, class Rows, class Hook>
-void writeTextureRows(AssetXmlWriter& w, const C& obj, const std::u16string& url, const Rows& rows, Hook hook) {
+// The Asset of a texture whose table names its parameters, given the rows
+// that parameters show in their order (shownRows): a slot per child in that
+// order, then the parameters, a child referred to from its slot. Hook rows
+// that aren't children go to `hook(row)`.
+template <class C, class Hook>
+void writeTextureRows(AssetXmlWriter& w, const C& obj, const std::u16string& url, const ShownRows<C>& shown,
+                      Hook hook) {
     TextureFrame frame(w, obj, url);
-    std::vector<std::pair<const RecordRow<C>*, SlotRef>> slots;
-    forEachShown<C>(rows, [&](const RecordRow<C>& row) {
-        if (!isGeneratorChild(row) && !isTextureChild(row)) return;
-        const std::u16string word = row.xml.slot ? std::u16string(row.xml.slot)
-                                    : row.xml.name ? utf8ToWide(row.xml.name)
-                                                   : std::u16string();
-        slots.emplace_back(&row, isGeneratorChild(row) ? frame.slot(row.field.template get<UVWPtr>(obj), word.c_str())
-                                                       : frame.slot(row.field.template get<TexturePtr>(obj), word.c_str()));
-    });
+    // A table has a few children, so their slots stay on the stack.
+    boost::container::small_vector<std::pair<const RecordRow<C>*, SlotRef>, 4> slots;
+    for (const RecordRow<C>* row : shown) {
+        if (!isGeneratorChild(*row) && !isTextureChild(*row)) continue;
+        // A parameter name is ASCII, so it widens unit by unit.
+        const char* name = row->xml.name;
+        const std::u16string word = row->xml.slot ? std::u16string(row->xml.slot)
+                                                  : std::u16string(name, name + std::strlen(name));
+        slots.emplace_back(row, isGeneratorChild(*row) ? frame.slot(row->field.template get<UVWPtr>(obj), word.c_str())
+                                                       : frame.slot(row->field.template get<TexturePtr>(obj), word.c_str()));
+    }
     frame.open();
-    writeShownFields(w, obj, rows, [&](const RecordRow<C>& row) {
+    writeShownFields(w, obj, shown, [&](const RecordRow<C>& row) {
         for (const auto& slot : slots)
             if (slot.first == &row) return frame.writeRef(row.xml.name, slot.second);
         hook(row);
     });
     frame.close();
-}
-
-template <class C, class Rows>
-void writeTextureRows(AssetXmlWriter& w, const C& obj, const std::u16string& url, const Rows& rows) {
-    writeTextureRows(w, obj, url, rows, [](const RecordRow<C>&) {});
 }
 
 // ---- TableTextureOf ----
@@ -172,8 +172,8 @@ bool TableTextureOf<D, Tag>::sameContent(const D& o) const {
 template <class D, std::uint32_t Tag>
 void TableTextureOf<D, Tag>::writeXml(AssetXmlWriter& w, std::u16string url) {
     const D& texture = this->self();
-    writeTextureRows(w, texture, url, textureTable(texture).rows,
-                     [&](const RecordRow<D>& row) { texture.writeOwnForm(w, row); });
+    static const ShownRows<D> shown = shownRows<D>(textureTable(texture).rows);
+    writeTextureRows(w, texture, url, shown, [&](const RecordRow<D>& row) { texture.writeOwnForm(w, row); });
 }
 
 }  // namespace OrvaneLumoCore

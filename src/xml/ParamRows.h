@@ -8,6 +8,8 @@
 // narrowed), string, and a file name for a path. An integer field that holds
 // a flag is shown as a bool (`asFlag`). A block that shows fields of several
 // holders (C's member objects) reaches one of them with `fieldOf`.
+#include <vector>
+
 #include "persistence/FieldRows.h"
 #include "xml/AssetXmlWriter.h"
 
@@ -149,10 +151,34 @@ ParamRow<C> shownParam(const RecordRow<C>& row) {
 // table order.
 template <class C, class Rows, class Visit>
 void forEachShown(const Rows& rows, Visit visit) {
-    int places = 0;
-    for (const RecordRow<C>& row : rows)
-        if (row.xml.name && row.xml.at > places) places = row.xml.at;
-    // Tables are a few dozen rows, so a scan per place costs less than sorting.
+    // One pass sorts the placed rows by their places and keeps the others in
+    // table order; a table whose places don't fit or repeat one is walked
+    // once per place instead.
+    constexpr int kMax = 64;
+    const RecordRow<C>* byPlace[kMax + 1] = {};
+    const RecordRow<C>* unplaced[kMax];
+    int places = 0, others = 0;
+    bool direct = true;
+    for (const RecordRow<C>& row : rows) {
+        if (!row.xml.name) continue;
+        const int at = row.xml.at;
+        if (at == 0) {
+            if (others < kMax) unplaced[others] = &row;
+            ++others;
+            continue;
+        }
+        if (at > places) places = at;
+        if (at > kMax || byPlace[at])
+            direct = false;
+        else
+            byPlace[at] = &row;
+    }
+    if (direct && others <= kMax) {
+        for (int place = 1; place <= places; ++place)
+            if (byPlace[place]) visit(*byPlace[place]);
+        for (int k = 0; k < others; ++k) visit(*unplaced[k]);
+        return;
+    }
     for (int place = 1; place <= places; ++place)
         for (const RecordRow<C>& row : rows)
             if (row.xml.name && row.xml.at == place) visit(row);
@@ -160,17 +186,40 @@ void forEachShown(const Rows& rows, Visit visit) {
         if (row.xml.name && row.xml.at == 0) visit(row);
 }
 
+// The rows of a table that parameters show, in the order of forEachShown. A
+// class whose table never changes keeps them in a static, so that writing
+// walks no more than its parameters.
+template <class C>
+using ShownRows = std::vector<const RecordRow<C>*>;
+
+template <class C, class Rows>
+ShownRows<C> shownRows(const Rows& rows) {
+    ShownRows<C> shown;
+    forEachShown<C>(rows, [&](const RecordRow<C>& row) { shown.push_back(&row); });
+    return shown;
+}
+
+// Writes the parameter of one shown row. A child's row, a hook row and a
+// row shown in a form of the class's own go to `hook(row)`.
+template <class C, class Hook>
+void writeShownRow(AssetXmlWriter& w, const C& obj, const RecordRow<C>& row, Hook& hook) {
+    if (row.field.isChild() || row.use == RowUse::Hook || row.xml.form != 0)
+        hook(row);
+    else
+        writeParam(w, shownParam(row), obj);
+}
+
 // Writes the parameters that the rows of a record table show, in the order
-// of forEachShown. A child's row, a hook row and a row shown in a form of
-// the class's own go to `hook(row)`.
+// of forEachShown.
 template <class C, class Rows, class Hook>
 void writeShownFields(AssetXmlWriter& w, const C& obj, const Rows& rows, Hook hook) {
-    forEachShown<C>(rows, [&](const RecordRow<C>& row) {
-        if (row.field.isChild() || row.use == RowUse::Hook || row.xml.form != 0)
-            hook(row);
-        else
-            writeParam(w, shownParam(row), obj);
-    });
+    forEachShown<C>(rows, [&](const RecordRow<C>& row) { writeShownRow(w, obj, row, hook); });
+}
+
+// The same for rows already in their order.
+template <class C, class Hook>
+void writeShownFields(AssetXmlWriter& w, const C& obj, const ShownRows<C>& shown, Hook hook) {
+    for (const RecordRow<C>* row : shown) writeShownRow(w, obj, *row, hook);
 }
 
 template <class C, class Rows>
