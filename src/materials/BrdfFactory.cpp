@@ -4,15 +4,7 @@
 namespace OrvaneLumoCore {
 
 BrdfPtr createBrdf(std::uint32_t tag) {
-    switch (tag) {
-    case kGlassBrdf: return BrdfPtr(new Glass_BRDF);
-    case kDiffuseBrdf: return BrdfPtr(new Diffuse_BRDF);
-    case kBlinnBrdf: return BrdfPtr(new Blinn_BRDF);
-    case kPhongBrdf: return BrdfPtr(new Phong_BRDF);
-    case kMirrorBrdf: return BrdfPtr(new Mirror_BRDF);
-    case kLightBrdf: return BrdfPtr(new Light_BRDF);
-    default: return BrdfPtr();
-    }
+    return createByTag<Base_BRDF, Glass_BRDF, Diffuse_BRDF, Blinn_BRDF, Phong_BRDF, Mirror_BRDF, Light_BRDF>(tag);
 }
 
 }  // namespace OrvaneLumoCore

@@ -82,4 +82,13 @@ public:
     bool sameContent(const Derived& o) const { return fieldsEqual(this->self(), o, Derived::record()); }
 };
 
+// A family's factory: a new default object of the class among Classes whose
+// type tag is `tag`, or null for a tag that none of them has.
+template <class Root, class... Classes>
+boost::shared_ptr<Root> createByTag(std::int64_t tag) {
+    boost::shared_ptr<Root> made;
+    ((tag == static_cast<std::int64_t>(Classes::kType) ? (made = boost::make_shared<Classes>(), true) : false) || ...);
+    return made;
+}
+
 }  // namespace OrvaneLumoCore

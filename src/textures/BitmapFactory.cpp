@@ -3,11 +3,6 @@
 
 namespace OrvaneLumoCore {
 
-BitmapPtr createBitmap(std::int32_t tag) {
-    switch (tag) {
-        case 0: return BitmapPtr(new BitmapBuffer());
-        default: return BitmapPtr();
-    }
-}
+BitmapPtr createBitmap(std::int32_t tag) { return createByTag<BaseBitmap, BitmapBuffer>(tag); }
 
 }  // namespace OrvaneLumoCore

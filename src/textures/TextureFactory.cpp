@@ -18,23 +18,9 @@ std::u16string textureLabel(std::int32_t tag) {
 
 // Tags without a class, -1 among them, give a null pointer.
 TexturePtr createTexture(std::int32_t tag) {
-    switch (tag) {
-        case 0: return TexturePtr(new BitmapTexture());
-        case 1: return TexturePtr(new FresnelTexture());
-        case 2: return TexturePtr(new UVWTexture());
-        case 3: return TexturePtr(new NoiseTexture());
-        case 4: return TexturePtr(new CheckerTexture());
-        case 5: return TexturePtr(new AColorTexture());
-        case 6: return TexturePtr(new GridTexture());
-        case 7: return TexturePtr(new ClothTexture());
-        case 8: return TexturePtr(new BulgeTexture());
-        case 9: return TexturePtr(new InvertTexture());
-        case 10: return TexturePtr(new BlendTexture());
-        case 11: return TexturePtr(new RampTexture());
-        case 12: return TexturePtr(new SkyTexture());
-        case -1:
-        default: return TexturePtr();
-    }
+    return createByTag<BaseTexture, BitmapTexture, FresnelTexture, UVWTexture, NoiseTexture, CheckerTexture,
+                       AColorTexture, GridTexture, ClothTexture, BulgeTexture, InvertTexture, BlendTexture,
+                       RampTexture, SkyTexture>(tag);
 }
 
 }  // namespace OrvaneLumoCore
