@@ -179,8 +179,7 @@ bool SphereLight::save(QuickArchive& ar) const {
 }
 
 bool SphereLight::load(QuickArchive& ar) {
-    reset();
-    const int v = readVersion(ar, 1, 2);
+    const int v = resetAndReadVersion(*this, ar, 2);
     if (v < 0) return false;
     ar.readTransform(transform);
     ar.readColor(color);

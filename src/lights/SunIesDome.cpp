@@ -104,8 +104,7 @@ bool SunLight::save(QuickArchive& ar) const {
 }
 
 bool SunLight::load(QuickArchive& ar) {
-    reset();
-    const int v = readVersion(ar, 1, kSunNewest);
+    const int v = resetAndReadVersion(*this, ar, kSunNewest);
     if (v < 0) return false;
     if (v <= 3) {
         Transform t;
@@ -177,8 +176,7 @@ bool DomeLight::save(QuickArchive& ar) const {
 }
 
 bool DomeLight::load(QuickArchive& ar) {
-    reset();
-    return readVersion(ar, 1, 1) > 0;
+    return resetAndReadVersion(*this, ar, 1) > 0;
 }
 
 }  // namespace OrvaneLumoCore

@@ -20,31 +20,6 @@ std::vector<MaterialPtr> searchChildren(const MaterialPtr& material) {
 // hold a reference to itself; the search gives up below this depth.
 const int kMaxSearchDepth = 4 * kMaxNestingDepth;
 
-// A wrapping material whose settings the main Asset of its tree takes over.
-// Only the first of each type in the tree counts.
-struct FoldedWrapper {
-    std::uint32_t tag;
-    // Writes the Assets of the wrapper's present textures; `url` is the url
-    // of the main Asset.
-    void (*writeTextures)(AssetXmlWriter& writer, const BaseMaterial& wrapper,
-                          const std::u16string& url);
-    // Writes the wrapper's parameters into the main Asset.
-    void (*writeParameters)(AssetXmlWriter& writer, const BaseMaterial& wrapper,
-                            const std::u16string& url);
-};
-
-// In the order in which their textures and parameters go out.
-const std::vector<FoldedWrapper>& foldedWrappers() {
-    static const std::vector<FoldedWrapper> wrappers = {
-        {kMaterialBump, &writeFoldedTextures, &writeFoldedParameters},
-        {kMaterialDisplaced, &writeFoldedTextures, &writeFoldedParameters},
-        {kMaterialOverrideEnvironment, &writeFoldedTextures, &writeFoldedParameters},
-        {kMaterialObjectExclusion, &writeFoldedTextures, &writeFoldedParameters},
-        {kMaterialAlphaContribution, &writeFoldedTextures, &writeFoldedParameters},
-    };
-    return wrappers;
-}
-
 void findOfType(const MaterialPtr& material, std::uint32_t tag, int depth, std::vector<MaterialPtr>& found) {
     if (!material || depth > kMaxSearchDepth) return;
     if (material->getType() == tag) {

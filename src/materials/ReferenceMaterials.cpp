@@ -180,8 +180,7 @@ bool MaterialLinked::save(QuickArchive& ar) const {
 }
 
 bool MaterialLinked::load(QuickArchive& ar) {
-    reset();
-    if (readVersion(ar, 1, kLinkedVersion) < 0) return false;
+    if (resetAndReadVersion(*this, ar, kLinkedVersion) < 0) return false;
     return loadNested(ar, id) && loadBareMaterial(ar, linked_material) && BaseMaterial::load(ar);
 }
 

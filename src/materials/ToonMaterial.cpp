@@ -26,12 +26,14 @@ const ToonTexture kToonTextures[] = {
     {&Toon::lineWidthTex, u"width_tex", "lineWidthTex"},
 };
 
-struct ToonFloat {
-    float Toon::*field;
+// A number or a flag with its two words.
+template <class T>
+struct ToonValue {
+    T Toon::*field;
     const char* ownWord;
     const char* conversionWord;
 };
-const ToonFloat kToonFloats[] = {
+const ToonValue<float> kToonFloats[] = {
     {&Toon::lineColorTexMult, "color_tex_mult", "lineColorTexMult"},
     {&Toon::distort, "distort", "distort"},
     {&Toon::distortTexMult, "distort_tex_mult", "distortTexMult"},
@@ -46,12 +48,7 @@ const ToonFloat kToonFloats[] = {
     {&Toon::silhouetteMult, "silhouette_mult", "silhouetteMult"},
 };
 
-struct ToonBool {
-    bool Toon::*field;
-    const char* ownWord;
-    const char* conversionWord;
-};
-const ToonBool kToonBools[] = {
+const ToonValue<bool> kToonBools[] = {
     {&Toon::doSecondary, "do_secondary", "doSecondary"},
     {&Toon::divideByDist, "divide_by_distance", "divideByDist"},
     {&Toon::doSilhouetteMult, "do_silhouette_mult", "doSilhouetteMult"},
@@ -110,11 +107,11 @@ void MaterialToon::writeLineParameters(AssetXmlWriter& writer, const std::u16str
         writeTextureRef(writer, word, this->*t.field, childUrl(url, t.ownWord));
     }
     writer.writeColor(own ? "color" : "lineColor", lineColor);
-    for (const ToonFloat& f : kToonFloats) {
+    for (const ToonValue<float>& f : kToonFloats) {
         const char* word = own ? f.ownWord : f.conversionWord;
         if (word) writer.writeFloat(word, this->*f.field);
     }
-    for (const ToonBool& b : kToonBools) writer.writeBool(own ? b.ownWord : b.conversionWord, this->*b.field);
+    for (const ToonValue<bool>& b : kToonBools) writer.writeBool(own ? b.ownWord : b.conversionWord, this->*b.field);
 }
 
 void MaterialToon::writeXml(AssetXmlWriter& writer, std::u16string url) {

@@ -56,6 +56,23 @@ void exclusionParameters(AssetXmlWriter& w, const MaterialObjectExclusion& x, co
 }
 
 
+template <class M>
+void noTextures(AssetXmlWriter&, const M&, const std::u16string&) {}
+
+// The folded wrapper of class M with its two writers; the wrapper handed to
+// them is of class M, since it was found by M's tag.
+template <class M, void (*Textures)(AssetXmlWriter&, const M&, const std::u16string&),
+          void (*Parameters)(AssetXmlWriter&, const M&, const std::u16string&)>
+FoldedWrapper folded() {
+    return {M::kType,
+            [](AssetXmlWriter& w, const BaseMaterial& m, const std::u16string& url) {
+                Textures(w, static_cast<const M&>(m), url);
+            },
+            [](AssetXmlWriter& w, const BaseMaterial& m, const std::u16string& url) {
+                Parameters(w, static_cast<const M&>(m), url);
+            }};
+}
+
 // ---- two-child branch ----------------------------------------------------------------
 
 // What the top-level Asset of a two-child class shows beyond its children.
@@ -108,28 +125,15 @@ std::vector<MaterialPtr> wrapperSearchChildren(const BaseMaterial& m) {
     }
 }
 
-void writeFoldedTextures(AssetXmlWriter& writer, const BaseMaterial& wrapper, const std::u16string& url) {
-    if (const MaterialBump* bump = as<MaterialBump>(wrapper))
-        bumpTextures(writer, *bump, url);
-    else if (const MaterialDisplaced* displaced = as<MaterialDisplaced>(wrapper))
-        tableTextures(writer, *displaced, url);
-    else if (const MaterialOverrideEnvironment* env = as<MaterialOverrideEnvironment>(wrapper))
-        tableTextures(writer, *env, url);
-    else if (const MaterialAlphaContribution* alpha = as<MaterialAlphaContribution>(wrapper))
-        tableTextures(writer, *alpha, url);
-}
-
-void writeFoldedParameters(AssetXmlWriter& writer, const BaseMaterial& wrapper, const std::u16string& url) {
-    if (const MaterialBump* bump = as<MaterialBump>(wrapper))
-        bumpParameters(writer, *bump, url);
-    else if (const MaterialDisplaced* displaced = as<MaterialDisplaced>(wrapper))
-        displacedParameters(writer, *displaced, url);
-    else if (const MaterialOverrideEnvironment* env = as<MaterialOverrideEnvironment>(wrapper))
-        tableParameters(writer, *env, url);
-    else if (const MaterialObjectExclusion* exclusion = as<MaterialObjectExclusion>(wrapper))
-        exclusionParameters(writer, *exclusion, url);
-    else if (const MaterialAlphaContribution* alpha = as<MaterialAlphaContribution>(wrapper))
-        tableParameters(writer, *alpha, url);
+const std::vector<FoldedWrapper>& foldedWrappers() {
+    static const std::vector<FoldedWrapper> wrappers = {
+        folded<MaterialBump, bumpTextures, bumpParameters>(),
+        folded<MaterialDisplaced, tableTextures, displacedParameters>(),
+        folded<MaterialOverrideEnvironment, tableTextures, tableParameters>(),
+        folded<MaterialObjectExclusion, noTextures, exclusionParameters>(),
+        folded<MaterialAlphaContribution, tableTextures, tableParameters>(),
+    };
+    return wrappers;
 }
 
 void writeTwoChildAssets(AssetXmlWriter& writer, const MaterialPtr& material) {

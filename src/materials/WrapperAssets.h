@@ -7,6 +7,7 @@
 //   one flat main Asset;
 // - the top-level branches of the classes that keep a plugin of their own:
 //   angle blend and both two-sided classes (two children), and toon.
+#include <cstdint>
 #include <string>
 #include <vector>
 
@@ -22,12 +23,20 @@ namespace OrvaneLumoCore {
 // embedded copy. Empty for the classes that end the search.
 std::vector<MaterialPtr> wrapperSearchChildren(const BaseMaterial& material);
 
-// The Assets of a folded wrapper's present textures, each under the main
-// Asset's `url`, "/" and the slot word.
-void writeFoldedTextures(AssetXmlWriter& writer, const BaseMaterial& wrapper, const std::u16string& url);
+// A wrapping material whose settings the main Asset of its tree takes over.
+// Only the first of each type in the tree counts.
+struct FoldedWrapper {
+    std::uint32_t tag;
+    // Writes the Assets of the wrapper's present textures, each under the
+    // main Asset's `url`, "/" and the slot word.
+    void (*writeTextures)(AssetXmlWriter& writer, const BaseMaterial& wrapper, const std::u16string& url);
+    // Writes the wrapper's parameters into the main Asset whose url is `url`.
+    void (*writeParameters)(AssetXmlWriter& writer, const BaseMaterial& wrapper, const std::u16string& url);
+};
 
-// A folded wrapper's parameters in the main Asset whose url is `url`.
-void writeFoldedParameters(AssetXmlWriter& writer, const BaseMaterial& wrapper, const std::u16string& url);
+// The folded wrappers, in the order in which their textures and parameters
+// go out.
+const std::vector<FoldedWrapper>& foldedWrappers();
 
 // An angle blend or two-sided material at the top of a file: the flat Assets
 // of both children, then its own Asset, whose layout names its class.

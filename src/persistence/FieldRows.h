@@ -615,8 +615,7 @@ bool fieldsEqual(const C& x, const C& y, const Rows& rows, int version = -1) {
 // isn't listed.
 template <class C, class Rows>
 int loadFlatRecord(C& obj, QuickArchive& ar, const Rows& rows, int newest) {
-    obj.reset();
-    const int v = readVersion(ar, 1, newest);
+    const int v = resetAndReadVersion(obj, ar, newest);
     if (v < 0) return -1;
     readFields(ar, obj, rows, v);
     return v;

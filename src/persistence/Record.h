@@ -37,6 +37,14 @@ inline int readVersion(QuickArchive& ar, int minVersion, int maxVersion) {
     return v;
 }
 
+// The head of a record whose load starts afresh: resets `obj`, then reads a
+// version tag of 1 to `newest`. The version, or -1 for a refused tag.
+template <class T>
+int resetAndReadVersion(T& obj, QuickArchive& ar, int newest) {
+    obj.reset();
+    return readVersion(ar, 1, newest);
+}
+
 // ---- counts --------------------------------------------------------------------
 
 // Reads an element count with readLength. Every element takes at least one

@@ -67,8 +67,7 @@ bool BlendTexture::save(QuickArchive& ar) const {
 }
 
 bool BlendTexture::load(QuickArchive& ar) {
-    reset();
-    const int v = readVersion(ar, 1, 2);
+    const int v = resetAndReadVersion(*this, ar, 2);
     if (v < 0) return false;
     if (!loadOptionalMember(ar, color_a, createTexture)) return false;
     if (v >= 2 && color_a) ar.readFloat(colorAMult);

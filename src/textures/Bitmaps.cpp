@@ -52,8 +52,7 @@ bool BitmapTexture::save(QuickArchive& ar) const {
 }
 
 bool BitmapTexture::load(QuickArchive& ar) {
-    reset();
-    if (readVersion(ar, 1, 1) < 0) return false;
+    if (resetAndReadVersion(*this, ar, 1) < 0) return false;
     if (!loadPairedMembers(ar, uvw, createUVW, bitmap, createBitmap)) return false;
     ar.readByte(tile);
     return true;

@@ -48,8 +48,7 @@ bool SkyTexture::save(QuickArchive& ar) const {
 }
 
 bool SkyTexture::load(QuickArchive& ar) {
-    reset();
-    const int v = readVersion(ar, 1, kNewest);
+    const int v = resetAndReadVersion(*this, ar, kNewest);
     if (v < 0) return false;
     bool ownSun = false;
     ar.readByte(ownSun);

@@ -67,8 +67,7 @@ bool saveTextureChild(QuickArchive& ar, const C& obj, const RecordRow<C>& row) {
 // the version holds. False for a refused tag or a child that doesn't load.
 template <class C, class Rows>
 bool loadTextureRecord(C& obj, QuickArchive& ar, const Rows& rows, int newest) {
-    obj.reset();
-    const int v = readVersion(ar, 1, newest);
+    const int v = resetAndReadVersion(obj, ar, newest);
     if (v < 0) return false;
     return readFields(ar, obj, rows, v, [&](const RecordRow<C>& row) { return loadTextureChild(ar, obj, row); });
 }

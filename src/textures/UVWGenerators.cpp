@@ -77,8 +77,7 @@ bool GenChannelUVW::save(QuickArchive& ar) const {
 }
 
 bool GenChannelUVW::load(QuickArchive& ar) {
-    reset();
-    const int v = readVersion(ar, 1, 2);
+    const int v = resetAndReadVersion(*this, ar, 2);
     if (v < 0) return false;
     ar.readTransform(uvwTransform);
     ar.readTransform(texTransform);
@@ -138,8 +137,7 @@ bool GenEnvironmentUVW::save(QuickArchive& ar) const {
 }
 
 bool GenEnvironmentUVW::load(QuickArchive& ar) {
-    reset();
-    const int v = readVersion(ar, 1, 2);
+    const int v = resetAndReadVersion(*this, ar, 2);
     if (v < 0) return false;
     ar.readMatrix(uvw_matrix);
     ar.readInt(mapping_type);
@@ -177,8 +175,7 @@ bool GenPlacementUVW::save(QuickArchive& ar) const {
 }
 
 bool GenPlacementUVW::load(QuickArchive& ar) {
-    reset();
-    if (readVersion(ar, 1, 1) < 0) return false;
+    if (resetAndReadVersion(*this, ar, 1) < 0) return false;
     ar.readTransform(uvwTransform);
     return loadNested(ar, uvwComponents);
 }
