@@ -7,82 +7,36 @@
 
 namespace OrvaneLumoCore {
 
-namespace {
-
-// The line parameters in the order of both XML forms, with the word of the
-// material's own writeXml and the word of the conversion. A row without a
-// conversion word is left out there.
 typedef MaterialToon Toon;
-
-struct ToonTexture {
-    TexturePtr Toon::*field;
-    const char16_t* ownWord;  // also the slot word in both forms
-    const char* conversionWord;
-};
-const ToonTexture kToonTextures[] = {
-    {&Toon::lineColorTex, u"color_tex", "lineColorTex"},
-    {&Toon::distortTex, u"distort_tex", "distortTex"},
-    {&Toon::opacityTex, u"opacity_tex", "opacityTex"},
-    {&Toon::lineWidthTex, u"width_tex", "lineWidthTex"},
-};
-
-// A number or a flag with its two words.
-template <class T>
-struct ToonValue {
-    T Toon::*field;
-    const char* ownWord;
-    const char* conversionWord;
-};
-const ToonValue<float> kToonFloats[] = {
-    {&Toon::lineColorTexMult, "color_tex_mult", "lineColorTexMult"},
-    {&Toon::distort, "distort", "distort"},
-    {&Toon::distortTexMult, "distort_tex_mult", "distortTexMult"},
-    {&Toon::opacity, "opacity", "opacity"},
-    {&Toon::opacityTexMult, "opacity_tex_mult", "opacityTexMult"},
-    {&Toon::lineWidth, "width", "lineWidth"},
-    {&Toon::lineWidthTexMult, "width_tex_mult", "lineWidthTexMult"},
-    {&Toon::zThreshold, "z_threshold", "zThreshold"},
-    {&Toon::traceBias, "trace_bias", "traceBias"},
-    {&Toon::normalThreshold, "normal_threshold", "normalThreshold"},
-    {&Toon::lineUnits, "line_units", nullptr},
-    {&Toon::silhouetteMult, "silhouette_mult", "silhouetteMult"},
-};
-
-const ToonValue<bool> kToonBools[] = {
-    {&Toon::doSecondary, "do_secondary", "doSecondary"},
-    {&Toon::divideByDist, "divide_by_distance", "divideByDist"},
-    {&Toon::doSilhouetteMult, "do_silhouette_mult", "doSilhouetteMult"},
-};
-
-}  // namespace
-
 typedef RowsOf<Toon> ToonRow;
 
 // Version 1 ends behind the base record; version 2 adds doSilhouetteMult
-// and silhouetteMult.
+// and silhouetteMult. Each row names the field's parameter in the material's
+// own XML (a texture's slot word too) and its place there, and the word of
+// the conversion (alsoAs), which has none for lineUnits.
 const RecordRow<Toon> kToonRecord[] = {
     &Toon::base_mtl,
-    ToonRow::f32(&Toon::lineWidth, 1.5, 1),
-    ToonRow::f32(&Toon::lineWidthTexMult, 1, 1),
-    &Toon::lineWidthTex,
-    ToonRow::f32(&Toon::opacity, 1, 1),
-    ToonRow::f32(&Toon::opacityTexMult, 1, 1),
-    &Toon::opacityTex,
-    ToonRow::f32(&Toon::distort, 0, 1),
-    ToonRow::f32(&Toon::distortTexMult, 1, 1),
-    &Toon::distortTex,
-    ToonRow::color(&Toon::lineColor, Color(0, 0, 0), 1),
-    ToonRow::f32(&Toon::lineColorTexMult, 1, 1),
-    &Toon::lineColorTex,
-    ToonRow::f32(&Toon::zThreshold, 0.95, 1),
-    ToonRow::f32(&Toon::traceBias, 0.02, 1),
-    ToonRow::f32(&Toon::normalThreshold, 0.7, 1),
-    ToonRow::f32(&Toon::lineUnits, 1, 1),
-    ToonRow::b8(&Toon::doSecondary, true, 1),
-    ToonRow::b8(&Toon::divideByDist, false, 1),
+    ToonRow::f32(&Toon::lineWidth, 1.5, 1).shownAs("width", 11).alsoAs("lineWidth"),
+    ToonRow::f32(&Toon::lineWidthTexMult, 1, 1).shownAs("width_tex_mult", 12).alsoAs("lineWidthTexMult"),
+    RecordRow<Toon>(&Toon::lineWidthTex, "width_tex", 4).alsoAs("lineWidthTex"),
+    ToonRow::f32(&Toon::opacity, 1, 1).shownAs("opacity", 9).alsoAs("opacity"),
+    ToonRow::f32(&Toon::opacityTexMult, 1, 1).shownAs("opacity_tex_mult", 10).alsoAs("opacityTexMult"),
+    RecordRow<Toon>(&Toon::opacityTex, "opacity_tex", 3).alsoAs("opacityTex"),
+    ToonRow::f32(&Toon::distort, 0, 1).shownAs("distort", 7).alsoAs("distort"),
+    ToonRow::f32(&Toon::distortTexMult, 1, 1).shownAs("distort_tex_mult", 8).alsoAs("distortTexMult"),
+    RecordRow<Toon>(&Toon::distortTex, "distort_tex", 2).alsoAs("distortTex"),
+    ToonRow::color(&Toon::lineColor, Color(0, 0, 0), 1).shownAs("color", 5).alsoAs("lineColor"),
+    ToonRow::f32(&Toon::lineColorTexMult, 1, 1).shownAs("color_tex_mult", 6).alsoAs("lineColorTexMult"),
+    RecordRow<Toon>(&Toon::lineColorTex, "color_tex", 1).alsoAs("lineColorTex"),
+    ToonRow::f32(&Toon::zThreshold, 0.95, 1).shownAs("z_threshold", 13).alsoAs("zThreshold"),
+    ToonRow::f32(&Toon::traceBias, 0.02, 1).shownAs("trace_bias", 14).alsoAs("traceBias"),
+    ToonRow::f32(&Toon::normalThreshold, 0.7, 1).shownAs("normal_threshold", 15).alsoAs("normalThreshold"),
+    ToonRow::f32(&Toon::lineUnits, 1, 1).shownAs("line_units", 16),
+    ToonRow::b8(&Toon::doSecondary, true, 1).shownAs("do_secondary", 18).alsoAs("doSecondary"),
+    ToonRow::b8(&Toon::divideByDist, false, 1).shownAs("divide_by_distance", 19).alsoAs("divideByDist"),
     kBaseRecord,
-    ToonRow::b8(&Toon::doSilhouetteMult, false, 2),
-    ToonRow::f32(&Toon::silhouetteMult, 1.5, 2),
+    ToonRow::b8(&Toon::doSilhouetteMult, false, 2).shownAs("do_silhouette_mult", 20).alsoAs("doSilhouetteMult"),
+    ToonRow::f32(&Toon::silhouetteMult, 1.5, 2).shownAs("silhouette_mult", 17).alsoAs("silhouetteMult"),
 };
 
 MaterialToon::MaterialToon() { MaterialToon::reset(); }
@@ -91,27 +45,30 @@ RowSpan<RecordRow<MaterialToon>> MaterialToon::record() { return rowSpan(kToonRe
 
 void MaterialToon::copyChildren(bool newName) {
     base_mtl = copyChild(base_mtl, true);
-    for (const ToonTexture& t : kToonTextures) this->*t.field = cloneChild(this->*t.field);
+    for (const RecordRow<Toon>& row : kToonRecord) {
+        if (row.field.kind() != FieldRef<Toon>::Kind::Texture) continue;
+        TexturePtr& texture = row.field.get<TexturePtr>(*this);
+        texture = cloneChild(texture);
+    }
 }
 
 void MaterialToon::writeTextureAssets(AssetXmlWriter& writer, const std::u16string& url) const {
-    for (const ToonTexture& t : kToonTextures)
-        OrvaneLumoCore::writeTextureAssets(writer, this->*t.field, childUrl(url, t.ownWord));
+    writeTextureRowAssets(writer, *this, kToonRecord, url);
 }
 
 void MaterialToon::writeLineParameters(AssetXmlWriter& writer, const std::u16string& url,
                                        Words words) const {
-    const bool own = words == Words::Own;
-    for (const ToonTexture& t : kToonTextures) {
-        const WriterText word = own ? WriterText(t.ownWord) : WriterText(t.conversionWord);
-        writeTextureRef(writer, word, this->*t.field, childUrl(url, t.ownWord));
-    }
-    writer.writeColor(own ? "color" : "lineColor", lineColor);
-    for (const ToonValue<float>& f : kToonFloats) {
-        const char* word = own ? f.ownWord : f.conversionWord;
-        if (word) writer.writeFloat(word, this->*f.field);
-    }
-    for (const ToonValue<bool>& b : kToonBools) writer.writeBool(own ? b.ownWord : b.conversionWord, this->*b.field);
+    forEachShown<Toon>(kToonRecord, [&](const RecordRow<Toon>& row) {
+        const char* name = words == Words::Own ? row.xml.name : row.xml.otherName;
+        if (!name) return;
+        if (row.field.kind() == FieldRef<Toon>::Kind::Texture) {
+            writeTextureRef(writer, name, row.field.get<TexturePtr>(*this), slotUrlOf(url, row));
+        } else {
+            ParamRow<Toon> param = shownParam(row);
+            param.name = name;
+            writeParam(writer, param, *this);
+        }
+    });
 }
 
 void MaterialToon::writeXml(AssetXmlWriter& writer, std::u16string url) {

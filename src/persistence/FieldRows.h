@@ -345,6 +345,9 @@ struct RowXml {
     bool asFlag = false;          // an integer shown as a bool: any value but 0 is 1
     const char16_t* slot = nullptr;  // a child's url word
     int form = 0;  // nonzero: a form of the class's own, written by its hook
+    // The parameter's name in the class's second XML form, where it has one
+    // (none: the second form leaves the field out).
+    const char* otherName = nullptr;
 };
 
 // The code number of a hook row that has no field, for tables written as
@@ -412,6 +415,7 @@ struct RecordRow {
     }
     constexpr RecordRow asFlag() const { return withXml(&RowXml::asFlag, true); }
     constexpr RecordRow slot(const char16_t* word) const { return withXml(&RowXml::slot, word); }
+    constexpr RecordRow alsoAs(const char* name) const { return withXml(&RowXml::otherName, name); }
     // The field shown as parameter `name`, at place `at` (0: table order).
     constexpr RecordRow shownAs(const char* name, int at = 0) const {
         return withXml(&RowXml::name, name).withXml(&RowXml::at, at);
