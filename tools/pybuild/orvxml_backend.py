@@ -145,8 +145,10 @@ def build(folder, log):
     major = 'python%d' % sys.version_info[0]
     include = sysconfig.get_paths()['include']
     # The build type of the tested build folder, so the code is the same; the
-    # debug information is stripped when linking.
+    # debug information is stripped when linking. A unity build, as the
+    # Windows and sanitizer builds: it compiles in about half the time.
     configure = ['cmake', '-S', ROOT, '-B', folder, '-DCMAKE_BUILD_TYPE=RelWithDebInfo',
+                 '-DCMAKE_UNITY_BUILD=ON',
                  '-DCMAKE_MODULE_LINKER_FLAGS=-s', '-DCMAKE_EXE_LINKER_FLAGS=-s',
                  '-DORVXML_BUILD_TESTS=OFF', '-DORVXML_BUILD_BENCH=OFF']
     if sys.version_info[0] >= 3:
