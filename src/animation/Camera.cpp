@@ -28,36 +28,38 @@ void readKeyAtZero(QuickArchive& ar, AnimatedReal& value) {
     value.setValue(atZero, 0.0);
 }
 
-// The record, version 2, with the defaults. A bool is stored as a bool32.
+// The record, version 2, with the defaults, and the parameters that show the
+// fields with their places (in the options document). A bool is stored as a
+// bool32.
 const RecordRow<C> kPhysicalCameraRows[] = {
-    CR::i32(&C::type, 0, 1),
-    CR::f32(&C::film_width, 36, 1),
-    CR::hook(kFocalLength, 1, {}, 40),
-    CR::f32(&C::zoom_factor, 1, 1),
-    CR::f32(&C::distortion, 0, 1),
-    CR::f32(&C::f_number, 8, 1),
-    CR::f32(&C::lens_shift, 0, 1),
-    CR::f32(&C::shutter_speed, 30, 1),
-    CR::f32(&C::shutter_angle, 180, 1),
-    CR::f32(&C::shutter_offset, 0, 1),
-    CR::f32(&C::latency, 0, 1),
-    CR::f32(&C::ISO, 200, 1),
-    CR::b32(&C::specify_focus, false, 1),
-    CR::hook(kFocusDistance, 1, {}, 200),
-    CR::b32(&C::targeted, false, 1),
-    CR::f32(&C::target_distance, 200, 1),
-    CR::f32(&C::dof_display_threshold, 0, 1),
-    CR::b32(&C::exposure, true, 1),
-    CR::color(&C::white_balance, Color(1, 1, 1), 1),
-    CR::b32(&C::vignetting, true, 1),
-    CR::b32(&C::blades_enable, false, 1),
-    CR::i32(&C::blades_num, 5, 1),
-    CR::f32(&C::blades_rotation, 0, 1),
-    CR::f32(&C::center_bias, 0, 1),
-    CR::f32(&C::anisotropy, 0, 1),
-    CR::b32(&C::use_dof, false, 1),
-    CR::b32(&C::use_moblur, false, 1),
-    CR::i32(&C::subdivs, 6, 1),
+    CR::i32(&C::type, 0, 1).shownAs("type", 2),
+    CR::f32(&C::film_width, 36, 1).shownAs("film_width", 3),
+    CR::hook(kFocalLength, 1, {}, 40).shownAs("focal_length", 4),
+    CR::f32(&C::zoom_factor, 1, 1).shownAs("zoom_factor", 5),
+    CR::f32(&C::distortion, 0, 1).shownAs("distortion", 6),
+    CR::f32(&C::f_number, 8, 1).shownAs("f_number", 7),
+    CR::f32(&C::lens_shift, 0, 1).shownAs("lens_shift", 8),
+    CR::f32(&C::shutter_speed, 30, 1).shownAs("shutter_speed", 9),
+    CR::f32(&C::shutter_angle, 180, 1).shownAs("shutter_angle", 10),
+    CR::f32(&C::shutter_offset, 0, 1).shownAs("shutter_offset", 11),
+    CR::f32(&C::latency, 0, 1).shownAs("latency", 12),
+    CR::f32(&C::ISO, 200, 1).shownAs("ISO", 13),
+    CR::b32(&C::specify_focus, false, 1).shownAs("specify_focus", 14),
+    CR::hook(kFocusDistance, 1, {}, 200).shownAs("focus_distance", 15),
+    CR::b32(&C::targeted, false, 1).shownAs("targeted", 16),
+    CR::f32(&C::target_distance, 200, 1).shownAs("target_distance", 17),
+    CR::f32(&C::dof_display_threshold, 0, 1).shownAs("dof_display_threshold", 18),
+    CR::b32(&C::exposure, true, 1).shownAs("exposure", 19),
+    CR::color(&C::white_balance, Color(1, 1, 1), 1).shownAs("white_balance", 20),
+    CR::b32(&C::vignetting, true, 1).shownAs("vignetting", 21),
+    CR::b32(&C::blades_enable, false, 1).shownAs("blades_enable", 22),
+    CR::i32(&C::blades_num, 5, 1).shownAs("blades_num", 23),
+    CR::f32(&C::blades_rotation, 0, 1).shownAs("blades_rotation", 24),
+    CR::f32(&C::center_bias, 0, 1).shownAs("center_bias", 25),
+    CR::f32(&C::anisotropy, 0, 1).shownAs("anisotropy", 26),
+    CR::b32(&C::use_dof, false, 1).shownAs("use_dof", 27),
+    CR::b32(&C::use_moblur, false, 1).shownAs("use_moblur", 28),
+    CR::i32(&C::subdivs, 6, 1).shownAs("subdivs", 29),
 };
 
 }  // namespace
@@ -65,6 +67,10 @@ const RecordRow<C> kPhysicalCameraRows[] = {
 // ---- PhysicalCamera ------------------------------------------------------------
 
 PhysicalCamera::PhysicalCamera() : focal_length(true), focus_distance(true) { reset(); }
+
+RowSpan<RecordRow<C>> PhysicalCamera::record() { return rowSpan(kPhysicalCameraRows); }
+
+const AnimatedReal& PhysicalCamera::animated(const RecordRow<C>& row) const { return this->*animatedField(row); }
 
 boost::shared_ptr<BaseCamera> PhysicalCamera::clone() const {
     return boost::make_shared<PhysicalCamera>(*this);

@@ -8,6 +8,7 @@
 
 #include "animation/Animated.h"
 #include "animation/BaseCamera.h"
+#include "persistence/FieldRows.h"
 #include "persistence/Serializable.h"
 #include "values/Types.h"
 
@@ -31,6 +32,11 @@ public:
     void writeXml(AssetXmlWriter&, std::u16string) override {}
     std::u16string getPluginName() const override { return u"CameraPhysical"; }
     std::u16string getAssetType() const override { return u"settings"; }
+
+    // The record's table. Its shown rows are the parameters of the options
+    // document's CameraPhysical block; a hook row stands for an animated value.
+    static RowSpan<RecordRow<PhysicalCamera>> record();
+    const AnimatedReal& animated(const RecordRow<PhysicalCamera>& row) const;
 
     bool operator==(const PhysicalCamera& o) const;
     bool operator!=(const PhysicalCamera& o) const { return !(*this == o); }

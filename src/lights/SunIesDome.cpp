@@ -10,39 +10,31 @@ namespace OrvaneLumoCore {
 
 namespace {
 
+// The settings that the sun and the sky hold, with the parameters that
+// show them in the sun's XML and their places there.
 const RecordRow<SunSettings> kSunSettingsRecord[] = {
-    {&SunSettings::up_vector},
-    {&SunSettings::shadowBias},
-    {&SunSettings::turbidity},
-    {&SunSettings::water_vapour},
-    {&SunSettings::intensity_multiplier},
-    {&SunSettings::size_multiplier},
-    {&SunSettings::photon_radius},
-    {&SunSettings::photon_emit_distance},
-    {&SunSettings::ozone},
-    {&SunSettings::photonSubdivs},
-    {&SunSettings::causticSubdivs},
-    {&SunSettings::shadow_subdivs},
-    {&SunSettings::shadows},
+    {&SunSettings::up_vector, "up_vector", 1},
+    {&SunSettings::shadowBias, "shadowBias", 2},
+    {&SunSettings::turbidity, "turbidity", 3},
+    {&SunSettings::water_vapour, "water_vapour", 4},
+    {&SunSettings::intensity_multiplier, "intensity_multiplier", 5},
+    {&SunSettings::size_multiplier, "size_multiplier", 6},
+    {&SunSettings::photon_radius, "photon_radius", 7},
+    {&SunSettings::photon_emit_distance, "photon_emit_distance", 8},
+    {&SunSettings::ozone, "ozone", 9},
+    {&SunSettings::photonSubdivs, "photonSubdivs", 10},
+    {&SunSettings::causticSubdivs, "causticSubdivs", 11},
+    {&SunSettings::shadow_subdivs, "shadow_subdivs", 12},
+    {&SunSettings::shadows, "shadows", 14},
 };
 
-// Followed by "transform", the value at time 0.
-const ParamRow<SunLight> kSunParams[] = {
-    {"up_vector", &SunLight::up_vector},
-    {"shadowBias", &SunLight::shadowBias},
-    {"turbidity", &SunLight::turbidity},
-    {"water_vapour", &SunLight::water_vapour},
-    {"intensity_multiplier", &SunLight::intensity_multiplier},
-    {"size_multiplier", &SunLight::size_multiplier},
-    {"photon_radius", &SunLight::photon_radius},
-    {"photon_emit_distance", &SunLight::photon_emit_distance},
-    {"ozone", &SunLight::ozone},
-    {"photonSubdivs", &SunLight::photonSubdivs},
-    {"causticSubdivs", &SunLight::causticSubdivs},
-    {"shadow_subdivs", &SunLight::shadow_subdivs},
-    {"enabled", &SunLight::enabled},
-    {"shadows", &SunLight::shadows},
-    {"invisible", &SunLight::invisible},
+// The sun's fields behind its settings; its XML shows two of them among the
+// settings' parameters and the transform last.
+const RecordRow<SunLight> kSunRecord[] = {
+    {&SunLight::id, 2},
+    {&SunLight::name, 2},
+    {&SunLight::enabled, 3, "enabled", 13},
+    {&SunLight::invisible, 3, "invisible", 15},
 };
 
 // The fields in record order, with the versions that hold them, the XML
@@ -92,14 +84,12 @@ SunLight::SunLight(const std::u16string& name_, const std::u16string& id_) : Sun
 }
 
 // Version 4: settings, id, name, enabled, invisible, then the transform.
-// Up to version 3 the transform stood first, as a plain transform.
+// Up to version 3 the transform stood first, as a plain transform: the
+// record branches on it, so the transform is read and written by hand.
 bool SunLight::save(QuickArchive& ar) const {
     writeVersion(ar, kSunNewest);
     writeSunSettings(ar, *this);
-    ar.writeWString(id);
-    ar.writeWString(name);
-    ar.writeByte(enabled);
-    ar.writeByte(invisible);
+    writeFields(ar, *this, kSunRecord, kSunNewest);
     return transform.save(ar);
 }
 
@@ -113,14 +103,7 @@ bool SunLight::load(QuickArchive& ar) {
     }
     readSunSettings(ar, *this);
     // Version 1 keeps the new id of reset and an empty name.
-    if (v >= 2) {
-        ar.readWString(id);
-        ar.readWString(name);
-    }
-    if (v >= 3) {
-        ar.readByte(enabled);
-        ar.readByte(invisible);
-    }
+    readFields(ar, *this, kSunRecord, v);
     if (v >= 4) return loadNested(ar, transform);
     return true;
 }
@@ -130,8 +113,7 @@ void SunLight::finishClone() {
 }
 
 bool SunLight::sameContent(const SunLight& o) const {
-    return id == o.id && name == o.name && transform == o.transform &&
-           sunSettingsEqual(*this, o) && enabled == o.enabled && invisible == o.invisible;
+    return fieldsEqual(*this, o, kSunRecord) && transform == o.transform && sunSettingsEqual(*this, o);
 }
 
 void SunLight::writeXml(AssetXmlWriter& writer, std::u16string url) {
@@ -143,7 +125,8 @@ void SunLight::writeXml(AssetXmlWriter& writer, std::u16string url) {
     }
     writer.sunRegistry[id] = url;
     writeLightAsset(writer, url, getPluginName(), [&] {
-        writeParams(writer, *this, kSunParams);
+        writeShownFieldsWithPart(writer, *this, kSunRecord, static_cast<const SunSettings&>(*this),
+                                 kSunSettingsRecord);
         writer.writeTransform("transform", transform.getValue(0.0));
     });
 }

@@ -10,6 +10,7 @@
 #include "animation/Camera.h"
 #include "options/OptionRecords.h"
 #include "options/OrvaneOptionsBase.h"
+#include "persistence/FieldRows.h"
 #include "textures/BaseTexture.h"
 #include "values/Types.h"
 
@@ -36,6 +37,8 @@ public:
     void writeXml(AssetXmlWriter& writer, std::u16string url) override;
     // How many settings blocks writeXml writes: every one, always.
     static std::size_t documentBlockCount();
+    // The record's table; its rows name the blocks and parameters that show them.
+    static RowSpan<RecordRow<AllOptions>> record();
     std::u16string getPluginName() const override { return u"AllOptions"; }
 
     // Name of a render channel number (100 to 133), or null for another number.

@@ -7,6 +7,7 @@
 
 #include "options/LumoOptions.h"
 #include "options/OrvaneOptionsBase.h"
+#include "persistence/FieldRows.h"
 
 namespace OrvaneLumoCore {
 
@@ -19,6 +20,8 @@ public:
     bool save(QuickArchive& ar) const override;
     bool load(QuickArchive& ar) override;
     void reset() override;
+    // The table; rows that the options document shows name their block.
+    static RowSpan<RecordRow<Fields>> record();
 };
 
 extern template class TableOptions<LumoUtils::LumoParams>;

@@ -332,6 +332,7 @@ enum class RowUse : std::uint8_t {
     Forced,   // the field, read and then set to the default: it is the default after any load
     Hook,     // the class's own code, given `hook`; the field, if any, is the hook's
     Shown,    // no bytes: the field once more in the XML, under another name
+    Unstored, // no bytes: a field that no record version holds, with its default
 };
 
 // How a row's field is shown in the XML. A row without a name isn't shown.
@@ -348,6 +349,9 @@ struct RowXml {
     // The parameter's name in the class's second XML form, where it has one
     // (none: the second form leaves the field out).
     const char* otherName = nullptr;
+    // The block of a document written as several Assets that shows the
+    // parameter; 0: the class's own Asset.
+    int group = 0;
 };
 
 // The code number of a hook row that has no field, for tables written as
@@ -414,11 +418,16 @@ struct RecordRow {
         return withXml(&RowXml::label, text).withXml(&RowXml::userData, userData);
     }
     constexpr RecordRow asFlag() const { return withXml(&RowXml::asFlag, true); }
+    constexpr RecordRow userData() const { return withXml(&RowXml::userData, true); }
     constexpr RecordRow slot(const char16_t* word) const { return withXml(&RowXml::slot, word); }
     constexpr RecordRow alsoAs(const char* name) const { return withXml(&RowXml::otherName, name); }
     // The field shown as parameter `name`, at place `at` (0: table order).
     constexpr RecordRow shownAs(const char* name, int at = 0) const {
         return withXml(&RowXml::name, name).withXml(&RowXml::at, at);
+    }
+    // The field shown as parameter `name` at place `at` of a document's block `group`.
+    constexpr RecordRow shownIn(int group, const char* name, int at) const {
+        return shownAs(name, at).withXml(&RowXml::group, group);
     }
     // The field's default, for tables that give their class its defaults.
     constexpr RecordRow byDefault(double value) const { return with(&RecordRow::number, value); }
@@ -439,7 +448,9 @@ struct RecordRow {
     RowXml xml;
 
     bool inVersion(int version) const { return version >= since && version <= until; }
-    bool hasBytes() const { return use != RowUse::Shown; }
+    bool hasBytes() const { return use != RowUse::Shown && use != RowUse::Unstored; }
+    // A field with a default, which reset gives it.
+    bool hasDefault() const { return use == RowUse::Field || use == RowUse::Forced || use == RowUse::Unstored; }
 };
 
 // Row builders, so that a table with defaults reads like the record it
@@ -487,6 +498,9 @@ struct RowsOf {
     static constexpr R forcedI32(std::int32_t C::*m, std::int32_t value, int since = 0) {
         return row(m, value, since, RowUse::Forced);
     }
+    // A field that no record holds: only reset sets it.
+    template <class M>
+    static constexpr R unstored(M C::*m, double def) { return row(m, def, 0, RowUse::Unstored); }
     static constexpr R hook(int code, int since = 0, FieldRef<C> f = FieldRef<C>(), double def = 0) {
         R r = row(f, def, since, RowUse::Hook);
         r.hook = code;
@@ -522,7 +536,8 @@ void readRow(QuickArchive& ar, C& obj, const RecordRow<C>& row) {
             }
             break;
         case RowUse::Hook:
-        case RowUse::Shown: break;
+        case RowUse::Shown:
+        case RowUse::Unstored: break;
     }
 }
 
@@ -543,7 +558,8 @@ void writeRow(QuickArchive& ar, const C& obj, const RecordRow<C>& row) {
             break;
         }
         case RowUse::Hook:
-        case RowUse::Shown: break;
+        case RowUse::Shown:
+        case RowUse::Unstored: break;
     }
 }
 
@@ -586,11 +602,12 @@ void writeFields(QuickArchive& ar, const C& obj, const Rows& rows, int version) 
     writeFields(ar, obj, rows, version, [](const RecordRow<C>&) { return true; });
 }
 
-// Gives every field row its default; kept, const, dropped and hook rows stay.
+// Gives every field row its default; kept, const, dropped, hook and shown
+// rows stay.
 template <class C, class Rows>
 void resetFields(C& obj, const Rows& rows) {
     for (const RecordRow<C>& row : rows)
-        if (row.use == RowUse::Field || row.use == RowUse::Forced) row.field.reset(obj, row.number, row.color);
+        if (row.hasDefault()) row.field.reset(obj, row.number, row.color);
 }
 
 // The same for the rows of `version` only: a table that also lists a field at
@@ -598,8 +615,7 @@ void resetFields(C& obj, const Rows& rows) {
 template <class C, class Rows>
 void resetFields(C& obj, const Rows& rows, int version) {
     for (const RecordRow<C>& row : rows)
-        if (row.inVersion(version) && (row.use == RowUse::Field || row.use == RowUse::Forced))
-            row.field.reset(obj, row.number, row.color);
+        if (row.inVersion(version) && row.hasDefault()) row.field.reset(obj, row.number, row.color);
 }
 
 // True if every field of the table (of the rows of `version`, where given)
@@ -608,8 +624,7 @@ template <class C, class Rows>
 bool fieldsEqual(const C& x, const C& y, const Rows& rows, int version = -1) {
     for (const RecordRow<C>& row : rows) {
         if (version >= 0 && !row.inVersion(version)) continue;
-        const bool hasField = row.use == RowUse::Field || row.use == RowUse::Kept || row.use == RowUse::Forced;
-        if (hasField && !row.field.equal(x, y)) return false;
+        if ((row.hasDefault() || row.use == RowUse::Kept) && !row.field.equal(x, y)) return false;
     }
     return true;
 }

@@ -1,13 +1,14 @@
 #pragma once
-// XML parameter blocks described once, as tables of rows.
+// XML parameters described by the rows of record tables (persistence/FieldRows.h).
 //
-// A `ParamRow` names a parameter and the field it shows (a FieldRef of
-// persistence/FieldRows.h); `writeParams` writes a table in order, each in the
-// form that follows from the field's type: bool, integer, float (a double
-// narrowed), color, acolor, vector, transform (a TransformD's offset
-// narrowed), string, and a file name for a path. An integer field that holds
-// a flag is shown as a bool (`asFlag`). A block that shows fields of several
-// holders (C's member objects) reaches one of them with `fieldOf`.
+// A row with a name shows its field as a parameter, in the form that follows
+// from the field's type: bool, integer, float (a double narrowed), color,
+// acolor, vector, transform (a TransformD's offset narrowed), string, and a
+// file name for a path. An integer field that holds a flag is shown as a bool
+// (the row's `asFlag`). The parameters follow the places that the rows give.
+#include <cstddef>
+#include <cstdint>
+#include <limits>
 #include <vector>
 
 #include "persistence/FieldRows.h"
@@ -15,71 +16,24 @@
 
 namespace OrvaneLumoCore {
 
-template <class M>
-struct MemberPointerTraits;
-template <class C, class T>
-struct MemberPointerTraits<T C::*> {
-    using Class = C;
-    using Type = T;
-};
-template <class M>
-using MemberClass = typename MemberPointerTraits<M>::Class;
-template <class M>
-using MemberType = typename MemberPointerTraits<M>::Type;
-
+// One XML parameter and the field it shows. An empty label shows the name.
 template <class C>
-struct ParamRow;
-
-// Writes a row whose field lies in a member object of C (see fieldOf).
-template <class C>
-using PartWriter = void (*)(AssetXmlWriter&, const ParamRow<C>&, const C&);
-
-// The field a parameter shows: a field of C, or one of a member object of C.
-template <class C>
-struct ParamField : FieldRef<C> {
-    using FieldRef<C>::FieldRef;
-    constexpr ParamField() = default;
-    constexpr ParamField(const FieldRef<C>& f) : FieldRef<C>(f) {}
-    constexpr ParamField(PartWriter<C> writer) : part(writer) {}
-
-    PartWriter<C> part = nullptr;
+struct ParamRow {
+    const char* name;
+    FieldRef<C> field;
+    const char* label = "";
+    bool isUserData = false;
     // An integer shown as a bool: any value but 0 is 1.
     bool shownAsFlag = false;
 };
 
 template <class C>
-constexpr ParamField<C> asFlag(std::int32_t C::*m) {
-    ParamField<C> f(m);
-    f.shownAsFlag = true;
-    return f;
-}
-template <class C>
-constexpr ParamField<C> asFlag(PartWriter<C> writer) {
-    ParamField<C> f(writer);
-    f.shownAsFlag = true;
-    return f;
-}
-
-// One XML parameter that shows a field. An empty label shows the name. A
-// parameter in a form of its own (a reference to a child's Asset, a value
-// derived from the field) names a nonzero `hook`: the class's code writes it.
-template <class C>
-struct ParamRow {
-    const char* name;
-    ParamField<C> field;
-    const char* label = "";
-    bool isUserData = false;
-    int hook = 0;
-};
-
-template <class C>
 void writeParam(AssetXmlWriter& w, const ParamRow<C>& row, const C& obj) {
     using Kind = typename FieldRef<C>::Kind;
-    const ParamField<C>& f = row.field;
-    if (f.part) return f.part(w, row, obj);
+    const FieldRef<C>& f = row.field;
     const char* name = row.name;
     const WriterText label(row.label);
-    if (f.shownAsFlag && f.kind() == Kind::Int)
+    if (row.shownAsFlag && f.kind() == Kind::Int)
         return w.writeBool(name, f.template get<std::int32_t>(obj) != 0, label, row.isUserData);
     switch (f.kind()) {
         case Kind::Bool:
@@ -106,47 +60,14 @@ void writeParam(AssetXmlWriter& w, const ParamRow<C>& row, const C& obj) {
     }
 }
 
-// The row `row` of a C shows the field `Field` of its member object `Part`.
-template <class C, class P, P C::*Part, auto Field>
-void writeFieldOfPart(AssetXmlWriter& w, const ParamRow<C>& row, const C& obj) {
-    ParamRow<P> inner{row.name, FieldRef<P>(Field), row.label, row.isUserData};
-    inner.field.shownAsFlag = row.field.shownAsFlag;
-    writeParam(w, inner, obj.*Part);
-}
-
-// The field `Field` of C's member object `Part`, as a row's field:
-// `{"gi_on", asFlag(fieldOf<&Options::params, &Params::gi_on>)}`.
-template <auto Part, auto Field>
-constexpr auto fieldOf = &writeFieldOfPart<MemberClass<decltype(Part)>, MemberType<decltype(Part)>, Part, Field>;
-
-template <class C, class Rows>
-void writeParams(AssetXmlWriter& w, const C& obj, const Rows& rows) {
-    for (const ParamRow<C>& row : rows) writeParam(w, row, obj);
-}
-
-// The same; a row with a hook, or one that shows a child, goes to `hook(row)`.
-template <class C, class Rows, class Hook>
-void writeParams(AssetXmlWriter& w, const C& obj, const Rows& rows, Hook hook) {
-    for (const ParamRow<C>& row : rows) {
-        if (row.hook != 0 || row.field.isChild())
-            hook(row);
-        else
-            writeParam(w, row, obj);
-    }
-}
-
-// ---- parameters that a record table shows ----
-
 // The parameter that a record row shows, as a ParamRow.
 template <class C>
 ParamRow<C> shownParam(const RecordRow<C>& row) {
-    ParamRow<C> p{row.xml.name, ParamField<C>(row.field), row.xml.label, row.xml.userData};
-    p.field.shownAsFlag = row.xml.asFlag;
-    return p;
+    return ParamRow<C>{row.xml.name, row.field, row.xml.label, row.xml.userData, row.xml.asFlag};
 }
 
-// Calls `visit(row)` for each row of a record table that a parameter shows
-// (the rows with a name): in the order of their places where the rows give
+// Calls `visit(row)` for each row of a record table that a parameter of the
+// class's own Asset shows (the rows with a name and no group): in the order of their places where the rows give
 // places, those without a place behind them in table order; otherwise in
 // table order.
 template <class C, class Rows, class Visit>
@@ -160,7 +81,7 @@ void forEachShown(const Rows& rows, Visit visit) {
     int places = 0, others = 0;
     bool direct = true;
     for (const RecordRow<C>& row : rows) {
-        if (!row.xml.name) continue;
+        if (!row.xml.name || row.xml.group != 0) continue;
         const int at = row.xml.at;
         if (at == 0) {
             if (others < kMax) unplaced[others] = &row;
@@ -179,11 +100,12 @@ void forEachShown(const Rows& rows, Visit visit) {
         for (int k = 0; k < others; ++k) visit(*unplaced[k]);
         return;
     }
+    const auto own = [](const RecordRow<C>& row) { return row.xml.name && row.xml.group == 0; };
     for (int place = 1; place <= places; ++place)
         for (const RecordRow<C>& row : rows)
-            if (row.xml.name && row.xml.at == place) visit(row);
+            if (own(row) && row.xml.at == place) visit(row);
     for (const RecordRow<C>& row : rows)
-        if (row.xml.name && row.xml.at == 0) visit(row);
+        if (own(row) && row.xml.at == 0) visit(row);
 }
 
 // The rows of a table that parameters show, in the order of forEachShown. A
@@ -225,6 +147,26 @@ void writeShownFields(AssetXmlWriter& w, const C& obj, const ShownRows<C>& shown
 template <class C, class Rows>
 void writeShownFields(AssetXmlWriter& w, const C& obj, const Rows& rows) {
     writeShownFields(w, obj, rows, [](const RecordRow<C>&) {});
+}
+
+// Writes the parameters of a class's own table and of a part's table (a
+// base or member of the class that other classes hold too, with a table of
+// its own) as one block: the placed rows of both in the order of their
+// places, then those without a place, the class's own first.
+template <class C, class P, class Rows, class PartRows>
+void writeShownFieldsWithPart(AssetXmlWriter& w, const C& obj, const Rows& rows, const P& part,
+                              const PartRows& partRows) {
+    const ShownRows<C> own = shownRows<C>(rows);
+    const ShownRows<P> shared = shownRows<P>(partRows);
+    const auto place = [](const RowXml& xml) { return xml.at != 0 ? xml.at : std::numeric_limits<int>::max(); };
+    const auto noHook = [](const auto&) {};
+    std::size_t i = 0, k = 0;
+    while (i < own.size() || k < shared.size()) {
+        if (k == shared.size() || (i < own.size() && place(own[i]->xml) <= place(shared[k]->xml)))
+            writeShownRow(w, obj, *own[i++], noHook);
+        else
+            writeShownRow(w, part, *shared[k++], noHook);
+    }
 }
 
 }  // namespace OrvaneLumoCore

@@ -1,5 +1,5 @@
 // The one record row form: each encoding's bytes, the version range of a row,
-// defaults, constant, dropped, forced and hook rows, and the comparison.
+// defaults, constant, dropped, forced, unstored and hook rows, and the comparison.
 #include <gtest/gtest.h>
 
 #include "persistence/FieldRows.h"
@@ -25,6 +25,7 @@ struct Rec {
     std::u16string file;
     std::string note;
     std::int32_t forced = 0;
+    std::int32_t level = 0;
 };
 
 typedef RowsOf<Rec> R;
@@ -48,6 +49,7 @@ const RecordRow<Rec> kRows[] = {
     R::constF32(0.5f, 1),
     R::droppedF32(1, 1),
     R::forcedI32(&Rec::forced, 9, 1),
+    R::unstored(&Rec::level, 4),
     R::hook(42, 1),
 };
 
@@ -67,6 +69,7 @@ Rec sample() {
     r.title = u"Ti";
     r.file = u"C:\\A.png";
     r.note = "n";
+    r.level = 11;
     return r;
 }
 
@@ -93,6 +96,7 @@ TEST(FieldRows, ResetGivesEveryFieldRowItsDefault) {
     EXPECT_EQ(Matrix(Vector(0, 0, 0), Vector(0, 0, 0), Vector(0, 0, 0)), r.wide.m);
     EXPECT_TRUE(r.title.empty() && r.file.empty() && r.note.empty());
     EXPECT_EQ(9, r.forced);
+    EXPECT_EQ(4, r.level);
 }
 
 TEST(FieldRows, WritesAndReadsEachVersionInTableOrder) {
@@ -123,6 +127,8 @@ TEST(FieldRows, WritesAndReadsEachVersionInTableOrder) {
         EXPECT_EQ(9, back.forced);
         Rec expected = r;
         if (version == 1) expected.ratio = 0;  // not in version 1: stays as it was
+        EXPECT_FALSE(fieldsEqual(expected, back, kRows));  // no version holds `level`
+        expected.level = back.level;
         EXPECT_TRUE(fieldsEqual(expected, back, kRows));
     }
 }

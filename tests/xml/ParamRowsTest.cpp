@@ -36,44 +36,51 @@ std::u16string written(const std::function<void(AssetXmlWriter&)>& body) {
     return out;
 }
 
-TEST(ParamRows, AFlagOfZeroIsFalseWhereverItLies) {
-    Holder h;
-    const ParamRow<Holder> rows[] = {
-        {"own", asFlag(&Holder::ownFlag)},
-        {"inner", asFlag(fieldOf<&Holder::inner, &Inner::flag>)},
-    };
-    const std::u16string expected = written([](AssetXmlWriter& w) {
-        w.writeBool("own", false);
-        w.writeBool("inner", false);
-    });
-    EXPECT_EQ(written([&](AssetXmlWriter& w) { writeParams(w, h, rows); }), expected);
-}
-
-// Hook rows go to the hook in table order; the rows around them are written.
-TEST(ParamRows, HookRowsGoToTheHookInOrder) {
+// A class that shows a part's table among its own parameters: the placed
+// rows of both by place, then the unplaced ones, the class's own first.
+TEST(ShownFields, APartsRowsStandAmongTheClassesOwnByTheirPlaces) {
     Holder h;
     h.ownCount = 4;
     h.inner.count = 9;
-    const ParamRow<Holder> rows[] = {
-        {"first", &Holder::ownCount},
-        {"hooked", {}, "", false, 3},
-        {"inner", fieldOf<&Holder::inner, &Inner::count>},
-        {"last", {}, "", false, 5},
+    h.inner.weight = 0.25f;
+    h.inner.flag = 0;
+    const RecordRow<Holder> own[] = {
+        {&Holder::ownCount, "own_count", 2},
+        {&Holder::on, "on"},
+        {&Holder::scale, "scale", 4},
     };
-    std::vector<int> hooks;
-    const std::u16string out = written([&](AssetXmlWriter& w) {
-        writeParams(w, h, rows, [&](const ParamRow<Holder>& row) {
-            hooks.push_back(row.hook);
-            w.writeString(row.name, "x");
-        });
+    const RecordRow<Inner> part[] = {
+        {&Inner::weight, "weight"},
+        {&Inner::count, "count", 3},
+        RecordRow<Inner>(&Inner::flag, "flag", 1).asFlag(),
+        {&Inner::file},
+    };
+    const std::u16string expected = written([](AssetXmlWriter& w) {
+        w.writeBool("flag", false);
+        w.writeInteger("own_count", 4);
+        w.writeInteger("count", 9);
+        w.writeFloat("scale", 0);
+        w.writeBool("on", false);
+        w.writeFloat("weight", 0.25f);
     });
-    EXPECT_EQ(hooks, (std::vector<int>{3, 5}));
-    EXPECT_EQ(out, written([](AssetXmlWriter& w) {
-                  w.writeInteger("first", 4);
-                  w.writeString("hooked", "x");
-                  w.writeInteger("inner", 9);
-                  w.writeString("last", "x");
-              }));
+    EXPECT_EQ(written([&](AssetXmlWriter& w) { writeShownFieldsWithPart(w, h, own, h.inner, part); }), expected);
+}
+
+// A row that names a block of a document written as several Assets is that
+// block's, not a parameter of the class's own Asset; a flag of 0 is false.
+TEST(ShownFields, RowsOfADocumentsBlockAreLeftToTheDocument) {
+    Holder h;
+    h.ownFlag = 0;
+    h.ownCount = 5;
+    const RecordRow<Holder> rows[] = {
+        RecordRow<Holder>(&Holder::ownCount).shownIn(3, "count", 1),
+        RecordRow<Holder>(&Holder::ownFlag, "flag").asFlag(),
+        RecordRow<Holder>::shownAgain(&Holder::ownCount, nullptr).shownIn(3, "count_again", 2),
+    };
+    EXPECT_EQ(written([&](AssetXmlWriter& w) { writeShownFields(w, h, rows); }),
+              written([](AssetXmlWriter& w) { w.writeBool("flag", false); }));
+    const ParamRow<Holder> param = shownParam(rows[0]);
+    EXPECT_STREQ(param.name, "count");
 }
 
 // A record table shows its fields in the order of the places it gives, rows
