@@ -171,6 +171,7 @@ bool RenderView::load(QuickArchive& ar) {
         return loadNested(ar, viewAngle) && loadNested(ar, viewReal2) && loadNested(ar, viewReal3) &&
                loadNested(ar, viewState) && loadNested(ar, cameraTransform);
     }
+    // Written by hand: the versions hold the fields in other orders and forms.
     // Versions 1 and 2: both rectangles, the three reals as f32 keys at time
     // 0, the image size and the state flag. The transform comes first in
     // version 1, as a key at time 0, and last in version 2, as its record.

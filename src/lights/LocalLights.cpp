@@ -166,6 +166,7 @@ RowSpan<RecordRow<RectangleLight>> RectangleLight::record() { return rowSpan(kRe
 //
 // Record: tag, transform, color, shadowColor, the four reals, the four ints,
 // then the flags as bool8: five in version 1, all eight in version 2.
+// Written by hand: the fields are three unnamed arrays, which no row holds.
 
 bool SphereLight::save(QuickArchive& ar) const {
     writeVersion(ar, 2);

@@ -73,6 +73,7 @@ bool MaterialBump::save(QuickArchive& ar) const {
 // Version 2: name (an empty one stays empty), bump_tex_mult, bump_tex as
 //            texture member, base_mtl as tag and record.
 // Version 3: bump_tex_mult, bump_tex, base_mtl, then the base record.
+// Written by hand: version 1 holds a path where the others hold a texture.
 bool MaterialBump::load(QuickArchive& ar) {
     const int v = readVersion(ar, 1, kBumpVersion);
     if (v < 0) return false;

@@ -106,6 +106,7 @@ bool MaterialObjectExclusion::save(QuickArchive& ar) const {
 // Version 1: mode, base_mtl, the object names.
 // Version 2: as 1, then the base record.
 // Version 3: as 2, then short_circuit.
+// Written by hand: the object names are a counted list, which no row holds.
 bool MaterialObjectExclusion::load(QuickArchive& ar) {
     const int v = readVersion(ar, 1, kObjectExclusionVersion);
     reset();  // also when the tag is refused

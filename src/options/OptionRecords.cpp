@@ -404,6 +404,8 @@ bool OrvaneLFBStampInfo::save(QuickArchive& ar) const {
     return true;
 }
 
+// Written by hand: the font description is 60 bytes with a length in version
+// 2 and without one in version 1.
 bool OrvaneLFBStampInfo::load(QuickArchive& ar) {
     const int version = readVersion(ar, 1, kVersion);
     reset();

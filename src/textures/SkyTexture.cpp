@@ -29,6 +29,7 @@ const SunLight* SkyTexture::sunLight() const {
     return static_cast<const SunLight*>(sun.get());
 }
 
+// Written by hand: the transform's place and form change with the version.
 // Version 3: own sun (flag, record without a type tag), settings, skyFlag,
 // skyId, transform, the document sun's record, and whether the sun is the
 // document sun.
