@@ -53,7 +53,7 @@ TEST(FieldRefKind, HoldsOnlyTheTypeOfItsKind) {
 
 #if GTEST_HAS_DEATH_TEST && !defined(_WIN32)
 TEST(FieldRefKindDeathTest, GetOfAnotherTypeStops) {
-    if (!kFieldKindChecks) GTEST_SKIP() << "FieldRows.h was included before this file turned the checks on";
+    ASSERT_TRUE(kFieldKindChecks) << "FieldRows.h was included before this file turned the checks on";
     testing::FLAGS_gtest_death_test_style = "threadsafe";
     const KindRec r;
     EXPECT_DEATH(F(&KindRec::count).get<float>(r), "doesn't hold the type asked for");
