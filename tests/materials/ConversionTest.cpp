@@ -7,6 +7,7 @@
 #include "materials/MaterialTree.h"
 #include "materials/WrapperAssets.h"
 #include "module/OrvMatFile.h"
+#include "persistence/Record.h"
 #include "support/TempFiles.h"
 #include "textures/ProceduralTextures.h"
 
@@ -296,6 +297,20 @@ std::vector<std::u16string> found(const MaterialPtr& tree, std::uint32_t tag) {
     std::vector<std::u16string> names;
     for (const MaterialPtr& m : findMaterialsOfType(tree, tag)) names.push_back(m->name);
     return names;
+}
+
+// A tree built in memory may be deeper than any file: the walk takes the
+// textures of 4 x 256 levels below the top and none deeper.
+TEST_F(Conversion, BitmapFilesOfADeepTreeUpToTheWalkLimit) {
+    const int limit = 4 * kMaxNestingDepth;
+    for (int depth : {limit, limit + 1}) {
+        auto bottom = wrap<MaterialBump>(layered(u"L"), u"Bottom");
+        bottom->bump_tex = bitmap(u"deep.png");
+        MaterialPtr top = bottom;
+        for (int level = 0; level < depth; ++level) top = wrap<MaterialBump>(top);
+        std::vector<std::u16string> files;
+        EXPECT_EQ(collectBitmapFiles(top, files), depth <= limit ? 1u : 0u) << depth;
+    }
 }
 
 TEST_F(Conversion, SearchGoesThroughEveryWrapperInChildOrder) {

@@ -15,6 +15,7 @@
 #include "module/OrvMatFile.h"
 #include "module/OrvOptFile.h"
 #include "options/AllOptions.h"
+#include "persistence/Record.h"
 #include "support/TempFiles.h"
 #include "textures/ProceduralTextures.h"
 #include "textures/SkyTexture.h"
@@ -164,7 +165,9 @@ TEST(InventoryListing, ExamplesListAsTheyConvert) {
         EXPECT_EQ(listing.status, outcome.status);
         if (outcome.status == FileStatus::Document) {
             EXPECT_TRUE(listing.reason.empty());
-            if (kind == FileKind::Materials) EXPECT_EQ(listing.materials.size(), outcome.items);
+            if (kind == FileKind::Materials) {
+                EXPECT_EQ(listing.materials.size(), outcome.items);
+            }
         } else {
             const std::string line = explainOutcome(outcome, kind);
             EXPECT_EQ(line.substr(line.find(": ") + 2), listing.reason);
@@ -209,6 +212,17 @@ TEST(InventoryListing, ShapeOfTreesBuiltInMemory) {
     EXPECT_EQ(summarizeMaterial(ref).shape,
               "MaterialReference[MaterialDisplaced[MaterialLayeredBRDF[Diffuse_BRDF]]]");
     EXPECT_EQ(summarizeMaterial(MaterialPtr()).shape, "");
+}
+
+// A tree built in memory may be deeper than any file. The shape shows the
+// children of every level up to the walk's limit, 4 x 256 levels, and no more.
+TEST(InventoryListing, ShapeOfADeepTreeStopsAtTheWalkLimit) {
+    const int limit = 4 * kMaxNestingDepth;
+    MaterialPtr top = layers(u"Bottom", {});
+    for (int level = 0; level <= limit + 1; ++level) top = wrap<MaterialBump>(top);
+    const std::string shape = summarizeMaterial(top).shape;
+    EXPECT_EQ(std::count(shape.begin(), shape.end(), '['), limit + 1);
+    EXPECT_EQ(shape.substr(shape.size() - (limit + 1) - 12), "MaterialBump" + std::string(limit + 1, ']'));
 }
 
 TEST(InventoryListing, SharedAndCircularTreesInMemoryAreWalkedOnce) {
