@@ -29,7 +29,7 @@ enum DocumentBlock : int {
     Output,
     CameraPhysical,
     DR,
-    kCount = 22
+    kCount = DR  // the last block, and so the number of blocks
 };
 
 // The Asset's name of a block.
@@ -58,6 +58,7 @@ inline const char16_t* nameOf(int block) {
         u"CameraPhysical",
         u"SettingsDR",
     };
+    static_assert(sizeof kNames / sizeof kNames[0] == kCount, "a name for every block");
     return kNames[block - 1];
 }
 
