@@ -18,10 +18,7 @@ enum DocumentHook {
     kFrameData,
     kStampInfo,
     kCamera,
-    kBgTexture,
-    kGiTexture,
-    kReflectTexture,
-    kRefractTexture,
+    kTexture,  // an environment texture: the row's field
     kChannels,
     kPath,
 };
@@ -37,8 +34,8 @@ const RecordRow<D> kDocumentRows[] = {
     DR::hook(kFrameData, 0),
     DR::hook(kStampInfo, 0),
     DR::hook(kCamera, 5),
-    DR::hook(kBgTexture, 0, &D::bgTexture).shownIn(block::Environment, "bg_tex", 3),  // 5
-    DR::hook(kGiTexture, 0, &D::giTexture).shownIn(block::Environment, "gi_tex", 7),
+    DR::hook(kTexture, 0, &D::bgTexture).shownIn(block::Environment, "bg_tex", 3),  // 5
+    DR::hook(kTexture, 0, &D::giTexture).shownIn(block::Environment, "gi_tex", 7),
     DR::color(&D::environment_bg_color, Color(0, 0, 0), 0).shownIn(block::Environment, "bg_color", 2),
     DR::color(&D::environment_gi_color, Color(0.8f, 0.8980392f, 1.0f), 0)
         .shownIn(block::Environment, "gi_color", 6),
@@ -113,8 +110,8 @@ const RecordRow<D> kDocumentRows[] = {
         .shownIn(block::Environment, "refract_mult", 16).shownBy(kEnvironmentMultForm + 3),
     DR::b32(&D::environment_use_reflect, 0, 9).shownIn(block::Environment, "use_reflect", 9).asFlag(),
     DR::b32(&D::environment_use_refract, 0, 9).shownIn(block::Environment, "use_refract", 13).asFlag(),  // 60
-    DR::hook(kReflectTexture, 9, &D::reflectTexture).shownIn(block::Environment, "reflect_tex", 11),
-    DR::hook(kRefractTexture, 9, &D::refractTexture).shownIn(block::Environment, "refract_tex", 15),
+    DR::hook(kTexture, 9, &D::reflectTexture).shownIn(block::Environment, "reflect_tex", 11),
+    DR::hook(kTexture, 9, &D::refractTexture).shownIn(block::Environment, "refract_tex", 15),
     DR::b32(&D::drOn, 0, 16).shownIn(block::DR, "on", 1).asFlag(),
     DR::keptF32(&D::keptFloat1, 17),
     DR::keptF32(&D::keptFloat2, 17),  // 65
@@ -169,10 +166,7 @@ bool loadHookRow(QuickArchive& ar, AllOptions& o, const RecordRow<D>& r, int ver
     case kFrameData: return loadNested(ar, o.frameData);
     case kStampInfo: return loadNested(ar, o.stampInfo);
     case kCamera: return loadNested(ar, o.physicalCamera);
-    case kBgTexture:
-    case kGiTexture:
-    case kReflectTexture:
-    case kRefractTexture: return loadOptionalMember(ar, r.field.get<TexturePtr>(o), createTexture);
+    case kTexture: return loadOptionalMember(ar, r.field.get<TexturePtr>(o), createTexture);
     case kChannels: return readChannels(ar, version, o.renderChannels);
     case kPath: {
         std::u16string text;
@@ -190,10 +184,7 @@ bool saveHookRow(QuickArchive& ar, const AllOptions& o, const RecordRow<D>& r) {
     case kFrameData: return o.frameData.save(ar);
     case kStampInfo: return o.stampInfo.save(ar);
     case kCamera: return o.physicalCamera.save(ar);
-    case kBgTexture:
-    case kGiTexture:
-    case kReflectTexture:
-    case kRefractTexture:
+    case kTexture:
         return saveOptionalMember(ar, r.field.get<TexturePtr>(o));
     case kChannels: writeChannels(ar, o.renderChannels); return true;
     case kPath: ar.writeWString(pathText(r.field.get<std::u16string>(o))); return true;
