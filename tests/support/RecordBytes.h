@@ -158,6 +158,20 @@ boost::shared_ptr<T> loaded(const RecordBytes& bytes, bool expectOk = true) {
     return loadedInto(boost::make_shared<T>(), bytes, expectOk);
 }
 
+// `bytes` in hex for a golden list: four to a group, 32 to a line, each line
+// indented by two spaces.
+inline std::string hexLines(const std::vector<std::uint8_t>& bytes) {
+    static const char digits[] = "0123456789abcdef";
+    std::string out;
+    for (std::size_t i = 0; i < bytes.size(); ++i) {
+        out += i % 32 == 0 ? "  " : i % 4 == 0 ? " " : "";
+        out += digits[bytes[i] >> 4];
+        out += digits[bytes[i] & 15];
+        if (i % 32 == 31 || i + 1 == bytes.size()) out += '\n';
+    }
+    return out;
+}
+
 // How an old record saves, for a golden list: `object` (which held a newest
 // record) reads `old` to its end, `settle` gives it what the old record can't
 // hold and leaves to chance (an id), and it saves; a fresh object from `make`
@@ -173,14 +187,7 @@ std::string savedFromOld(const std::string& label, const Ptr& object, const Reco
     const RecordBytes saved{savedBytes(*object, &ok)};
     const auto back = make();
     EXPECT_TRUE(ok && loadsWhole(*back, saved) && back->isEqual(object)) << label;
-    static const char digits[] = "0123456789abcdef";
-    for (std::size_t i = 0; i < saved.size(); ++i) {
-        out += i % 32 == 0 ? "  " : i % 4 == 0 ? " " : "";
-        out += digits[saved.data[i] >> 4];
-        out += digits[saved.data[i] & 15];
-        if (i % 32 == 31 || i + 1 == saved.size()) out += '\n';
-    }
-    return out;
+    return out + hexLines(saved.data);
 }
 
 // `value` saves as `laid`, and `laid` loaded into `other` gives `value`.
