@@ -16,9 +16,10 @@
 
 namespace OrvaneLumoCore {
 
-// Base of a light class `Derived` with type tag `Tag`. The class's defaults
-// are its member initialisers, so the family's `reset` serves, and `clone`
-// copies (lights hold no shared children).
+// Base of a light class `Derived` with type tag `Tag` whose record is
+// written by hand. The class's defaults are its member initialisers, or its
+// table's where its constructor sets them, so the family's `reset` serves,
+// and `clone` copies (lights hold no shared children).
 template <class Derived, std::uint32_t Tag>
 using LightOf = FamilyOf<Derived, Tag, BaseLight>;
 
@@ -31,7 +32,8 @@ void writeLightAsset(AssetXmlWriter& w, const std::u16string& url, const std::u1
 }
 
 // Base of a light whose record is one flat table that also names the XML
-// parameters (FlatFamilyOf gives save, load and the comparison): its Asset
+// parameters and gives the defaults (FlatFamilyOf gives save, load and the
+// comparison, and the constructor calls setTableDefaults()): its Asset
 // stands under the owner's url, "/" and the plugin name and shows the table's
 // parameters, then those of writeConstantParams.
 template <class Derived, std::uint32_t Tag>

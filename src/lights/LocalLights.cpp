@@ -7,102 +7,109 @@ namespace OrvaneLumoCore {
 namespace {
 
 // ---- records: the fields in record order, with the versions that hold them,
-// the XML parameters that show them and their places among the parameters ----
+// the XML parameters that show them, their places among the parameters and
+// their defaults ----
 
 typedef MayaDirectLight Dir;
+typedef RecordRow<Dir> DirRow;
 // Behind these fields stands the transform: a plain transform in version 2,
 // the AnimatedTransform record from version 3 on.
-const RecordRow<Dir> kDirectRecord[] = {
-    {&Dir::color, "color", 1},
+const DirRow kDirectRecord[] = {
+    DirRow(&Dir::color, "color", 1).byDefault(kWhite),
     {&Dir::shadowColor, 4, "shadowColor", 2},
     {&Dir::shadowBias, "shadowBias", 3},
-    {&Dir::intensity, "intensity", 5},
-    {&Dir::storedFactor},
-    {&Dir::causticSubdivs, "causticSubdivs", 6},
-    {&Dir::photonSubdivs, "photonSubdivs", 7},
-    {&Dir::storedMode},
-    {&Dir::enabled, "enabled", 9},
-    {&Dir::shadows, 2, "shadows", 10},
-    {&Dir::shadowSubdivs, 2, "shadowSubdivs", 8},
+    DirRow(&Dir::intensity, "intensity", 5).byDefault(1),
+    DirRow(&Dir::storedFactor).byDefault(1),
+    DirRow(&Dir::causticSubdivs, "causticSubdivs", 6).byDefault(1000),
+    DirRow(&Dir::photonSubdivs, "photonSubdivs", 7).byDefault(500),
+    DirRow(&Dir::storedMode).byDefault(3),
+    DirRow(&Dir::enabled, "enabled", 9).byDefault(true),
+    DirRow(&Dir::shadows, 2, "shadows", 10).byDefault(true),
+    DirRow(&Dir::shadowSubdivs, 2, "shadowSubdivs", 8).byDefault(8),
     {&Dir::shadowRadius, 2, "shadowRadius", 4},
 };
 
-const RecordRow<OmniLight> kOmniRecord[] = {
-    {&OmniLight::color, "color", 1},
-    {&OmniLight::shadowColor, 3, "shadowColor", 2},
-    {&OmniLight::cutoffThreshold, 3, "cutoffThreshold", 3},
-    {&OmniLight::shadowBias, "shadowBias", 4},
-    {&OmniLight::decay, "decay", 5},
-    {&OmniLight::intensity, "intensity", 6},
-    {&OmniLight::storedFactor},
-    {&OmniLight::units, 3, "units", 8},
-    {&OmniLight::photonSubdivs, "photonSubdivs", 9},
-    {&OmniLight::causticSubdivs, "causticSubdivs", 10},
-    {&OmniLight::storedMode},
-    {&OmniLight::enabled, "enabled", 12},
-    {&OmniLight::shadows, 2, "shadows", 13},
-    {&OmniLight::shadowSubdivs, 2, "shadowSubdivs", 11},
-    {&OmniLight::shadowRadius, 2, "shadowRadius", 7},
-    {&OmniLight::transform, 2, "transform", 16},
-    {&OmniLight::affectDiffuse, 4, "affectDiffuse", 14},
-    {&OmniLight::affectSpecular, 4, "affectSpecular", 15},
+typedef OmniLight Omni;
+typedef RecordRow<Omni> OmniRow;
+const OmniRow kOmniRecord[] = {
+    OmniRow(&Omni::color, "color", 1).byDefault(kWhite),
+    {&Omni::shadowColor, 3, "shadowColor", 2},
+    OmniRow(&Omni::cutoffThreshold, 3, "cutoffThreshold", 3).byDefault(0.005),
+    {&Omni::shadowBias, "shadowBias", 4},
+    {&Omni::decay, "decay", 5},
+    OmniRow(&Omni::intensity, "intensity", 6).byDefault(30),
+    OmniRow(&Omni::storedFactor).byDefault(1),
+    {&Omni::units, 3, "units", 8},
+    OmniRow(&Omni::photonSubdivs, "photonSubdivs", 9).byDefault(500),
+    OmniRow(&Omni::causticSubdivs, "causticSubdivs", 10).byDefault(1000),
+    OmniRow(&Omni::storedMode).byDefault(3),
+    OmniRow(&Omni::enabled, "enabled", 12).byDefault(true),
+    OmniRow(&Omni::shadows, 2, "shadows", 13).byDefault(true),
+    OmniRow(&Omni::shadowSubdivs, 2, "shadowSubdivs", 11).byDefault(8),
+    {&Omni::shadowRadius, 2, "shadowRadius", 7},
+    {&Omni::transform, 2, "transform", 16},
+    OmniRow(&Omni::affectDiffuse, 4, "affectDiffuse", 14).byDefault(true),
+    OmniRow(&Omni::affectSpecular, 4, "affectSpecular", 15).byDefault(true),
 };
 
-const RecordRow<SpotLight> kSpotRecord[] = {
-    {&SpotLight::color, "color", 1},
-    {&SpotLight::shadowColor, 3, "shadowColor", 2},
-    {&SpotLight::cutoffThreshold, 3, "cutoffThreshold", 3},
-    {&SpotLight::barnDoorLeft, 3, "barnDoorLeft", 4},
-    {&SpotLight::barnDoorRight, 3, "barnDoorRight", 5},
-    {&SpotLight::barnDoorTop, 3, "barnDoorTop", 6},
-    {&SpotLight::barnDoorBottom, 3, "barnDoorBottom", 7},
-    {&SpotLight::shadowBias, "shadowBias", 8},
-    {&SpotLight::decay, "decay", 9},
-    {&SpotLight::intensity, "intensity", 10},
-    {&SpotLight::storedFactor},
-    {&SpotLight::units, 3, "units", 14},
-    {&SpotLight::photonSubdivs, "photonSubdivs", 15},
-    {&SpotLight::causticSubdivs, "causticSubdivs", 16},
-    {&SpotLight::storedMode},
-    {&SpotLight::enabled, "enabled", 18},
-    {&SpotLight::barnDoor, 3, "barnDoor", 19},
-    {&SpotLight::shadows, 2, "shadows", 20},
-    {&SpotLight::shadowSubdivs, 2, "shadowSubdivs", 17},
-    {&SpotLight::shadowRadius, 2, "shadowRadius", 11},
-    {&SpotLight::transform, 2, "transform", 23},
-    {&SpotLight::coneAngle, 2, "coneAngle", 12},
-    {&SpotLight::penumbraAngle, 2, "penumbraAngle", 13},
-    {&SpotLight::affectDiffuse, 4, "affectDiffuse", 21},
-    {&SpotLight::affectSpecular, 4, "affectSpecular", 22},
+typedef SpotLight Spot;
+typedef RecordRow<Spot> SpotRow;
+const SpotRow kSpotRecord[] = {
+    SpotRow(&Spot::color, "color", 1).byDefault(kWhite),
+    {&Spot::shadowColor, 3, "shadowColor", 2},
+    SpotRow(&Spot::cutoffThreshold, 3, "cutoffThreshold", 3).byDefault(0.005),
+    SpotRow(&Spot::barnDoorLeft, 3, "barnDoorLeft", 4).byDefault(20),
+    SpotRow(&Spot::barnDoorRight, 3, "barnDoorRight", 5).byDefault(20),
+    SpotRow(&Spot::barnDoorTop, 3, "barnDoorTop", 6).byDefault(20),
+    SpotRow(&Spot::barnDoorBottom, 3, "barnDoorBottom", 7).byDefault(20),
+    {&Spot::shadowBias, "shadowBias", 8},
+    {&Spot::decay, "decay", 9},
+    SpotRow(&Spot::intensity, "intensity", 10).byDefault(50),
+    SpotRow(&Spot::storedFactor).byDefault(1),
+    {&Spot::units, 3, "units", 14},
+    SpotRow(&Spot::photonSubdivs, "photonSubdivs", 15).byDefault(500),
+    SpotRow(&Spot::causticSubdivs, "causticSubdivs", 16).byDefault(1000),
+    SpotRow(&Spot::storedMode).byDefault(3),
+    SpotRow(&Spot::enabled, "enabled", 18).byDefault(true),
+    {&Spot::barnDoor, 3, "barnDoor", 19},
+    SpotRow(&Spot::shadows, 2, "shadows", 20).byDefault(true),
+    SpotRow(&Spot::shadowSubdivs, 2, "shadowSubdivs", 17).byDefault(8),
+    {&Spot::shadowRadius, 2, "shadowRadius", 11},
+    {&Spot::transform, 2, "transform", 23},
+    SpotRow(&Spot::coneAngle, 2, "coneAngle", 12).byDefault(1),
+    {&Spot::penumbraAngle, 2, "penumbraAngle", 13},
+    SpotRow(&Spot::affectDiffuse, 4, "affectDiffuse", 21).byDefault(true),
+    SpotRow(&Spot::affectSpecular, 4, "affectSpecular", 22).byDefault(true),
 };
 
-typedef RectangleLight RectLight;
-const RecordRow<RectLight> kRectangleRecord[] = {
-    {&RectLight::color, "color", 1},
-    {&RectLight::shadowColor, 3, "shadowColor", 2},
-    {&RectLight::cutoffThreshold, 3, "cutoffThreshold", 3},
-    {&RectLight::shadowBias, "shadowBias", 4},
-    {&RectLight::intensity, "intensity", 5},
-    {&RectLight::storedFactor},
-    {&RectLight::units, 3, "units", 8},
-    {&RectLight::subdivs, "subdivs", 11},
-    {&RectLight::causticSubdivs, "causticSubdivs", 10},
-    {&RectLight::photonSubdivs, "photonSubdivs", 9},
-    {&RectLight::storedMode},
-    {&RectLight::doubleSided, "doubleSided", 13},
-    {&RectLight::invisible, "invisible", 14},
-    {&RectLight::lightPortal, "lightPortal", 15},
-    {&RectLight::noDecay, "noDecay", 16},
-    {&RectLight::enabled, "enabled", 12},
-    {&RectLight::storeWithIrradianceMap, "storeWithIrradianceMap", 17},
-    {&RectLight::ignoreLightNormals, "ignoreLightNormals", 18},
-    {&RectLight::shadows, 2, "shadows", 19},
-    {&RectLight::transform, 2, "transform", 23},
-    {&RectLight::u_size, 2, "u_size", 6},
-    {&RectLight::v_size, 2, "v_size", 7},
-    {&RectLight::affectDiffuse, 4, "affectDiffuse", 20},
-    {&RectLight::affectSpecular, 4, "affectSpecular", 21},
-    {&RectLight::affectReflections, 4, "affectReflections", 22},
+typedef RectangleLight Rect;
+typedef RecordRow<Rect> RectRow;
+const RectRow kRectangleRecord[] = {
+    RectRow(&Rect::color, "color", 1).byDefault(kWhite),
+    {&Rect::shadowColor, 3, "shadowColor", 2},
+    RectRow(&Rect::cutoffThreshold, 3, "cutoffThreshold", 3).byDefault(0.005),
+    {&Rect::shadowBias, "shadowBias", 4},
+    RectRow(&Rect::intensity, "intensity", 5).byDefault(30),
+    RectRow(&Rect::storedFactor).byDefault(1),
+    {&Rect::units, 3, "units", 8},
+    RectRow(&Rect::subdivs, "subdivs", 11).byDefault(8),
+    RectRow(&Rect::causticSubdivs, "causticSubdivs", 10).byDefault(1000),
+    RectRow(&Rect::photonSubdivs, "photonSubdivs", 9).byDefault(500),
+    RectRow(&Rect::storedMode).byDefault(3),
+    {&Rect::doubleSided, "doubleSided", 13},
+    {&Rect::invisible, "invisible", 14},
+    {&Rect::lightPortal, "lightPortal", 15},
+    {&Rect::noDecay, "noDecay", 16},
+    RectRow(&Rect::enabled, "enabled", 12).byDefault(true),
+    {&Rect::storeWithIrradianceMap, "storeWithIrradianceMap", 17},
+    RectRow(&Rect::ignoreLightNormals, "ignoreLightNormals", 18).byDefault(true),
+    RectRow(&Rect::shadows, 2, "shadows", 19).byDefault(true),
+    {&Rect::transform, 2, "transform", 23},
+    RectRow(&Rect::u_size, 2, "u_size", 6).byDefault(1),
+    RectRow(&Rect::v_size, 2, "v_size", 7).byDefault(1),
+    RectRow(&Rect::affectDiffuse, 4, "affectDiffuse", 20).byDefault(true),
+    RectRow(&Rect::affectSpecular, 4, "affectSpecular", 21).byDefault(true),
+    RectRow(&Rect::affectReflections, 4, "affectReflections", 22).byDefault(true),
 };
 
 constexpr int kNewest = 4;
@@ -117,6 +124,8 @@ void writeParamAsset(AssetXmlWriter& w, const std::u16string& url, const L& ligh
 }  // namespace
 
 // ---- MayaDirectLight ----
+
+MayaDirectLight::MayaDirectLight() { resetFields(*this, kDirectRecord); }
 
 bool MayaDirectLight::save(QuickArchive& ar) const {
     saveFlatRecord(*this, ar, kDirectRecord, kNewest);

@@ -11,22 +11,23 @@
 
 namespace OrvaneLumoCore {
 
-// Fields that every light of this file but the sphere has, with the same
-// defaults in all.
+// Fields that every light of this file but the sphere has; each light's
+// table gives their defaults, the same in all.
 struct SceneLightFields {
-    Color color{1, 1, 1};
-    Color shadowColor{0, 0, 0};
-    float shadowBias = 0.0f;
-    float storedFactor = 1.0f;
-    std::int32_t photonSubdivs = 500;
-    std::int32_t causticSubdivs = 1000;
-    std::int32_t storedMode = 3;
-    bool enabled = true;
-    bool shadows = true;
+    Color color;
+    Color shadowColor;
+    float shadowBias;
+    float storedFactor;
+    std::int32_t photonSubdivs;
+    std::int32_t causticSubdivs;
+    std::int32_t storedMode;
+    bool enabled;
+    bool shadows;
 };
 
 class MayaDirectLight : public LightOf<MayaDirectLight, 0>, public SceneLightFields {
 public:
+    MayaDirectLight();  // the table's defaults
     bool save(QuickArchive& ar) const override;
     bool load(QuickArchive& ar) override;
     bool sameContent(const MayaDirectLight& o) const;
@@ -34,25 +35,25 @@ public:
     std::u16string getPluginName() const override { return u"MayaLightDirect"; }
 
     AnimatedTransform transform;  // identity at time 0
-    float intensity = 1.0f;
-    float shadowRadius = 0.0f;
-    std::int32_t shadowSubdivs = 8;
+    float intensity;
+    float shadowRadius;
+    std::int32_t shadowSubdivs;
 };
 
 // The further fields that the omni, spot and rectangle lights share.
 struct PlacedLightFields : SceneLightFields {
     Transform transform;
-    float cutoffThreshold = 0.005f;
-    std::int32_t units = 0;
-    bool affectDiffuse = true;
-    bool affectSpecular = true;
+    float cutoffThreshold;
+    std::int32_t units;
+    bool affectDiffuse;
+    bool affectSpecular;
 };
 
 // The further fields of the omni and spot lights.
 struct PointLightFields : PlacedLightFields {
-    float shadowRadius = 0.0f;
-    float decay = 0.0f;
-    std::int32_t shadowSubdivs = 8;
+    float shadowRadius;
+    float decay;
+    std::int32_t shadowSubdivs;
 };
 
 class OmniLight : public TableLightOf<OmniLight, 2>, public PointLightFields {
@@ -60,9 +61,10 @@ public:
     static constexpr int kRecordVersion = 4;
     static RowSpan<RecordRow<OmniLight>> record();
 
+    OmniLight() { setTableDefaults(); }
     std::u16string getPluginName() const override { return u"LightOmni"; }
 
-    float intensity = 30.0f;
+    float intensity;
 };
 
 class SpotLight : public TableLightOf<SpotLight, 4>, public PointLightFields {
@@ -70,18 +72,19 @@ public:
     static constexpr int kRecordVersion = 4;
     static RowSpan<RecordRow<SpotLight>> record();
 
+    SpotLight() { setTableDefaults(); }
     // Always on; the consumer reads it as a setting of its own.
     void writeConstantParams(AssetXmlWriter& writer) const;
     std::u16string getPluginName() const override { return u"LightSpot"; }
 
-    float intensity = 50.0f;
-    float barnDoorLeft = 20.0f;
-    float barnDoorRight = 20.0f;
-    float barnDoorTop = 20.0f;
-    float barnDoorBottom = 20.0f;
-    float coneAngle = 1.0f;
-    float penumbraAngle = 0.0f;
-    bool barnDoor = false;
+    float intensity;
+    float barnDoorLeft;
+    float barnDoorRight;
+    float barnDoorTop;
+    float barnDoorBottom;
+    float coneAngle;
+    float penumbraAngle;
+    bool barnDoor;
 };
 
 class RectangleLight : public TableLightOf<RectangleLight, 3>, public PlacedLightFields {
@@ -89,19 +92,20 @@ public:
     static constexpr int kRecordVersion = 4;
     static RowSpan<RecordRow<RectangleLight>> record();
 
+    RectangleLight() { setTableDefaults(); }
     std::u16string getPluginName() const override { return u"LightRectangle"; }
 
-    float intensity = 30.0f;
-    float u_size = 1.0f;
-    float v_size = 1.0f;
-    std::int32_t subdivs = 8;
-    bool doubleSided = false;
-    bool invisible = false;
-    bool lightPortal = false;
-    bool noDecay = false;
-    bool storeWithIrradianceMap = false;
-    bool ignoreLightNormals = true;
-    bool affectReflections = true;
+    float intensity;
+    float u_size;
+    float v_size;
+    std::int32_t subdivs;
+    bool doubleSided;
+    bool invisible;
+    bool lightPortal;
+    bool noDecay;
+    bool storeWithIrradianceMap;
+    bool ignoreLightNormals;
+    bool affectReflections;
 };
 
 // Carries its settings in the record only: it writes no XML and has no

@@ -11,21 +11,23 @@ namespace OrvaneLumoCore {
 namespace {
 
 // The settings that the sun and the sky hold, with the parameters that
-// show them in the sun's XML and their places there.
-const RecordRow<SunSettings> kSunSettingsRecord[] = {
-    {&SunSettings::up_vector, "up_vector", 1},
-    {&SunSettings::shadowBias, "shadowBias", 2},
-    {&SunSettings::turbidity, "turbidity", 3},
-    {&SunSettings::water_vapour, "water_vapour", 4},
-    {&SunSettings::intensity_multiplier, "intensity_multiplier", 5},
-    {&SunSettings::size_multiplier, "size_multiplier", 6},
-    {&SunSettings::photon_radius, "photon_radius", 7},
-    {&SunSettings::photon_emit_distance, "photon_emit_distance", 8},
-    {&SunSettings::ozone, "ozone", 9},
-    {&SunSettings::photonSubdivs, "photonSubdivs", 10},
-    {&SunSettings::causticSubdivs, "causticSubdivs", 11},
-    {&SunSettings::shadow_subdivs, "shadow_subdivs", 12},
-    {&SunSettings::shadows, "shadows", 14},
+// show them in the sun's XML, their places there and their defaults.
+typedef SunSettings Set;
+typedef RecordRow<Set> SetRow;
+const SetRow kSunSettingsRecord[] = {
+    SetRow(&Set::up_vector, "up_vector", 1).byDefault(Vector(0, 0, 1)),
+    {&Set::shadowBias, "shadowBias", 2},
+    SetRow(&Set::turbidity, "turbidity", 3).byDefault(3),
+    SetRow(&Set::water_vapour, "water_vapour", 4).byDefault(2),
+    SetRow(&Set::intensity_multiplier, "intensity_multiplier", 5).byDefault(1),
+    SetRow(&Set::size_multiplier, "size_multiplier", 6).byDefault(1),
+    SetRow(&Set::photon_radius, "photon_radius", 7).byDefault(50),
+    SetRow(&Set::photon_emit_distance, "photon_emit_distance", 8).byDefault(150),
+    SetRow(&Set::ozone, "ozone", 9).byDefault(0.35),
+    SetRow(&Set::photonSubdivs, "photonSubdivs", 10).byDefault(500),
+    SetRow(&Set::causticSubdivs, "causticSubdivs", 11).byDefault(1000),
+    SetRow(&Set::shadow_subdivs, "shadow_subdivs", 12).byDefault(8),
+    SetRow(&Set::shadows, "shadows", 14).byDefault(true),
 };
 
 // The sun's fields behind its settings; its XML shows two of them among the
@@ -33,29 +35,31 @@ const RecordRow<SunSettings> kSunSettingsRecord[] = {
 const RecordRow<SunLight> kSunRecord[] = {
     {&SunLight::id, 2},
     {&SunLight::name, 2},
-    {&SunLight::enabled, 3, "enabled", 13},
+    RecordRow<SunLight>(&SunLight::enabled, 3, "enabled", 13).byDefault(true),
     {&SunLight::invisible, 3, "invisible", 15},
 };
 
 // The fields in record order, with the versions that hold them, the XML
-// parameters that show them and their places among the parameters.
-const RecordRow<IESLight> kIesRecord[] = {
+// parameters that show them, their places among the parameters and their
+// defaults.
+typedef RecordRow<IESLight> IesRow;
+const IesRow kIesRecord[] = {
     {&IESLight::transform, "transform", 1},
-    {&IESLight::color, "color", 2},
+    IesRow(&IESLight::color, "color", 2).byDefault(kWhite),
     {&IESLight::shadowColor, "shadowColor", 3},
-    {&IESLight::filter_color, "filter_color", 4},
+    IesRow(&IESLight::filter_color, "filter_color", 4).byDefault(kWhite),
     {&IESLight::shadowBias, "shadowBias", 5},
-    {&IESLight::cutoffThreshold, "cutoffThreshold", 6},
-    {&IESLight::photonSubdivs, "photonSubdivs", 8},
-    {&IESLight::causticSubdivs, "causticSubdivs", 9},
-    {&IESLight::shadow_subdivs, "shadow_subdivs", 10},
-    {&IESLight::enabled, "enabled", 11},
-    {&IESLight::shadows, "shadows", 12},
+    IesRow(&IESLight::cutoffThreshold, "cutoffThreshold", 6).byDefault(0.005),
+    IesRow(&IESLight::photonSubdivs, "photonSubdivs", 8).byDefault(8),
+    IesRow(&IESLight::causticSubdivs, "causticSubdivs", 9).byDefault(1000),
+    IesRow(&IESLight::shadow_subdivs, "shadow_subdivs", 10).byDefault(8),
+    IesRow(&IESLight::enabled, "enabled", 11).byDefault(true),
+    IesRow(&IESLight::shadows, "shadows", 12).byDefault(true),
     {&IESLight::soft_shadows, "soft_shadows", 13},
     {FieldRef<IESLight>::path(&IESLight::ies_file), "ies_file", 16},
-    {&IESLight::affectDiffuse, 2, "affectDiffuse", 14},
-    {&IESLight::affectSpecular, 2, "affectSpecular", 15},
-    {&IESLight::intensity, 3, "intensity", 7},
+    IesRow(&IESLight::affectDiffuse, 2, "affectDiffuse", 14).byDefault(true),
+    IesRow(&IESLight::affectSpecular, 2, "affectSpecular", 15).byDefault(true),
+    IesRow(&IESLight::intensity, 3, "intensity", 7).byDefault(1),
 };
 
 constexpr int kSunNewest = 4;
@@ -63,6 +67,8 @@ constexpr int kSunNewest = 4;
 }  // namespace
 
 // ---- sun settings ----
+
+SunSettings::SunSettings() { resetFields(*this, kSunSettingsRecord); }
 
 void readSunSettings(QuickArchive& ar, SunSettings& s) { readFields(ar, s, kSunSettingsRecord, 1); }
 
@@ -76,7 +82,10 @@ bool sunSettingsEqual(const SunSettings& a, const SunSettings& b) {
 
 // ---- SunLight ----
 
-SunLight::SunLight() : id(platform::newUuidString()) {}
+SunLight::SunLight() {
+    resetFields(*this, kSunRecord);
+    id = platform::newUuidString();
+}
 
 SunLight::SunLight(const std::u16string& name_, const std::u16string& id_) : SunLight() {
     name = name_;

@@ -12,22 +12,24 @@
 
 namespace OrvaneLumoCore {
 
-// The settings a sun shares with the sky that it drives, with their
-// defaults. Both records hold them in this order.
+// The settings a sun shares with the sky that it drives. Both records hold
+// them in this order; their table gives the defaults.
 struct SunSettings {
-    Vector up_vector{0, 0, 1};
-    float shadowBias = 0.0f;
-    float turbidity = 3.0f;
-    float water_vapour = 2.0f;
-    float intensity_multiplier = 1.0f;
-    float size_multiplier = 1.0f;
-    float photon_radius = 50.0f;
-    float photon_emit_distance = 150.0f;
-    float ozone = 0.35f;
-    std::int32_t photonSubdivs = 500;
-    std::int32_t causticSubdivs = 1000;
-    std::int32_t shadow_subdivs = 8;
-    bool shadows = true;
+    SunSettings();
+
+    Vector up_vector;
+    float shadowBias;
+    float turbidity;
+    float water_vapour;
+    float intensity_multiplier;
+    float size_multiplier;
+    float photon_radius;
+    float photon_emit_distance;
+    float ozone;
+    std::int32_t photonSubdivs;
+    std::int32_t causticSubdivs;
+    std::int32_t shadow_subdivs;
+    bool shadows;
 };
 
 // From `up_vector` to `shadows`: vector, eight f32, three i32, bool8.
@@ -40,7 +42,7 @@ constexpr char16_t documentSunId[] = u"{D3BE9766-E4AA-418b-81A9-23414A2BA98D}";
 
 class SunLight : public LightOf<SunLight, BaseLight::kSunLightType>, public SunSettings {
 public:
-    // Defaults and a new UUID string as id.
+    // The table's defaults and a new UUID string as id.
     SunLight();
     // Defaults, then the given name and id.
     SunLight(const std::u16string& name, const std::u16string& id);
@@ -59,8 +61,8 @@ public:
     std::u16string getPluginName() const override { return u"SunLight"; }
 
     AnimatedTransform transform;  // identity at time 0
-    bool enabled = true;
-    bool invisible = false;
+    bool enabled;
+    bool invisible;
     std::u16string id;
     std::u16string name;
 };
@@ -84,23 +86,24 @@ public:
     static constexpr int kRecordVersion = 3;
     static RowSpan<RecordRow<IESLight>> record();  // the file path compares without regard to case
 
+    IESLight() { setTableDefaults(); }
     std::u16string getPluginName() const override { return u"LightIES"; }
 
     Transform transform;
-    Color color{1, 1, 1};
-    Color shadowColor{0, 0, 0};
-    Color filter_color{1, 1, 1};
-    float shadowBias = 0.0f;
-    float cutoffThreshold = 0.005f;
-    float intensity = 1.0f;
-    std::int32_t photonSubdivs = 8;
-    std::int32_t causticSubdivs = 1000;
-    std::int32_t shadow_subdivs = 8;
-    bool enabled = true;
-    bool shadows = true;
-    bool soft_shadows = false;
-    bool affectDiffuse = true;
-    bool affectSpecular = true;
+    Color color;
+    Color shadowColor;
+    Color filter_color;
+    float shadowBias;
+    float cutoffThreshold;
+    float intensity;
+    std::int32_t photonSubdivs;
+    std::int32_t causticSubdivs;
+    std::int32_t shadow_subdivs;
+    bool enabled;
+    bool shadows;
+    bool soft_shadows;
+    bool affectDiffuse;
+    bool affectSpecular;
     std::u16string ies_file;
 };
 

@@ -45,8 +45,6 @@ const RowHook kFresnelRule{kFresnelRuleCode};
 // component, 0 where negative.
 enum LayerForm { kFromReflection = 1 };
 
-const Color kWhite(1, 1, 1);
-
 template <class L>
 RecordRow<L> path(TexturePtr L::*texture, int since, int until) {
     return RecordRow<L>(texture, since, until).coded(kPathCode);

@@ -17,7 +17,8 @@
 // constructor then calls that reset (by its class name where it is a base's).
 //
 // A class whose record is one flat table derives from FlatFamilyOf instead and
-// also gets save, load and the comparison from its table.
+// also gets save, load and the comparison from its table; its defaults are
+// the table's, which its constructor sets.
 #include <cstdint>
 #include <type_traits>
 #include <utility>
@@ -68,8 +69,9 @@ protected:
 //   static RowSpan<RecordRow<Class>> record();  // the table, in record order
 //   static constexpr int kRecordVersion = N;    // the version that save writes
 //
-// and gets save, load (from version 1) and the comparison from it; its
-// defaults are its member initialisers.
+// and gets save, load (from version 1) and the comparison from it. Its
+// defaults are the table's: its constructor calls setTableDefaults(), and
+// `reset` assigns a new object.
 template <class Derived, std::uint32_t Tag, class Base>
 class FlatFamilyOf : public FamilyOf<Derived, Tag, Base> {
 public:
@@ -80,6 +82,9 @@ public:
         return loadFlatRecord(static_cast<Derived&>(*this), ar, Derived::record(), Derived::kRecordVersion) > 0;
     }
     bool sameContent(const Derived& o) const { return fieldsEqual(this->self(), o, Derived::record()); }
+
+protected:
+    void setTableDefaults() { resetFields(static_cast<Derived&>(*this), Derived::record()); }
 };
 
 // A family's factory: a new default object of the class among Classes whose

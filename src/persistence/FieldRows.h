@@ -204,8 +204,10 @@ public:
         return false;
     }
 
-    // Sets the field to `number` (numbers and flags) or `color` (colours);
-    // transforms become all zero, the matrix included, and text empty.
+    // Sets the field to `number` (numbers and flags), `color` (colours, and
+    // the three components of a vector) or both (`color` with alpha
+    // `number`); a transform becomes the identity, a transform of f32 all
+    // zero, the matrix included, text empty and a child null.
     void reset(C& obj, double number, const Color& color) const {
         switch (kind_) {
             case Kind::None: break;
@@ -218,7 +220,7 @@ public:
             case Kind::AColor:  // `color`, alpha `number`
                 obj.*a_ = AColor(color.r, color.g, color.b, static_cast<float>(number));
                 break;
-            case Kind::Vector: obj.*v_ = Vector(0, 0, 0); break;
+            case Kind::Vector: obj.*v_ = Vector(color.r, color.g, color.b); break;
             case Kind::Transform: obj.*t_ = Transform(); break;
             case Kind::TransformD: {
                 TransformD& field = obj.*td_;
@@ -361,10 +363,11 @@ struct RowHook {
 };
 
 // One row of a record: the field, the versions `since` to `until` that hold
-// it, its default (`number`, or `color` for colours) and its use. A row
-// written as &C::field, {&C::field, since} or {&C::field, since, until} is a
-// plain field whose default lies elsewhere (the class's member initialisers or
-// its reset); a child texture or material is a hook row with code 0.
+// it, its default (`number`, `color` for colours and vectors, both for a
+// colour with alpha) and its use. A row written as &C::field,
+// {&C::field, since} or {&C::field, since, until} is a plain field; its
+// default is zero (false, black, empty) unless .byDefault(value) gives
+// another. A child texture or material is a hook row with code 0.
 //
 // A row shown in the XML names its parameter, and where the XML order isn't
 // the record's, its place there: {&C::field, "name", 3}, or with the version
@@ -429,9 +432,15 @@ struct RecordRow {
     constexpr RecordRow shownIn(int group, const char* name, int at) const {
         return shownAs(name, at).withXml(&RowXml::group, group);
     }
-    // The field's default, for tables that give their class its defaults.
+    // The field's default.
     constexpr RecordRow byDefault(double value) const { return with(&RecordRow::number, value); }
     constexpr RecordRow byDefault(const Color& value) const { return with(&RecordRow::color, value); }
+    constexpr RecordRow byDefault(const AColor& value) const {
+        return with(&RecordRow::color, Color(value.r, value.g, value.b)).with(&RecordRow::number, value.a);
+    }
+    constexpr RecordRow byDefault(const Vector& value) const {
+        return with(&RecordRow::color, Color(value.x, value.y, value.z));
+    }
     // The field shown in a form of the class's own: the XML walk hands the
     // row to the class's hook with `xml.form` set to `code`.
     constexpr RecordRow shownBy(int code) const { return withXml(&RowXml::form, code); }

@@ -27,15 +27,19 @@ typedef FresnelTexture Fr;
 // The colours are stored as complements; the XML shows max(0, 1 - c).
 enum FresnelForm { kComplement = 1 };
 
-const RecordRow<Fr> kFresnelRecord[] = {
-    RecordRow<Fr>(&Fr::whiteInverse, "white_color").shownBy(kComplement),
-    RecordRow<Fr>(&Fr::blackInverse, "black_color").shownBy(kComplement),
-    {&Fr::fresnel_ior, "fresnel_ior"},
-    {&Fr::refract_ior, "refract_ior"},
-    {&Fr::black_color_tex_mult, 2, "black_color_tex_mult"},
-    {&Fr::white_color_tex_mult, 2, "white_color_tex_mult"},
-    {&Fr::fresnel_ior_tex_mult, 2, "fresnel_ior_tex_mult"},
-    {&Fr::refract_ior_tex_mult, 2, "refract_ior_tex_mult"},
+// The complement that a new texture holds for its black colour: 0.25490198.
+constexpr float kGrey = 0x1.050506p-2f;
+
+typedef RecordRow<Fr> FrRow;
+const FrRow kFresnelRecord[] = {
+    FrRow(&Fr::whiteInverse, "white_color").shownBy(kComplement).byDefault(Color(1, 1, 1)),
+    FrRow(&Fr::blackInverse, "black_color").shownBy(kComplement).byDefault(Color(kGrey, kGrey, kGrey)),
+    FrRow(&Fr::fresnel_ior, "fresnel_ior").byDefault(1.55),
+    FrRow(&Fr::refract_ior, "refract_ior").byDefault(1.55),
+    FrRow(&Fr::black_color_tex_mult, 2, "black_color_tex_mult").byDefault(1),
+    FrRow(&Fr::white_color_tex_mult, 2, "white_color_tex_mult").byDefault(1),
+    FrRow(&Fr::fresnel_ior_tex_mult, 2, "fresnel_ior_tex_mult").byDefault(1),
+    FrRow(&Fr::refract_ior_tex_mult, 2, "refract_ior_tex_mult").byDefault(1),
     // The first texture feeds the black colour and the second the white one,
     // crosswise to the colours above.
     RecordRow<Fr>(&Fr::reflection_tex, 2, "black_color_tex").slot(u"reflection_tex"),
@@ -113,7 +117,9 @@ template class TableTextureOf<InvertTexture, 9>;
 
 // ---- AColorTexture -------------------------------------------------------------
 
-const RecordRow<AColorTexture> kAColorRecord[] = {{&AColorTexture::color, "texture"}};
+const RecordRow<AColorTexture> kAColorRecord[] = {
+    RecordRow<AColorTexture>(&AColorTexture::color, "texture").byDefault(AColor(1, 1, 1, 1)),
+};
 
 TextureTable<AColorTexture> textureTable(const AColorTexture&) { return {1, rowSpan(kAColorRecord)}; }
 

@@ -14,6 +14,7 @@ namespace OrvaneLumoCore {
 // as their complements; XML writes them back as max(0, 1 - c).
 class FresnelTexture : public TableTextureOf<FresnelTexture, 1> {
 public:
+    FresnelTexture() { setTableDefaults(); }
     void writeOwnForm(AssetXmlWriter& w, const RecordRow<FresnelTexture>& row) const;
     std::u16string getPluginName() const override { return u"TexFresnel"; }
 
@@ -21,14 +22,14 @@ public:
     TexturePtr refraction_tex;
     TexturePtr fresnel_ior_tex;
     TexturePtr refract_ior_tex;
-    Color whiteInverse{1, 1, 1};
-    Color blackInverse{0x1.050506p-2f, 0x1.050506p-2f, 0x1.050506p-2f};  // 0.25490198
-    float fresnel_ior = 1.55f;
-    float refract_ior = 1.55f;
-    float black_color_tex_mult = 1.0f;
-    float white_color_tex_mult = 1.0f;
-    float fresnel_ior_tex_mult = 1.0f;
-    float refract_ior_tex_mult = 1.0f;
+    Color whiteInverse;
+    Color blackInverse;
+    float fresnel_ior;
+    float refract_ior;
+    float black_color_tex_mult;
+    float white_color_tex_mult;
+    float fresnel_ior_tex_mult;
+    float refract_ior_tex_mult;
 };
 
 // Mixes two textures by a fixed amount.
@@ -51,21 +52,22 @@ public:
 // Inverts one texture.
 class InvertTexture : public TableTextureOf<InvertTexture, 9> {
 public:
+    InvertTexture() { setTableDefaults(); }
     std::u16string getPluginName() const override { return u"TexInvert"; }
 
     TexturePtr texture;  // required: save fails without it
-    bool invert_alpha = false;
+    bool invert_alpha;
 };
 
 // A constant colour with alpha.
 class AColorTexture : public TableTextureOf<AColorTexture, 5> {
 public:
-    AColorTexture() = default;
-    explicit AColorTexture(const AColor& c) : color(c) {}
+    AColorTexture() { setTableDefaults(); }
+    explicit AColorTexture(const AColor& c) : AColorTexture() { color = c; }
 
     std::u16string getPluginName() const override { return u"TexAColor"; }
 
-    AColor color{1, 1, 1, 1};
+    AColor color;
 };
 
 extern template class TableTextureOf<FresnelTexture, 1>;

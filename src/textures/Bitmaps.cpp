@@ -16,9 +16,9 @@ const char16_t* const kFilterLabels[3] = {u"No filter", u"Mip-map", u"Summed-are
 typedef BitmapBuffer B;
 
 const RecordRow<B> kBufferRecord[] = {
-    {&B::filter_type, "filter_type"},
-    {&B::filter_blur, "filter_blur"},
-    {&B::gamma, "gamma"},
+    RecordRow<B>(&B::filter_type, "filter_type").byDefault(1),
+    RecordRow<B>(&B::filter_blur, "filter_blur").byDefault(0.15),
+    RecordRow<B>(&B::gamma, "gamma").byDefault(1),
     {FieldRef<B>::path(&B::file), "file"},
 };
 

@@ -16,13 +16,14 @@ public:
     static constexpr int kRecordVersion = 1;
     static RowSpan<RecordRow<BitmapBuffer>> record();  // `file` ignores case
 
+    BitmapBuffer() { setTableDefaults(); }
     void writeXml(AssetXmlWriter& writer, std::u16string url) override;
     std::u16string getPluginName() const override { return u"BitmapBuffer"; }
 
     std::u16string file;
-    std::int32_t filter_type = 1;  // index into kFilterLabels
-    float filter_blur = 0.15f;
-    float gamma = 1.0f;
+    std::int32_t filter_type;  // index into kFilterLabels
+    float filter_blur;
+    float gamma;
 };
 
 // Display names of the filter types, by `filter_type`; XML writes the index.

@@ -20,84 +20,91 @@ constexpr RecordRow<C> optional(RecordRow<C> row) {
 
 // ---- RampTexture: one version ----
 
+typedef RampTexture Ramp;
 // "colors" is one reference and "positions" one float, not lists.
-const RecordRow<RampTexture> kRamp[] = {
-    {&RampTexture::uvw, "uvwgen"},
-    required<RampTexture>({&RampTexture::colors, "colors"}),
-    {&RampTexture::positions, "positions"},
-    {&RampTexture::u_wave, "u_wave"},
-    {&RampTexture::v_wave, "v_wave"},
-    {&RampTexture::type, "type"},
-    {&RampTexture::interpolation, "interpolation"},
+const RecordRow<Ramp> kRamp[] = {
+    {&Ramp::uvw, "uvwgen"},
+    required<Ramp>({&Ramp::colors, "colors"}),
+    RecordRow<Ramp>(&Ramp::positions, "positions").byDefault(0.5),
+    {&Ramp::u_wave, "u_wave"},
+    {&Ramp::v_wave, "v_wave"},
+    {&Ramp::type, "type"},
+    RecordRow<Ramp>(&Ramp::interpolation, "interpolation").byDefault(1),
 };
 
 // ---- BulgeTexture: one version ----
 
-const RecordRow<BulgeTexture> kBulge[] = {
-    {&BulgeTexture::uvw, "uvwgen"},
-    {&BulgeTexture::u_width, "u_width"},
-    {&BulgeTexture::v_width, "v_width"},
+typedef BulgeTexture Bulge;
+const RecordRow<Bulge> kBulge[] = {
+    {&Bulge::uvw, "uvwgen"},
+    RecordRow<Bulge>(&Bulge::u_width, "u_width").byDefault(0.1),
+    RecordRow<Bulge>(&Bulge::v_width, "v_width").byDefault(0.1),
 };
 
 // ---- GridTexture: version 2 adds the multipliers ahead of the widths ----
 
-const RecordRow<GridTexture> kGrid[] = {
-    {&GridTexture::uvw, "uvwgen"},
-    required<GridTexture>({&GridTexture::line_color, "line_color"}),
-    required<GridTexture>({&GridTexture::fill_color, "fill_color"}),
-    {&GridTexture::lineColorMult, 2},
-    {&GridTexture::fillColorMult, 2},
-    {&GridTexture::u_width, "u_width"},
-    {&GridTexture::v_width, "v_width"},
+typedef GridTexture Grid;
+const RecordRow<Grid> kGrid[] = {
+    {&Grid::uvw, "uvwgen"},
+    required<Grid>({&Grid::line_color, "line_color"}),
+    required<Grid>({&Grid::fill_color, "fill_color"}),
+    RecordRow<Grid>(&Grid::lineColorMult, 2).byDefault(1),
+    RecordRow<Grid>(&Grid::fillColorMult, 2).byDefault(1),
+    RecordRow<Grid>(&Grid::u_width, "u_width").byDefault(0.1),
+    RecordRow<Grid>(&Grid::v_width, "v_width").byDefault(0.1),
 };
 
 // ---- ClothTexture: version 2 adds `tile` ----
 
+typedef ClothTexture Cloth;
 // One field drives both directions.
-const RecordRow<ClothTexture> kCloth[] = {
-    {&ClothTexture::uvw, "uvwgen"},
-    {&ClothTexture::gap_color, "gap_color"},
-    {&ClothTexture::u_color, "u_color"},
-    {&ClothTexture::v_color, "v_color"},
-    {&ClothTexture::u_width, "u_width"},
-    {&ClothTexture::v_width, "v_width"},
-    {&ClothTexture::tile, 2, "tile_u"},
-    RecordRow<ClothTexture>::shownAgain(&ClothTexture::tile, "tile_v"),
+const RecordRow<Cloth> kCloth[] = {
+    {&Cloth::uvw, "uvwgen"},
+    RecordRow<Cloth>(&Cloth::gap_color, "gap_color").byDefault(AColor(1, 1, 1, 1)),
+    RecordRow<Cloth>(&Cloth::u_color, "u_color").byDefault(AColor(0, 0, 0, 1)),
+    RecordRow<Cloth>(&Cloth::v_color, "v_color").byDefault(AColor(1, 1, 1, 1)),
+    RecordRow<Cloth>(&Cloth::u_width, "u_width").byDefault(0.1),
+    RecordRow<Cloth>(&Cloth::v_width, "v_width").byDefault(0.1),
+    RecordRow<Cloth>(&Cloth::tile, 2, "tile_u").byDefault(true),
+    RecordRow<Cloth>::shownAgain(&Cloth::tile, "tile_v"),
 };
 
 // ---- NoiseTexture: one version ----
 
-const RecordRow<NoiseTexture> kNoise[] = {
-    {&NoiseTexture::uvw, "uvwgen"},
-    optional<NoiseTexture>({&NoiseTexture::color1_tex, "color1_tex"}),
-    optional<NoiseTexture>({&NoiseTexture::color2_tex, "color2_tex"}),
-    {&NoiseTexture::color1, "color1"},
-    {&NoiseTexture::color2, "color2"},
-    {&NoiseTexture::persistence, "persistence"},
-    {&NoiseTexture::amplitude_ratio, "amplitude_ratio"},
-    {&NoiseTexture::frequency_ratio, "frequency_ratio"},
-    {&NoiseTexture::frequency1, "frequency1"},
-    {&NoiseTexture::amplitude1, "amplitude1"},
-    {&NoiseTexture::size, "size"},
-    {&NoiseTexture::mix_ratio, "mix_ratio"},
-    {&NoiseTexture::bias, "bias"},
-    {&NoiseTexture::color1_tex_mult, "color1_tex_mult"},
-    {&NoiseTexture::color2_tex_mult, "color2_tex_mult"},
-    {&NoiseTexture::octaves, "octaves"},
-    {&NoiseTexture::noiseType, "noiseType"},
-    {&NoiseTexture::inflection, "inflection"},
+typedef NoiseTexture Noise;
+typedef RecordRow<Noise> NoiseRow;
+const NoiseRow kNoise[] = {
+    {&Noise::uvw, "uvwgen"},
+    optional<Noise>({&Noise::color1_tex, "color1_tex"}),
+    optional<Noise>({&Noise::color2_tex, "color2_tex"}),
+    NoiseRow(&Noise::color1, "color1").byDefault(kWhite),
+    {&Noise::color2, "color2"},
+    NoiseRow(&Noise::persistence, "persistence").byDefault(1),
+    NoiseRow(&Noise::amplitude_ratio, "amplitude_ratio").byDefault(1),
+    NoiseRow(&Noise::frequency_ratio, "frequency_ratio").byDefault(2),
+    NoiseRow(&Noise::frequency1, "frequency1").byDefault(1),
+    NoiseRow(&Noise::amplitude1, "amplitude1").byDefault(1),
+    NoiseRow(&Noise::size, "size").byDefault(1),
+    NoiseRow(&Noise::mix_ratio, "mix_ratio").byDefault(0.5),
+    {&Noise::bias, "bias"},
+    NoiseRow(&Noise::color1_tex_mult, "color1_tex_mult").byDefault(1),
+    NoiseRow(&Noise::color2_tex_mult, "color2_tex_mult").byDefault(1),
+    NoiseRow(&Noise::octaves, "octaves").byDefault(3),
+    {&Noise::noiseType, "noiseType"},
+    {&Noise::inflection, "inflection"},
 };
 
 // ---- CheckerTexture: version 2 adds the multipliers behind the flags ----
 
-const RecordRow<CheckerTexture> kChecker[] = {
-    {&CheckerTexture::uvw, "uvwgen"},
-    required<CheckerTexture>({&CheckerTexture::white_color, "white_color"}),
-    required<CheckerTexture>({&CheckerTexture::black_color, "black_color"}),
-    {&CheckerTexture::tile_u, "tile_u"},
-    {&CheckerTexture::tile_v, "tile_v"},
-    {&CheckerTexture::whiteColorMult, 2},
-    {&CheckerTexture::blackColorMult, 2},
+typedef CheckerTexture Checker;
+const RecordRow<Checker> kChecker[] = {
+    {&Checker::uvw, "uvwgen"},
+    required<Checker>({&Checker::white_color, "white_color"}),
+    required<Checker>({&Checker::black_color, "black_color"}),
+    RecordRow<Checker>(&Checker::tile_u, "tile_u").byDefault(true),
+    RecordRow<Checker>(&Checker::tile_v, "tile_v").byDefault(true),
+    RecordRow<Checker>(&Checker::whiteColorMult, 2).byDefault(1),
+    RecordRow<Checker>(&Checker::blackColorMult, 2).byDefault(1),
 };
 
 }  // namespace
@@ -105,7 +112,9 @@ const RecordRow<CheckerTexture> kChecker[] = {
 CheckerTexture::CheckerTexture()
     : uvw(defaultPlanarUVW()),
       white_color(new AColorTexture(AColor(1, 1, 1, 1))),
-      black_color(new AColorTexture(AColor(0, 0, 0, 1))) {}
+      black_color(new AColorTexture(AColor(0, 0, 0, 1))) {
+    setTableDefaults();
+}
 
 // ---- the tables: the version save writes and the rows ----
 

@@ -7,7 +7,7 @@
 // parameter per slot in slot order (the slot's word is also the parameter's
 // name), then the plain parameters. A class therefore only describes its
 // record table, one row per child or field with the XML parameter that shows
-// it (in ProceduralTextures.cpp); TableTextureOf and the texture family's
+// it and its default (in ProceduralTextures.cpp); TableTextureOf and the texture family's
 // walkers (textures/TextureRows.h) do the rest. A required child that is
 // missing makes `save` fail before anything is written.
 #include <cstdint>
@@ -25,78 +25,84 @@ using ProceduralTexture = TableTextureOf<Derived, Tag>;
 
 class RampTexture : public ProceduralTexture<RampTexture, 11> {
 public:
+    RampTexture() { setTableDefaults(); }
     std::u16string getPluginName() const override { return u"TexRamp"; }
 
     UVWPtr uvw;
     TexturePtr colors;
-    float positions = 0.5f;
-    float u_wave = 0.0f;
-    float v_wave = 0.0f;
-    std::int32_t type = 0;
-    std::int32_t interpolation = 1;
+    float positions;
+    float u_wave;
+    float v_wave;
+    std::int32_t type;
+    std::int32_t interpolation;
 };
 
 class BulgeTexture : public ProceduralTexture<BulgeTexture, 8> {
 public:
+    BulgeTexture() { setTableDefaults(); }
     std::u16string getPluginName() const override { return u"TexBulge"; }
 
     UVWPtr uvw;
-    float u_width = 0.1f;
-    float v_width = 0.1f;
+    float u_width;
+    float v_width;
 };
 
 class GridTexture : public ProceduralTexture<GridTexture, 6> {
 public:
+    GridTexture() { setTableDefaults(); }
     std::u16string getPluginName() const override { return u"TexGrid"; }
 
     UVWPtr uvw;
     TexturePtr line_color;
     TexturePtr fill_color;
-    float lineColorMult = 1.0f;  // in the record only
-    float fillColorMult = 1.0f;
-    float u_width = 0.1f;
-    float v_width = 0.1f;
+    float lineColorMult;  // in the record only
+    float fillColorMult;
+    float u_width;
+    float v_width;
 };
 
 class ClothTexture : public ProceduralTexture<ClothTexture, 7> {
 public:
+    ClothTexture() { setTableDefaults(); }
     std::u16string getPluginName() const override { return u"TexCloth"; }
 
     UVWPtr uvw;
-    AColor gap_color{1, 1, 1, 1};
-    AColor u_color{0, 0, 0, 1};
-    AColor v_color{1, 1, 1, 1};
-    float u_width = 0.1f;
-    float v_width = 0.1f;
-    bool tile = true;  // tiles in both directions
+    AColor gap_color;
+    AColor u_color;
+    AColor v_color;
+    float u_width;
+    float v_width;
+    bool tile;  // tiles in both directions
 };
 
 class NoiseTexture : public ProceduralTexture<NoiseTexture, 3> {
 public:
+    NoiseTexture() { setTableDefaults(); }
     std::u16string getPluginName() const override { return u"TexNoise"; }
 
     UVWPtr uvw;
     TexturePtr color1_tex;  // optional
     TexturePtr color2_tex;  // optional
-    Color color1{1, 1, 1};
-    Color color2{0, 0, 0};
-    float persistence = 1.0f;
-    float amplitude_ratio = 1.0f;
-    float frequency_ratio = 2.0f;
-    float frequency1 = 1.0f;
-    float amplitude1 = 1.0f;
-    float size = 1.0f;
-    float mix_ratio = 0.5f;
-    float bias = 0.0f;
-    float color1_tex_mult = 1.0f;
-    float color2_tex_mult = 1.0f;
-    std::int32_t octaves = 3;
-    std::int32_t noiseType = 0;
-    std::int32_t inflection = 0;
+    Color color1;
+    Color color2;
+    float persistence;
+    float amplitude_ratio;
+    float frequency_ratio;
+    float frequency1;
+    float amplitude1;
+    float size;
+    float mix_ratio;
+    float bias;
+    float color1_tex_mult;
+    float color2_tex_mult;
+    std::int32_t octaves;
+    std::int32_t noiseType;
+    std::int32_t inflection;
 };
 
 // The one texture whose defaults hold children: a planar world generator
-// and two constant colours, new ones at every reset.
+// and two constant colours, new ones at every reset, which its constructor
+// makes.
 class CheckerTexture : public ProceduralTexture<CheckerTexture, 4> {
 public:
     CheckerTexture();
@@ -105,10 +111,10 @@ public:
     UVWPtr uvw;
     TexturePtr white_color;
     TexturePtr black_color;
-    float whiteColorMult = 1.0f;  // in the record only
-    float blackColorMult = 1.0f;
-    bool tile_u = true;
-    bool tile_v = true;
+    float whiteColorMult;  // in the record only
+    float blackColorMult;
+    bool tile_u;
+    bool tile_v;
 };
 
 extern template class TableTextureOf<RampTexture, 11>;

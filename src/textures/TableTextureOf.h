@@ -3,7 +3,8 @@
 // and field, with the XML parameter that shows it): save, load, the
 // comparison, the copies and the XML all walk the table, with the texture
 // family's child policy (textures/TextureRows.h). The class's defaults are
-// its member initialisers.
+// the table's: its constructor calls setTableDefaults() (and makes the
+// children that a new object holds), and `reset` assigns a new object.
 //
 // The source file of a class declares its table,
 //
@@ -39,6 +40,9 @@ public:
     bool sameContent(const Derived& o) const;
     // No form of its own: a class that has one declares this again.
     void writeOwnForm(AssetXmlWriter&, const RecordRow<Derived>&) const {}
+
+protected:
+    void setTableDefaults();
 };
 
 }  // namespace OrvaneLumoCore

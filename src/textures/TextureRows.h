@@ -158,6 +158,12 @@ bool TableTextureOf<D, Tag>::load(QuickArchive& ar) {
 }
 
 template <class D, std::uint32_t Tag>
+void TableTextureOf<D, Tag>::setTableDefaults() {
+    D& texture = static_cast<D&>(*this);
+    resetFields(texture, textureTable(texture).rows);
+}
+
+template <class D, std::uint32_t Tag>
 void TableTextureOf<D, Tag>::finishClone() {
     D& copy = static_cast<D&>(*this);
     cloneTextureRows(copy, textureTable(copy).rows);

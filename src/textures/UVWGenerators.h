@@ -99,6 +99,7 @@ public:
 // A texture that only shows its generator.
 class UVWTexture : public TableTextureOf<UVWTexture, 2> {
 public:
+    UVWTexture() { setTableDefaults(); }
     std::u16string getPluginName() const override { return u"TexUVW"; }
 
     UVWPtr uvw;  // required: save fails without it

@@ -25,6 +25,9 @@ struct Color {
     bool operator!=(const Color& o) const { return !(*this == o); }
 };
 
+// The colour that most colour fields start from.
+constexpr Color kWhite(1, 1, 1);
+
 struct AColor {
     float r = 0, g = 0, b = 0, a = 0;
     AColor() = default;

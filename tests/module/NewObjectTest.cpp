@@ -4,8 +4,8 @@
 
 #include <cxxabi.h>
 
+#include <cstddef>
 #include <cstdlib>
-#include <cstring>
 #include <new>
 #include <string>
 #include <type_traits>
@@ -69,14 +69,17 @@ void settle(T& o) {
 template <class T>
 Bytes savedWhenBuiltOn(unsigned char fill) {
     alignas(T) unsigned char memory[sizeof(T)];
-    std::memset(memory, fill, sizeof memory);
+    // Volatile stores: the compiler may drop plain ones, since the object that the constructor begins holds nothing
+    // yet.
+    volatile unsigned char* bytes = memory;
+    for (std::size_t i = 0; i < sizeof memory; ++i) bytes[i] = fill;
     T* o = new (memory) T;
     settle(*o);
     bool ok = false;
-    const Bytes bytes = savedBytes(*o, &ok);
+    const Bytes saved = savedBytes(*o, &ok);
     EXPECT_TRUE(ok) << nameOf(typeid(T)) << ": a new object saves";
     o->~T();
-    return bytes;
+    return saved;
 }
 
 template <class... T>
