@@ -51,7 +51,7 @@ TEST(FieldRefKind, HoldsOnlyTheTypeOfItsKind) {
     EXPECT_EQ(count.get<std::int32_t>(r), 3);
 }
 
-#if GTEST_HAS_DEATH_TEST && !defined(_WIN32)
+#if GTEST_HAS_DEATH_TEST
 TEST(FieldRefKindDeathTest, GetOfAnotherTypeStops) {
     ASSERT_TRUE(kFieldKindChecks) << "FieldRows.h was included before this file turned the checks on";
     testing::FLAGS_gtest_death_test_style = "threadsafe";
