@@ -1,5 +1,5 @@
-// A new object of every class that the factories make: its defaults are whole (the same object whatever the memory it
-// was built in held before) and save as the golden list holds them.
+// A new object of every class that the factories make, and of the option records: its defaults are whole (the same
+// object whatever the memory it was built in held before) and save as the golden list holds them.
 #include <gtest/gtest.h>
 
 #include <cxxabi.h>
@@ -16,6 +16,8 @@
 #include "lights/LocalLights.h"
 #include "lights/SunIesDome.h"
 #include "materials/Brdf.h"
+#include "options/AllOptions.h"
+#include "options/OptionRecords.h"
 #include "support/Golden.h"
 #include "support/RecordBytes.h"
 #include "textures/BasicTextures.h"
@@ -108,6 +110,7 @@ TEST(NewObject, EveryClassStartsFromItsDefaultsWhereverItIsBuilt) {
                                        SphereLight, DomeLight>());
     out += newObjects("layer", Classes<Glass_BRDF, Diffuse_BRDF, Blinn_BRDF, Phong_BRDF, Mirror_BRDF, Light_BRDF>());
     out += newObjects("camera", Classes<PhysicalCamera>());
+    out += newObjects("options", Classes<OrvaneParams, OrvaneFrameData, OrvaneLFBStampInfo, AllOptions>());
     expectGolden("module/golden/new_objects.txt", out);
 }
 
