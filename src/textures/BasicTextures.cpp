@@ -32,7 +32,7 @@ constexpr float kGrey = 0x1.050506p-2f;
 
 typedef RecordRow<Fr> FrRow;
 const FrRow kFresnelRecord[] = {
-    FrRow(&Fr::whiteInverse, "white_color").shownBy(kComplement).byDefault(Color(1, 1, 1)),
+    FrRow(&Fr::whiteInverse, "white_color").shownBy(kComplement).byDefault(kWhite),
     FrRow(&Fr::blackInverse, "black_color").shownBy(kComplement).byDefault(Color(kGrey, kGrey, kGrey)),
     FrRow(&Fr::fresnel_ior, "fresnel_ior").byDefault(1.55),
     FrRow(&Fr::refract_ior, "refract_ior").byDefault(1.55),

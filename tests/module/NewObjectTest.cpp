@@ -9,8 +9,8 @@
 #include <new>
 #include <string>
 #include <type_traits>
-#include <utility>
 #include <typeinfo>
+#include <utility>
 
 #include "animation/Camera.h"
 #include "lights/LocalLights.h"
